@@ -1,0 +1,39 @@
+// gallery: the demo host of the zelctl controls.
+//   gallery [--screenshot OUT.png]
+
+#include "Gallery.h"
+
+#include <QApplication>
+#include <QCommandLineParser>
+#include <QTextStream>
+#include <QTimer>
+
+int main(int argc, char **argv)
+{
+    QApplication app(argc, argv);
+    QCommandLineParser parser;
+    parser.setApplicationDescription("The zelctl controls on the bundled data.");
+    parser.addHelpOption();
+    const QCommandLineOption screenshot("screenshot", "Render the window to a PNG file and quit.", "file");
+    parser.addOption(screenshot);
+    parser.process(app);
+
+    Gallery gallery;
+    gallery.show();
+    if (!parser.isSet(screenshot))
+        return app.exec();
+
+    // Let the form lay out and paint once, then grab it.
+    int status = 1;
+    QTimer::singleShot(0, [&] {
+        const QString file = parser.value(screenshot);
+        if (gallery.grab().save(file)) {
+            status = 0;
+        } else {
+            QTextStream(stderr) << "gallery: cannot write " << file << '\n';
+        }
+        app.quit();
+    });
+    app.exec();
+    return status;
+}

@@ -1,0 +1,15 @@
+#pragma once
+
+#include <QStringList>
+#include <QTextStream>
+
+// One subcommand of the zelctl tool. run() gets the arguments after the command's name and
+// returns the process exit code; errors go to err as one line.
+struct Command
+{
+    const char *name;
+    const char *usage;
+    int (*run)(const QStringList &args, QTextStream &out, QTextStream &err);
+};
+
+int runClasses(const QStringList &args, QTextStream &out, QTextStream &err);

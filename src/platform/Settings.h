@@ -1,0 +1,21 @@
+#pragma once
+
+#include "zelctl_export.h"
+
+#include <QString>
+
+// Per-user application settings (application, section, key), kept as one INI file per
+// application under the XDG config folder. The application name is folded to lower case,
+// so "zEL" and "ZEL" share one store, as they did where these keys were case-insensitive.
+namespace zelctl::platform {
+
+ZELCTL_EXPORT QString GetSetting(
+    const QString &application, const QString &section, const QString &key, const QString &defaultValue = QString());
+ZELCTL_EXPORT void SaveSetting(
+    const QString &application, const QString &section, const QString &key, const QString &value);
+ZELCTL_EXPORT void DeleteSetting(const QString &application, const QString &section, const QString &key);
+
+// The INI file that holds an application's settings.
+ZELCTL_EXPORT QString settingsFile(const QString &application);
+
+} // namespace zelctl::platform

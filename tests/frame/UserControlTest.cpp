@@ -1,0 +1,157 @@
+#include "frame/UserControl.h"
+
+#include "platform/Twips.h"
+#include "platform/WindowHandles.h"
+
+#include <QJsonDocument>
+#include <QSignalSpy>
+#include <QTest>
+
+#include <gtest/gtest.h>
+
+using namespace zelctl;
+
+namespace {
+
+// Records the life-cycle calls it receives, and persists one property "Caption".
+class RecordingControl : public UserControl
+{
+public:
+    explicit RecordingControl(QStringList &calls)
+        : m_calls(calls)
+    {
+        m_calls << "Initialize";
+    }
+
+    QString caption;
+
+protected:
+    void InitProperties() override
+    {
+        m_calls << "InitProperties";
+        caption = "default";
+    }
+    void ReadProperties(const PropertyBag &bag) override
+    {
+        m_calls << "ReadProperties";
+        caption = bag.ReadProperty("Caption", "default").toString();
+    }
+    void WriteProperties(PropertyBag &bag) override
+    {
+        m_calls << "WriteProperties";
+        bag.WriteProperty("Caption", caption, "default");
+    }
+    void Terminate() override { m_calls << "Terminate"; }
+    void AmbientChanged(const QString &name) override { m_calls << "AmbientChanged:" + name; }
+    void resizeEvent(QResizeEvent *) override { record("Resize"); }
+    void showEvent(QShowEvent *) override { record("Show"); }
+    void paintEvent(QPaintEvent *) override { record("Paint"); }
+
+private:
+    // Qt may repaint several times; the order of first occurrences is what counts.
+    void record(const QString &call)
+    {
+        if (!m_calls.contains(call))
+            m_calls << call;
+    }
+    QStringList &m_calls;
+};
+
+} // namespace
+
+TEST(UserControlLifeCycle, newControlRunsInitPropertiesThenLayoutThenSaveThenTerminate)
+{
+    QStringList calls;
+    QWidget form;
+    auto *control = new RecordingControl(calls);
+    control->setParent(&form);
+    control->InitNew();
+    control->resize(40, 20);
+    form.show();
+    ASSERT_TRUE(QTest::qWaitForWindowExposed(&form));
+    QTRY_VERIFY(calls.contains("Paint"));
+    const PropertyBag saved = control->Save();
+    control->Release();
+    control->Release();
+    QSignalSpy gone(control, &QObject::destroyed);
+    QTRY_COMPARE(gone.count(), 1);
+
+    EXPECT_EQ(calls,
+        QStringList({ "Initialize", "InitProperties", "Resize", "Show", "Paint", "WriteProperties", "Terminate" }));
+    EXPECT_TRUE(saved.isEmpty()) << "a default value is not written";
+}
+
+TEST(UserControlLifeCycle, savedControlIsLoadedThroughReadProperties)
+{
+    QStringList calls;
+    PropertyBag bag;
+    {
+        RecordingControl first(calls);
+        first.InitNew();
+        first.caption = "Olá";
+        bag = first.Save();
+    }
+    calls.clear();
+    RecordingControl second(calls);
+    second.Load(bag);
+    EXPECT_EQ(second.caption, "Olá");
+    EXPECT_EQ(calls, QStringList({ "Initialize", "ReadProperties" }));
+}
+
+TEST(UserControlAmbient, reportsEachChangedAmbientPropertyOnce)
+{
+    QStringList calls;
+    RecordingControl control(calls);
+    EXPECT_FALSE(control.designMode());
+    Ambient designer = control.ambient();
+    designer.UserMode = false;
+    designer.BackColor = platform::rgb(1, 2, 3);
+    control.setAmbient(designer);
+    control.setAmbient(designer);
+    EXPECT_TRUE(control.designMode());
+    EXPECT_EQ(calls.mid(1), QStringList({ "AmbientChanged:UserMode", "AmbientChanged:BackColor" }));
+}
+
+TEST(UserControlExtender, positionsAndSizesInTwips)
+{
+    QStringList calls;
+    QWidget form;
+    auto *control = new RecordingControl(calls);
+    control->setParent(&form);
+    Extender &ext = control->extender();
+    ext.Move(150, 300, 2685, 330);
+    EXPECT_EQ(control->geometry(), QRect(10, 20, 179, 22));
+    EXPECT_EQ(ext.Left(), 150);
+    EXPECT_EQ(ext.Width(), 2685);
+    ext.setName("NIB1");
+    ext.setTag("x");
+    ext.setToolTipText("dica");
+    EXPECT_EQ(control->objectName(), "NIB1");
+    EXPECT_EQ(control->toolTip(), "dica");
+
+    ext.setVisible(false);
+    const QJsonObject json = ext.toJson();
+    auto *other = new RecordingControl(calls);
+    other->setParent(&form);
+    other->extender().loadJson(json);
+    EXPECT_EQ(other->extender().toJson(), json);
+    EXPECT_EQ(other->geometry(), control->geometry());
+    EXPECT_FALSE(other->extender().Visible());
+}
+
+TEST(UserControlWindow, hWndNamesTheControlUntilItIsGone)
+{
+    QStringList calls;
+    auto *control = new RecordingControl(calls);
+    const qint32 handle = control->property("hWnd").value<qint32>();
+    EXPECT_NE(handle, 0);
+    EXPECT_EQ(control->hWnd(), handle);
+    EXPECT_EQ(platform::widgetOf(handle), control);
+    delete control;
+    EXPECT_EQ(platform::widgetOf(handle), nullptr);
+    EXPECT_EQ(platform::widgetOf(0), nullptr);
+    EXPECT_EQ(platform::widgetOf(-7), nullptr);
+
+    RecordingControl next(calls);
+    EXPECT_NE(next.hWnd(), handle) << "handles are never reused";
+}

@@ -1,0 +1,50 @@
+#pragma once
+
+#include "platform/MessageBox.h"
+#include "platform/ModalPresenter.h"
+
+#include <QList>
+#include <QString>
+
+#include <functional>
+
+namespace zelctl::test {
+
+// Path of a file under the source tree or under tests/data.
+QString sourcePath(const QString &relative);
+QString testDataPath(const QString &relative);
+
+// Records every message box shown while it lives and answers each with `answer`.
+class MessageBoxRecorder
+{
+public:
+    explicit MessageBoxRecorder(platform::MsgResult answer = platform::MsgResult::Ok);
+    ~MessageBoxRecorder();
+    MessageBoxRecorder(const MessageBoxRecorder &) = delete;
+    MessageBoxRecorder &operator=(const MessageBoxRecorder &) = delete;
+
+    const QList<platform::MessageBoxRequest> &shown() const { return m_shown; }
+
+private:
+    QList<platform::MessageBoxRequest> m_shown;
+    platform::MessageBoxPresenter m_previous;
+};
+
+// Drives the library's modal forms while it lives: `drive` gets each form instead of the
+// user and returns its result (QDialog::Accepted or QDialog::Rejected).
+class ModalDriver
+{
+public:
+    explicit ModalDriver(std::function<int(QDialog &)> drive);
+    ~ModalDriver();
+    ModalDriver(const ModalDriver &) = delete;
+    ModalDriver &operator=(const ModalDriver &) = delete;
+
+    int shownCount() const { return m_count; }
+
+private:
+    int m_count = 0;
+    platform::ModalPresenter m_previous;
+};
+
+} // namespace zelctl::test
