@@ -1,5 +1,7 @@
 #include "Gallery.h"
 
+#include "Sections.h"
+
 #include "frame/ClassRegistry.h"
 
 #include <QGroupBox>
@@ -37,6 +39,7 @@ Gallery::Gallery(QWidget *parent)
     setCentralWidget(scroll);
     resize(900, 700);
 
+    addSection(QStringLiteral("NIB"), createNibSection());
     addSection(QStringLiteral("Classes da biblioteca"), classList());
 }
 

@@ -13,3 +13,4 @@ struct Command
 };
 
 int runClasses(const QStringList &args, QTextStream &out, QTextStream &err);
+int runNib(const QStringList &args, QTextStream &out, QTextStream &err);

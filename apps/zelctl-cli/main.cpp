@@ -10,6 +10,7 @@ namespace {
 
 const std::array commands = {
     Command { "classes", "zelctl classes", runClasses },
+    Command { "nib", "zelctl nib NUMBER", runNib },
 };
 
 void printUsage(QTextStream &stream)

@@ -1,0 +1,6 @@
+#pragma once
+
+class QWidget;
+
+// One builder per area of the library; each returns the content of a gallery row.
+QWidget *createNibSection();

@@ -1,0 +1,283 @@
+#include "cNIB.h"
+
+#include "NibCheckDigits.h"
+#include "platform/MessageBox.h"
+#include "platform/Twips.h"
+
+#include <QApplication>
+#include <QKeyEvent>
+#include <QLabel>
+#include <QLineEdit>
+#include <QPointer>
+
+#include <array>
+
+namespace zelctl {
+
+using platform::pixelsFromTwips;
+
+namespace {
+
+struct BoxGeometry
+{
+    int left; // twips; every part has its top at 0
+    int width;
+    int first; // offset of the box's first character in the number
+    int maxLength;
+};
+
+constexpr std::array<BoxGeometry, 4> boxes = { {
+    { 0, 465, 0, 4 },
+    { 480, 465, 4, 4 },
+    { 960, 1125, 8, 11 },
+    { 2100, 285, 19, 2 },
+} };
+constexpr int boxHeight = 315;
+constexpr QRect validMarkTwips(2430, 0, 240, 240);
+constexpr QRect errorMarkTwips(2400, 0, 255, 270);
+constexpr int fullLength = 21;
+constexpr int withoutDigits = 19; // a number typed without its check digits
+
+QRect pixels(const QRect &twips)
+{
+    return { pixelsFromTwips(twips.x()), pixelsFromTwips(twips.y()), pixelsFromTwips(twips.width()),
+        pixelsFromTwips(twips.height()) };
+}
+
+// The error mark explains itself when clicked.
+class ErrorMark : public QLabel
+{
+public:
+    using QLabel::QLabel;
+
+protected:
+    void mouseReleaseEvent(QMouseEvent *event) override
+    {
+        if (event->button() == Qt::LeftButton && rect().contains(event->position().toPoint())) {
+            platform::messageBox(platform::MsgIcon::Information, QStringLiteral("NIB incorrecto"),
+                QStringLiteral("O número de identificação bancário (NIB) não se encontra correcto.\n"
+                               "Por favor verifique o NIB inserido"));
+        }
+    }
+};
+
+} // namespace
+
+class cNIB::Private
+{
+public:
+    explicit Private(cNIB *q);
+
+    QString text() const;
+    int indexOf(const QObject *box) const;
+    void changed(int index);
+    void refreshValidity();
+    void showMarks(bool valid, bool error);
+    void eraseBack(int index);
+
+    cNIB *q;
+    std::array<QLineEdit *, 4> nib {};
+    QLabel *validpic;
+    ErrorMark *Image1;
+    platform::OleColor backColor = platform::systemColor(platform::COLOR_BTNFACE);
+};
+
+cNIB::Private::Private(cNIB *owner)
+    : q(owner)
+    , validpic(new QLabel(owner))
+    , Image1(new ErrorMark(owner))
+{
+    QFont font(QStringLiteral("Arial"));
+    font.setPointSizeF(8.25);
+    font.setBold(true);
+    for (size_t i = 0; i < boxes.size(); ++i) {
+        auto *box = new QLineEdit(owner);
+        box->setObjectName(QStringLiteral("nib"));
+        box->setProperty("Index", int(i));
+        box->setMaxLength(boxes[i].maxLength);
+        box->setFont(font);
+        box->setGeometry(pixels(QRect(boxes[i].left, 0, boxes[i].width, boxHeight)));
+        box->installEventFilter(owner);
+        QObject::connect(box, &QLineEdit::textChanged, owner, [this, i] { changed(int(i)); });
+        nib[i] = box;
+    }
+
+    validpic->setObjectName(QStringLiteral("validpic"));
+    validpic->setGeometry(pixels(validMarkTwips));
+    QIcon tick;
+    tick.addFile(QStringLiteral(":/zelctl/nib/validpic16.png"));
+    tick.addFile(QStringLiteral(":/zelctl/nib/validpic32.png"));
+    validpic->setPixmap(tick.pixmap(validpic->size()));
+
+    Image1->setObjectName(QStringLiteral("Image1"));
+    Image1->setGeometry(pixels(errorMarkTwips));
+    Image1->setPixmap(QPixmap(QStringLiteral(":/zelctl/nib/Image1.png")));
+    Image1->setScaledContents(true);
+    Image1->setCursor(Qt::PointingHandCursor);
+    showMarks(false, false);
+}
+
+QString cNIB::Private::text() const
+{
+    QString result;
+    for (const QLineEdit *box : nib)
+        result += box->text();
+    return result;
+}
+
+int cNIB::Private::indexOf(const QObject *box) const
+{
+    for (size_t i = 0; i < nib.size(); ++i) {
+        if (nib[i] == box)
+            return int(i);
+    }
+    return -1;
+}
+
+void cNIB::Private::showMarks(bool valid, bool error)
+{
+    validpic->setVisible(valid);
+    Image1->setVisible(error);
+}
+
+void cNIB::Private::changed(int index)
+{
+    QLineEdit *box = nib[size_t(index)];
+    if (box->text().size() == box->maxLength() && index < int(nib.size()) - 1)
+        nib[size_t(index) + 1]->setFocus();
+
+    const qsizetype length = text().size();
+    if (length == 0) {
+        Image1->hide();
+        Q_EMIT q->Changed();
+    } else if (length == fullLength) {
+        refreshValidity();
+        Q_EMIT q->Changed();
+    } else {
+        showMarks(false, false);
+    }
+}
+
+void cNIB::Private::refreshValidity()
+{
+    const QString number = text();
+    switch (number.size()) {
+    case 0:
+        showMarks(false, false);
+        break;
+    case withoutDigits:
+        nib[3]->setText(CalculateNibCheckDigits(number));
+        validpic->setVisible(q->Valid());
+        break;
+    case fullLength: {
+        const bool right = CalculateNibCheckDigits(number) == nib[3]->text();
+        showMarks(right, !right);
+        break;
+    }
+    default:
+        showMarks(false, true);
+        break;
+    }
+}
+
+void cNIB::Private::eraseBack(int index)
+{
+    QLineEdit *previous = nib[size_t(index) - 1];
+    previous->setFocus();
+    QApplication::processEvents();
+    QString previousText = previous->text();
+    if (!previousText.isEmpty()) {
+        previousText.chop(1);
+        previous->setText(previousText);
+    }
+    previous->setCursorPosition(int(previous->text().size()));
+}
+
+cNIB::cNIB(QWidget *parent)
+    : UserControl(parent)
+    , d(std::make_unique<Private>(this))
+{
+    setFixedSize(pixelsFromTwips(validMarkTwips.right() + 1 + platform::TwipsPerPixel),
+        pixelsFromTwips(boxHeight + platform::TwipsPerPixel));
+    setAutoFillBackground(true);
+    setBackColor(d->backColor);
+    setText(QString());
+
+    // Leaving the control, not moving between its boxes, refreshes the marks.
+    connect(qApp, &QApplication::focusChanged, this, [this](QWidget *old, QWidget *now) {
+        if (old && isAncestorOf(old) && !(now && isAncestorOf(now)))
+            d->refreshValidity();
+    });
+}
+
+cNIB::~cNIB() = default;
+
+QString cNIB::Text() const
+{
+    return d->text();
+}
+
+void cNIB::setText(const QString &text)
+{
+    const bool complete = text.size() >= fullLength;
+    for (size_t i = 0; i < boxes.size(); ++i)
+        d->nib[i]->setText(complete ? text.mid(boxes[i].first, boxes[i].maxLength) : QString());
+}
+
+bool cNIB::Valid() const
+{
+    const QString number = d->text();
+    if (number.size() != fullLength)
+        return false;
+    const QString digits = CalculateNibCheckDigits(number);
+    return !digits.isEmpty() && d->nib[3]->text() == digits;
+}
+
+QString cNIB::CalculateCheckDigits(const QString &mynib) const
+{
+    return CalculateNibCheckDigits(mynib);
+}
+
+platform::OleColor cNIB::BackColor() const
+{
+    return d->backColor;
+}
+
+void cNIB::setBackColor(platform::OleColor color)
+{
+    d->backColor = color;
+    QPalette pal = palette();
+    pal.setColor(QPalette::Window, platform::toQColor(color));
+    setPalette(pal);
+    PropertyChanged(QStringLiteral("BackColor"));
+}
+
+void cNIB::ReadProperties(const PropertyBag &bag)
+{
+    setBackColor(bag.ReadProperty(QStringLiteral("BackColor"), d->backColor).toUInt());
+}
+
+void cNIB::WriteProperties(PropertyBag &bag)
+{
+    bag.WriteProperty(QStringLiteral("BackColor"), d->backColor);
+}
+
+bool cNIB::eventFilter(QObject *watched, QEvent *event)
+{
+    const int index = d->indexOf(watched);
+    if (index < 0)
+        return UserControl::eventFilter(watched, event);
+    QLineEdit *box = d->nib[size_t(index)];
+    if (event->type() == QEvent::FocusIn) {
+        box->selectAll();
+    } else if (event->type() == QEvent::KeyPress && static_cast<QKeyEvent *>(event)->key() == Qt::Key_Backspace
+        && index >= 1 && box->text().isEmpty()) {
+        d->eraseBack(index);
+        return true;
+    }
+    return UserControl::eventFilter(watched, event);
+}
+
+ZELCTL_REGISTER_CLASS(cNIB)
+
+} // namespace zelctl
