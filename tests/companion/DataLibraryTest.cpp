@@ -1,0 +1,136 @@
+#include "companion/DirectoryNIFGrabber.h"
+#include "companion/JsonDeclaration.h"
+
+#include "support/TestSupport.h"
+
+#include <QSignalSpy>
+#include <QTemporaryDir>
+#include <QTest>
+
+#include <gtest/gtest.h>
+
+using namespace zelctl;
+using namespace zelctl::companion;
+
+namespace {
+
+// Records the fetcher's signals in the order they arrive.
+struct EventLog
+{
+    explicit EventLog(NIFGrabber &grabber)
+    {
+        QObject::connect(&grabber, &NIFGrabber::Starting, [this] { events << "Starting"; });
+        QObject::connect(&grabber, &NIFGrabber::ReceivedInformation,
+            [this](const QString &id) { events << "ReceivedInformation:" + id; });
+        QObject::connect(&grabber, &NIFGrabber::Finished, [this] { events << "Finished"; });
+    }
+    QStringList events;
+};
+
+} // namespace
+
+TEST(DirectoryNIFGrabber, answersLaterAndInOrderForAKnownHolder)
+{
+    DirectoryNIFGrabber grabber(test::sourcePath("data/contribuintes.json"));
+    EventLog log(grabber);
+    grabber.Fetch("PT210345675");
+    EXPECT_TRUE(grabber.IsBusy());
+    EXPECT_TRUE(log.events.isEmpty()) << "Fetch returns before anything is answered";
+    grabber.Fetch("PT198765436");
+    QTRY_VERIFY(!grabber.IsBusy());
+    EXPECT_EQ(log.events, QStringList({ "Starting", "ReceivedInformation:PT210345675", "Finished" }))
+        << "a second fetch while busy is not started";
+    EXPECT_EQ(grabber.HolderName(), "ANA MARIA FERREIRA LOPES");
+    EXPECT_EQ(grabber.GetField("ID"), "PT210345675");
+    EXPECT_EQ(grabber.GetField("concelho"), "Lisboa") << "keys are compared without regard to case";
+    EXPECT_EQ(grabber.GetField("NOSUCHKEY"), "");
+}
+
+TEST(DirectoryNIFGrabber, finishesAlsoWhenNothingIsFound)
+{
+    DirectoryNIFGrabber grabber(test::sourcePath("data/contribuintes.json"));
+    grabber.SetField("nome", "antes");
+    EventLog log(grabber);
+    grabber.Fetch("PT999999990");
+    QTRY_VERIFY(!grabber.IsBusy());
+    EXPECT_EQ(log.events, QStringList({ "Starting", "Finished" }));
+    EXPECT_EQ(grabber.GetField("NOME"), "antes") << "nothing found leaves the fields";
+
+    DirectoryNIFGrabber missing("/nonexistent/contribuintes.json");
+    EventLog missingLog(missing);
+    missing.Fetch("PT210345675");
+    QTRY_VERIFY(!missing.IsBusy());
+    EXPECT_EQ(missingLog.events, QStringList({ "Starting", "Finished" }));
+}
+
+TEST(DirectoryNIFGrabber, factoryCanBeReplacedByTheHost)
+{
+    NIFGrabber *made = nullptr;
+    NIFGrabberFactory previous = setNIFGrabberFactory([&](QObject *parent) {
+        made = new DirectoryNIFGrabber("/elsewhere.json", parent);
+        return made;
+    });
+    QObject owner;
+    EXPECT_EQ(createNIFGrabber(&owner), made);
+    setNIFGrabberFactory(std::move(previous));
+    NIFGrabber *standard = createNIFGrabber(&owner);
+    EXPECT_NE(standard, made);
+    EXPECT_EQ(standard->parent(), &owner);
+}
+
+TEST(JsonDeclaration, answersTheQuestionsOfTheControls)
+{
+    JsonDeclaration declaration;
+    ASSERT_TRUE(declaration.load(test::sourcePath("data/declaracao.json")));
+    DeclarationData &data = declaration.DeclarationData();
+    EXPECT_EQ(data.FieldStore().Lookup("casado").toString(), "1");
+    EXPECT_EQ(data.FieldStore().Lookup("herancas").toString(), "1");
+    EXPECT_EQ(data.FieldStore().Lookup("nothing").toString(), "");
+    EXPECT_EQ(data.Dependants(), 2);
+    EXPECT_EQ(data.Ascendants(), 1);
+    EXPECT_EQ(data.Estates(), 1);
+    EXPECT_EQ(data.SubjectNif("D2"), "246813571");
+    EXPECT_EQ(data.SubjectName("D3"), "");
+    EXPECT_EQ(data.NifInfoStore().Read("182937461.nome").toString(), QString::fromUtf8("MARIA DA CONCEIÇÃO FERREIRA"));
+    EXPECT_EQ(data.NifInfoStore().Read("absent").toString(), "");
+    EXPECT_EQ(data.GetSujeitoTitle("D2"), "Dependente 2");
+    EXPECT_EQ(data.GetSujeitoTitle("H1"), QString::fromUtf8("Herança 1"));
+}
+
+TEST(JsonDeclaration, savesWhatItHoldsAndRejectsBadFilesWithoutLosingData)
+{
+    QTemporaryDir dir;
+    JsonDeclaration declaration;
+    ASSERT_TRUE(declaration.load(test::sourcePath("data/declaracao.json")));
+    declaration.DeclarationData().NifInfoStore().Write("PT210345675.telefone", "210000000");
+    declaration.DeclarationData().FieldStore().Set("obito", "1");
+    ASSERT_TRUE(declaration.save(dir.filePath("d.json")));
+
+    JsonDeclaration reloaded;
+    ASSERT_TRUE(reloaded.load(dir.filePath("d.json")));
+    EXPECT_EQ(reloaded.DeclarationData().NifInfoStore().Read("PT210345675.telefone").toString(), "210000000");
+    EXPECT_EQ(reloaded.DeclarationData().FieldStore().Lookup("obito").toString(), "1");
+    EXPECT_EQ(reloaded.DeclarationData().SubjectName("A"), "ANA MARIA FERREIRA LOPES");
+
+    QFile broken(dir.filePath("broken.json"));
+    ASSERT_TRUE(broken.open(QIODevice::WriteOnly));
+    broken.write("{ not json");
+    broken.close();
+    EXPECT_FALSE(reloaded.load(broken.fileName()));
+    EXPECT_FALSE(reloaded.load(dir.filePath("missing.json")));
+    EXPECT_EQ(reloaded.DeclarationData().Dependants(), 2) << "a failed load keeps the declaration";
+}
+
+TEST(FieldCollection, keepsInsertionOrderAndFindsTheFirst)
+{
+    FieldCollection fields;
+    fields.Add("email", "");
+    fields.Add("nome", "x");
+    fields.Add("email", "second");
+    EXPECT_EQ(fields.Count(), 3);
+    EXPECT_EQ(fields.items().at(1).id, "nome");
+    EXPECT_EQ(fields.Lookup("email").toString(), "");
+    fields.Set("email", "first");
+    EXPECT_EQ(fields.Lookup("email").toString(), "first");
+    EXPECT_EQ(fields.Count(), 3);
+}
