@@ -1,5 +1,7 @@
 #include "Gallery.h"
 
+#include "CountrySection.h"
+
 #include "frame/ClassRegistry.h"
 
 #include <QGroupBox>
@@ -38,6 +40,7 @@ Gallery::Gallery(QWidget *parent)
     resize(900, 700);
 
     addSection(QStringLiteral("Classes da biblioteca"), classList());
+    addSection(QStringLiteral("Escolha do país"), countrySection());
 }
 
 void Gallery::addSection(const QString &title, QWidget *content)
