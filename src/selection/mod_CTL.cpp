@@ -34,8 +34,6 @@ constexpr platform::OleColor White = platform::rgb(255, 255, 255);
 int flagCellIndex(const QString &code)
 {
     // Only a whole entry counts: a text search alone would find "" or "A" inside another code.
-    if (code.size() != 2)
-        return -1;
     const QLatin1StringView order(FlagOrder, sizeof(FlagOrder) - 1);
     for (int index = 0; index < FlagCellCount; ++index) {
         if (order.sliced(index * EntryLength, 2) == code)

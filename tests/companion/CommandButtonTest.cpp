@@ -81,16 +81,6 @@ TEST(CommandButton, toggleButtonsKeepTheirPressedValue)
     EXPECT_EQ(indexes(clicks), QList<int> { -1 });
 }
 
-TEST(CommandButton, disabledButtonsRaiseNothing)
-{
-    CommandButton button;
-    button.setEnabled(false);
-    QSignalSpy clicks(&button, &CommandButton::Click);
-    QTest::mouseClick(&button, Qt::LeftButton);
-    EXPECT_FALSE(button.Enabled());
-    EXPECT_EQ(clicks.count(), 0);
-}
-
 TEST(CommandButton, keyDownCarriesTheKeyCodeAndCanSwallowTheKey)
 {
     CommandButton button;
