@@ -114,6 +114,9 @@ frmSelectCountry::frmSelectCountry(QWidget *parent)
     (*d->buttons)(0)->setCaption(QStringLiteral("&OK"));
     (*d->buttons)(0)->setDefault(true);
     (*d->buttons)(1)->setCaption(QStringLiteral("&Cancelar"));
+    // Tab must not move the focus out of sight.
+    (*d->buttons)(0)->setFocusPolicy(Qt::NoFocus);
+    (*d->buttons)(1)->setFocusPolicy(Qt::NoFocus);
     connect(d->buttons, &CommandButtonArray::Click, this, [this](int index) {
         if (index == 0)
             acceptSelected();
