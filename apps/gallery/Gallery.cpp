@@ -40,6 +40,8 @@ Gallery::Gallery(QWidget *parent)
     resize(900, 700);
 
     addSection(QStringLiteral("NIB"), createNibSection());
+    addSection(QStringLiteral("Escolha do país"), createCountrySection());
+    // Last: which classes this build serves.
     addSection(QStringLiteral("Classes da biblioteca"), classList());
 }
 

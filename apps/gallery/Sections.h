@@ -4,3 +4,6 @@ class QWidget;
 
 // One builder per area of the library; each returns the content of a gallery row.
 QWidget *createNibSection();
+// A country picker: one button per filter mode opens the country dialog, and the chosen
+// country is shown with its flag.
+QWidget *createCountrySection();
