@@ -10,6 +10,7 @@ namespace {
 
 const std::array commands = {
     Command { "classes", "zelctl classes", runClasses },
+    Command { "nif", "zelctl nif CC NUMBER | zelctl nif --batch", runNif },
 };
 
 void printUsage(QTextStream &stream)
