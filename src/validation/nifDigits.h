@@ -62,6 +62,29 @@ inline qint64 leadingNumber(QStringView run)
     return value;
 }
 
+// The 0-based place of c in a short table, or -1. A plain loop: the tables are a few
+// characters long, too short for the library's vectorised search to pay off.
+inline qsizetype indexIn(QStringView table, QChar c)
+{
+    for (qsizetype i = 0; i < table.size(); ++i) {
+        if (table[i] == c)
+            return i;
+    }
+    return -1;
+}
+
+// Exact, case-sensitive comparison of two short texts.
+inline bool same(QStringView a, QStringView b)
+{
+    if (a.size() != b.size())
+        return false;
+    for (qsizetype i = 0; i < a.size(); ++i) {
+        if (a[i] != b[i])
+            return false;
+    }
+    return true;
+}
+
 // Whether the text is "0" repeated as often as it is long.
 inline bool allZeros(QStringView text)
 {

@@ -191,7 +191,7 @@ bool CheckES(QStringView text)
     const bool lastIsDigit = isNumeric(chars(text, 9, 9));
     const QStringView allowedFirst
         = lastIsDigit ? QStringView(u"ABCDEFGH") : QStringView(u"ABCDEFGHKLMNPQSX0123456789");
-    if (!allowedFirst.contains(first))
+    if (indexIn(allowedFirst, first) < 0)
         return false;
     if (lastIsDigit)
         return CheckESCifDigit(chars(text, 2, 9));
@@ -199,7 +199,7 @@ bool CheckES(QStringView text)
         const auto number = strictNumber(chars(text, 1, 8));
         return number && CheckESDniLetter(*number, text);
     }
-    if (QStringView(u"KLMX").contains(first))
+    if (indexIn(u"KLMX", first) >= 0)
         return CheckESDniLetter(*middleNumber, text);
     return CheckESCifLetter(chars(text, 2, 9));
 }
@@ -240,7 +240,7 @@ bool CheckESCifLetter(QStringView t)
     if (t.size() != 8)
         return false;
     const int remainder = spanishEntitySum(t) % 10;
-    return QStringView(u"ABCDEFGHIJ").indexOf(t[7]) + 1 == 10 - remainder;
+    return indexIn(u"ABCDEFGHIJ", t[7]) + 1 == 10 - remainder;
 }
 
 // France -----------------------------------------------------------------------------------
@@ -261,7 +261,7 @@ bool CheckFR(QStringView text)
     }
     if (allZeros(numericPart))
         return false;
-    if (!keyAlphabet.contains(text[0]) || !keyAlphabet.contains(text[1]))
+    if (indexIn(keyAlphabet, text[0]) < 0 || indexIn(keyAlphabet, text[1]) < 0)
         return false;
     const auto siren = strictNumber(chars(text, 3, 11));
     if (!siren)
@@ -273,7 +273,7 @@ bool CheckFR(QStringView text)
     // The letter form needs a letter first; a digit and a letter is no key at all.
     if (isAsciiDigit(text[0]))
         return false;
-    const int s = 34 * int(keyAlphabet.indexOf(text[0])) + int(keyAlphabet.indexOf(text[1])) - 100;
+    const int s = 34 * int(indexIn(keyAlphabet, text[0])) + int(indexIn(keyAlphabet, text[1])) - 100;
     const int p = s / 11 + 1;
     return (*siren + p) % 11 == s % 11;
 }
@@ -285,9 +285,9 @@ bool CheckGB(QStringView text)
     if (text.size() == 5) {
         const QStringView kind = chars(text, 1, 2);
         const qint64 number = leadingNumber(chars(text, 3, 5));
-        if (kind == u"GD")
+        if (same(kind, u"GD"))
             return number <= 499;
-        if (kind == u"HA")
+        if (same(kind, u"HA"))
             return number >= 500 && number <= 999;
         return false;
     }
@@ -295,7 +295,7 @@ bool CheckGB(QStringView text)
         return false;
     if (text[0] == u'0') {
         const QStringView group = chars(text, 1, 3);
-        if (group != u"000" && group != u"001" && group != u"002")
+        if (!same(group, u"000") && !same(group, u"001") && !same(group, u"002"))
             return false;
     }
     if (allZeros(text))
@@ -337,7 +337,7 @@ bool CheckIEChar(QStringView t)
     if (t.size() != 8 || allZeros(t))
         return false;
     const int sum = weightedSum(t, std::array { 8, 7, 6, 5, 4, 3, 2 });
-    return QStringView(u"WABCDEFGHIJKLMNOPQRSTUV").indexOf(t[7]) == sum % 23;
+    return indexIn(u"WABCDEFGHIJKLMNOPQRSTUV", t[7]) == sum % 23;
 }
 
 // Lithuania --------------------------------------------------------------------------------

@@ -149,7 +149,7 @@ bool CheckLU(QStringView text)
 
 bool CheckMT(QStringView text)
 {
-    if (text.size() != 8 || !isNumeric(text) || text[0] == u'0' || chars(text, 1, 6) == u"100000")
+    if (text.size() != 8 || !isNumeric(text) || text[0] == u'0' || same(chars(text, 1, 6), u"100000"))
         return false;
     const int check = 37 - weightedSum(text, std::array { 3, 4, 6, 7, 8, 9 }) % 37;
     return 10 * digitAt(text, 7) + digitAt(text, 8) == check;
@@ -196,7 +196,7 @@ bool CheckRO(QStringView text)
 
 bool CheckSE(QStringView text)
 {
-    if (text.size() != 12 || !isNumeric(text) || chars(text, 11, 12) != u"01")
+    if (text.size() != 12 || !isNumeric(text) || !same(chars(text, 11, 12), u"01"))
         return false;
     int sum = 0;
     for (int i = 1; i <= 9; i += 2)
@@ -223,7 +223,7 @@ bool CheckSK(QStringView text)
 {
     if (text.size() != 10 || !isNumeric(text) || digitAt(text, 1) == 0)
         return false;
-    if (QStringView(u"156").contains(text[2]))
+    if (indexIn(u"156", text[2]) >= 0)
         return false;
     const auto number = strictNumber(text);
     return number && BigMod(*number, 11) == 0;

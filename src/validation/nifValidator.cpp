@@ -65,6 +65,9 @@ constexpr bool isSign(QChar c)
 // decimal separator, and an exponent of "E" or "e", an optional sign and digits.
 bool isLenientNumber(QStringView text)
 {
+    // Nearly every number typed is plain digits.
+    if (allDigits(text))
+        return true;
     const qsizetype end = text.size();
     qsizetype i = 0;
     const auto skipBlanks = [&] {
@@ -111,7 +114,7 @@ bool isLenientNumber(QStringView text)
 int CountryIndex(QStringView code)
 {
     for (int index = 0; index < CountryCount; ++index) {
-        if (countries[index].code == code)
+        if (same(countries[index].code, code))
             return index;
     }
     return -1;
