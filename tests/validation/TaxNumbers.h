@@ -56,6 +56,13 @@ inline QString digitText(int check)
     return check >= 0 && check <= 9 ? QString::number(check) : QString();
 }
 
+// A run of digits and whether the rule under test accepts it.
+struct Verdict
+{
+    const char *digits;
+    bool accepted;
+};
+
 // The given digits that lie in 0..9, ascending and once each, as acceptedDigits gives them.
 inline QString digitSet(std::initializer_list<int> digits)
 {

@@ -78,36 +78,14 @@ TEST(IsNumericFrom, takesTheLenientReadingOfTheRequestedPart)
         int start, length;
         bool numeric;
     };
-    const Row rows[] = {
-        { "123456789", 1, 0, true },
-        { "", 1, 0, false },
-        { "   ", 1, 0, false },
-        { " 12 ", 1, 0, true },
-        { "+12", 1, 0, true },
-        { "12-", 1, 0, true },
-        { "-12-", 1, 0, false },
-        { "- 12", 1, 0, true },
-        { "1.5", 1, 0, true },
-        { "1,5", 1, 0, true },
-        { "1.5.1", 1, 0, false },
-        { ".", 1, 0, false },
-        { "1E5", 1, 0, true },
-        { "1e-5", 1, 0, true },
-        { "1E", 1, 0, false },
-        { "E5", 1, 0, false },
-        { "12A", 1, 0, false },
-        { "1 2", 1, 0, false },
-        { "U12345678", 2, 0, true },
-        { "U12345678", 1, 0, false },
-        { "12345678A", 1, 8, true },
-        { "12345678A", 1, 9, false },
-        { "12345678A", 9, 0, false },
-        { "123", 3, 0, true },
-        { "123", 4, 0, false },
-        { "123", 0, 0, false },
-        { "123", 2, 99, true },
-        { "123", 1, -3, true },
-    };
+    const Row rows[] = { { "123456789", 1, 0, true }, { "", 1, 0, false }, { "   ", 1, 0, false },
+        { " 12 ", 1, 0, true }, { "+12", 1, 0, true }, { "12-", 1, 0, true }, { "-12-", 1, 0, false },
+        { "- 12", 1, 0, true }, { "1.5", 1, 0, true }, { "1,5", 1, 0, true }, { "1.5.1", 1, 0, false },
+        { ".", 1, 0, false }, { "1E5", 1, 0, true }, { "1e-5", 1, 0, true }, { "1E", 1, 0, false },
+        { "E5", 1, 0, false }, { "12A", 1, 0, false }, { "1 2", 1, 0, false }, { "U12345678", 2, 0, true },
+        { "U12345678", 1, 0, false }, { "12345678A", 1, 8, true }, { "12345678A", 1, 9, false },
+        { "12345678A", 9, 0, false }, { "123", 3, 0, true }, { "123", 4, 0, false }, { "123", 0, 0, false },
+        { "123", 2, 99, true }, { "123", 1, -3, true } };
     for (const Row &row : rows)
         EXPECT_EQ(IsNumericFrom(QString(row.text), row.start, row.length), row.numeric)
             << '"' << row.text << "\" from " << row.start << " length " << row.length;
