@@ -14,3 +14,4 @@ struct Command
 
 int runClasses(const QStringList &args, QTextStream &out, QTextStream &err);
 int runNib(const QStringList &args, QTextStream &out, QTextStream &err);
+int runNif(const QStringList &args, QTextStream &out, QTextStream &err);

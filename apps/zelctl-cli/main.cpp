@@ -11,6 +11,7 @@ namespace {
 const std::array commands = {
     Command { "classes", "zelctl classes", runClasses },
     Command { "nib", "zelctl nib NUMBER", runNib },
+    Command { "nif", "zelctl nif CC NUMBER | zelctl nif --batch", runNif },
 };
 
 void printUsage(QTextStream &stream)
