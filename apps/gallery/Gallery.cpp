@@ -1,4 +1,5 @@
 #include "Gallery.h"
+#include "TipsSection.h"
 
 #include "frame/ClassRegistry.h"
 
@@ -38,6 +39,7 @@ Gallery::Gallery(QWidget *parent)
     resize(900, 700);
 
     addSection(QStringLiteral("Classes da biblioteca"), classList());
+    addSection(QStringLiteral("Dicas e botões de informação"), tipsSection());
 }
 
 void Gallery::addSection(const QString &title, QWidget *content)
