@@ -51,7 +51,7 @@ TooltipWindow::TooltipWindow(UINT style, QWidget *owner)
     m_autoPopTimer.setSingleShot(true);
     m_autoPopTimer.setInterval(DefaultAutoPopDelay);
     connect(&m_initialTimer, &QTimer::timeout, this, [this] {
-        if (m_active && !m_content.text.isEmpty())
+        if (m_tool && m_active && !m_content.text.isEmpty())
             popUp();
         else
             m_pointer = Pointer::Spent;
