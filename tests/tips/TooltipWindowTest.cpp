@@ -33,7 +33,7 @@ struct HoverTip : ::testing::Test
         tip.setParentControl(tool);
         tip.setTipText("Texto da dica");
         tip.setTitle("Título");
-        tip.SetTimeout(150, 400);
+        tip.SetTimeout(400, 400);
     }
 
     TooltipWindow *window() const { return qobject_cast<TooltipWindow *>(platform::widgetOf(tip.lHwnd())); }
