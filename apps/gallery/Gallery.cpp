@@ -1,4 +1,5 @@
 #include "Gallery.h"
+#include "TipsSection.h"
 
 #include "Sections.h"
 
@@ -43,6 +44,7 @@ Gallery::Gallery(QWidget *parent)
     addSection(QStringLiteral("Escolha do país"), createCountrySection());
     // Last: which classes this build serves.
     addSection(QStringLiteral("Classes da biblioteca"), classList());
+    addSection(QStringLiteral("Dicas e botões de informação"), tipsSection());
 }
 
 void Gallery::addSection(const QString &title, QWidget *content)

@@ -1,0 +1,208 @@
+#include "tips/TooltipWindow.h"
+#include "platform/WindowHandles.h"
+#include "tips/TipShape.h"
+#include "tips/clsBalloonTip.h"
+
+#include <QGuiApplication>
+#include <QPainter>
+#include <QScreen>
+#include <QTest>
+#include <QWidget>
+
+#include <gtest/gtest.h>
+
+using namespace zelctl;
+
+namespace {
+
+// A shown form with a tool widget in it, and a tip on the tool with short delays.
+struct HoverTip : ::testing::Test
+{
+    QWidget form;
+    QWidget *tool = new QWidget(&form);
+    clsBalloonTip tip;
+
+    HoverTip()
+    {
+        form.resize(300, 200);
+        tool->setGeometry(20, 20, 100, 40);
+        tool->setMouseTracking(true);
+        form.show();
+        EXPECT_TRUE(QTest::qWaitForWindowExposed(&form));
+        QTest::mouseMove(&form, QPoint(250, 150));
+        tip.setParentControl(tool);
+        tip.setTipText("Texto da dica");
+        tip.setTitle("Título");
+        tip.SetTimeout(400, 400);
+    }
+
+    TooltipWindow *window() const { return qobject_cast<TooltipWindow *>(platform::widgetOf(tip.lHwnd())); }
+};
+
+} // namespace
+
+TEST_F(HoverTip, appearsAfterTheInitialDelayAndHidesAfterTheDisplayTime)
+{
+    ASSERT_TRUE(tip.Create());
+    EXPECT_FALSE(window()->isVisible());
+    QTest::mouseMove(tool, QPoint(30, 10));
+    EXPECT_FALSE(window()->isVisible()) << "the pointer has not rested yet";
+    QTRY_VERIFY(window()->isVisible());
+    // The stem points at the pointer; the balloon lies below it.
+    EXPECT_EQ(window()->anchor(), tool->mapToGlobal(QPoint(30, 10)));
+    EXPECT_TRUE(window()->placement().stemUp);
+    EXPECT_GT(window()->geometry().bottom(), window()->anchor().y());
+    QTRY_VERIFY(!window()->isVisible());
+
+    // Resting on after the display time brings no second tip; leaving and coming back does.
+    QTest::mouseMove(tool, QPoint(31, 10));
+    QTest::mouseMove(&form, QPoint(250, 150));
+    QTest::mouseMove(tool, QPoint(40, 12));
+    QTRY_VERIFY(window()->isVisible());
+}
+
+TEST_F(HoverTip, leavingTheToolHidesTheTip)
+{
+    tip.SetTimeout(50, 60000);
+    tip.Create();
+    QTest::mouseMove(tool, QPoint(10, 10));
+    QTRY_VERIFY(window()->isVisible());
+    QTest::mouseMove(&form, QPoint(250, 150));
+    EXPECT_FALSE(window()->isVisible());
+}
+
+TEST_F(HoverTip, pressingOnTheToolDismissesTheTip)
+{
+    tip.SetTimeout(50, 60000);
+    tip.Create();
+    QTest::mouseMove(tool, QPoint(10, 10));
+    QTRY_VERIFY(window()->isVisible());
+    QTest::mousePress(tool, Qt::LeftButton, {}, QPoint(10, 10));
+    EXPECT_FALSE(window()->isVisible());
+    QTest::mouseRelease(tool, Qt::LeftButton, {}, QPoint(10, 10));
+}
+
+TEST_F(HoverTip, aTipWithoutTextNeverShows)
+{
+    tip.setTipText("");
+    tip.SetTimeout(0, 60000);
+    tip.Create();
+    QTest::mouseMove(tool, QPoint(10, 10));
+    QCoreApplication::processEvents();
+    QCoreApplication::processEvents();
+    EXPECT_FALSE(window()->isVisible());
+    tip.ShowNow();
+    EXPECT_FALSE(window()->isVisible());
+}
+
+TEST_F(HoverTip, centredTipSitsUnderTheMiddleOfTheTool)
+{
+    tip.SetTimeout(30, 60000);
+    tip.setCentered(true);
+    tip.Create();
+    QTest::mouseMove(tool, QPoint(5, 5));
+    QTRY_VERIFY(window()->isVisible());
+    EXPECT_EQ(window()->anchor(), tool->mapToGlobal(QPoint(49, 39)));
+    EXPECT_GE(window()->geometry().top(), window()->anchor().y());
+}
+
+TEST_F(HoverTip, aToolByRectangleKeepsTheAreaOfCreate)
+{
+    tip.setPopupOnDemand(false);
+    tip.SetTimeout(0, 60000);
+    tip.Create();
+    tool->resize(200, 40);
+    // Outside the area the tool had at Create: the tip does not show.
+    QTest::mouseMove(tool, QPoint(150, 10));
+    QCoreApplication::processEvents();
+    QCoreApplication::processEvents();
+    EXPECT_FALSE(window()->isVisible());
+    QTest::mouseMove(tool, QPoint(50, 10));
+    QTRY_VERIFY(window()->isVisible());
+}
+
+TEST_F(HoverTip, aTipAddedUnderThePointerShowsWithoutAnotherMove)
+{
+    QTest::mouseMove(tool, QPoint(10, 10));
+    ASSERT_TRUE(tool->underMouse());
+    tip.Create();
+    QTRY_VERIFY(window()->isVisible());
+}
+
+TEST_F(HoverTip, thePlainTooltipOfTheToolGivesWayToTheBalloon)
+{
+    tool->setToolTip("simples");
+    tip.Create();
+    QHelpEvent help(QEvent::ToolTip, QPoint(5, 5), tool->mapToGlobal(QPoint(5, 5)));
+    EXPECT_TRUE(QCoreApplication::sendEvent(tool, &help));
+    EXPECT_TRUE(help.isAccepted());
+}
+
+TEST(TipShape, balloonStaysOnTheScreenAndPointsAtTheAnchor)
+{
+    const QRect screen(0, 0, 800, 600);
+    const QSize content(150, 40);
+    const QPoint anchors[] = { { 400, 300 }, { 2, 2 }, { 798, 5 }, { 5, 598 }, { 797, 597 } };
+    for (const bool centred : { false, true }) {
+        for (const QPoint anchor : anchors) {
+            const tipShape::Placement placement = tipShape::place(content, anchor, screen, true, centred);
+            EXPECT_TRUE(screen.contains(placement.geometry)) << anchor.x() << "," << anchor.y();
+            EXPECT_TRUE(placement.geometry.contains(anchor));
+            // The stem reaches the anchor.
+            const QPointF local = QPointF(anchor - placement.geometry.topLeft());
+            EXPECT_TRUE(placement.outline.intersects(QRectF(local - QPointF(1, 1), QSizeF(2, 2))))
+                << anchor.x() << "," << anchor.y();
+            EXPECT_TRUE(placement.geometry.contains(placement.content.translated(placement.geometry.topLeft())));
+            EXPECT_EQ(placement.content.size(), content);
+        }
+    }
+    EXPECT_TRUE(tipShape::place(content, { 400, 300 }, screen, true, false).stemUp);
+    EXPECT_FALSE(tipShape::place(content, { 400, 590 }, screen, true, false).stemUp);
+}
+
+TEST(TipShape, rectangleStartsBelowThePointer)
+{
+    const tipShape::Placement placement = tipShape::place({ 100, 20 }, { 50, 50 }, { 0, 0, 800, 600 }, false, false);
+    EXPECT_EQ(placement.geometry.left(), 50);
+    EXPECT_GT(placement.geometry.top(), 50);
+    EXPECT_TRUE(placement.outline.contains(QPointF(0.5, 0.5))) << "a rectangle has square corners";
+}
+
+TEST(TipShape, balloonPictureHasRoundCornersAndAStem)
+{
+    tipShape::Content content;
+    content.title = "Informação";
+    content.icon = 1;
+    content.text = "Primeira linha\nSegunda linha";
+    content.foreground = Qt::black;
+    content.background = QColor(0xFF, 0xFF, 0xE1);
+    const QFont font;
+    const QSize size = tipShape::contentSize(content, font);
+    const QSize oneLine = tipShape::contentSize({ content.title, 1, "Primeira linha", {}, {} }, font);
+    EXPECT_GT(size.height(), oneLine.height()) << "two lines are taller than one";
+    EXPECT_GE(size.width(), 16 + QFontMetrics(font).horizontalAdvance("Segunda"));
+
+    const tipShape::Placement placement = tipShape::place(size, { 100, 100 }, { 0, 0, 800, 600 }, true, false);
+    QImage image(placement.geometry.size(), QImage::Format_ARGB32_Premultiplied);
+    image.fill(Qt::transparent);
+    QPainter painter(&image);
+    tipShape::paint(painter, placement, content, font);
+    painter.end();
+
+    EXPECT_EQ(qAlpha(image.pixel(0, 0)), 0) << "corner left of the stem";
+    EXPECT_EQ(qAlpha(image.pixel(image.width() - 1, image.height() - 1)), 0) << "rounded corner";
+    const QPoint tip = QPoint(100, 100) - placement.geometry.topLeft();
+    EXPECT_GT(qAlpha(image.pixel(tip + QPoint(1, 3))), 0) << "the stem";
+    EXPECT_EQ(qAlpha(image.pixel(tip + QPoint(-3, 3))), 0) << "beside the stem";
+    const QPoint middle(image.width() / 2, placement.content.top() - 3);
+    EXPECT_EQ(QColor(image.pixel(middle)), content.background);
+    // The information icon, blue, is drawn at the content's left.
+    bool blue = false;
+    for (int y = placement.content.top(); y < placement.content.top() + 20; ++y) {
+        for (int x = placement.content.left(); x < placement.content.left() + 16; ++x) {
+            const QColor c = image.pixelColor(x, y);
+            blue = blue || c.blue() > c.red() + 60;
+        }
+    }
+    EXPECT_TRUE(blue);
+}
