@@ -1,5 +1,4 @@
 #include "Gallery.h"
-#include "TipsSection.h"
 
 #include "Sections.h"
 
@@ -42,9 +41,9 @@ Gallery::Gallery(QWidget *parent)
 
     addSection(QStringLiteral("NIB"), createNibSection());
     addSection(QStringLiteral("Escolha do país"), createCountrySection());
+    addSection(QStringLiteral("Dicas e botões de informação"), createTipsSection());
     // Last: which classes this build serves.
     addSection(QStringLiteral("Classes da biblioteca"), classList());
-    addSection(QStringLiteral("Dicas e botões de informação"), tipsSection());
 }
 
 void Gallery::addSection(const QString &title, QWidget *content)

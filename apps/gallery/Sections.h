@@ -7,3 +7,5 @@ QWidget *createNibSection();
 // A country picker: one button per filter mode opens the country dialog, and the chosen
 // country is shown with its flag.
 QWidget *createCountrySection();
+// Information, warning and error buttons with their balloon tips.
+QWidget *createTipsSection();

@@ -1,4 +1,4 @@
-#include "TipsSection.h"
+#include "Sections.h"
 
 #include "tips/InfoButton.h"
 
@@ -21,7 +21,7 @@ InfoButton *button(InfoButton::IB_STYLE_ENUM style, const QString &title, const 
 
 } // namespace
 
-QWidget *tipsSection()
+QWidget *createTipsSection()
 {
     auto *section = new QWidget;
     auto *grid = new QGridLayout(section);

@@ -86,7 +86,8 @@ public:
 
 } // namespace zelctl
 
-// Makes a class creatable through its factory. Use once, in the class's source file.
+// Makes a class creatable through its factory. Use once, in the class's source file,
+// inside namespace zelctl.
 #define ZELCTL_REGISTER_CLASS(Class)                                                                                   \
     namespace {                                                                                                        \
     const bool registered_##Class = ::zelctl::ClassRegistry::provide(                                                  \

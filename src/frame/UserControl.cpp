@@ -2,6 +2,8 @@
 
 #include "platform/WindowHandles.h"
 
+#include <QScopedValueRollback>
+
 namespace zelctl {
 
 UserControl::UserControl(QWidget *parent)
@@ -13,12 +15,21 @@ UserControl::~UserControl() = default;
 
 void UserControl::InitNew()
 {
+    // Taking the defaults or the saved values changes nothing the container must save.
+    const QScopedValueRollback quiet(m_quiet, true);
     InitProperties();
 }
 
 void UserControl::Load(const PropertyBag &bag)
 {
+    const QScopedValueRollback quiet(m_quiet, true);
     ReadProperties(bag);
+}
+
+void UserControl::PropertyChanged(const QString &name)
+{
+    if (!m_quiet)
+        Q_EMIT propertyChanged(name);
 }
 
 PropertyBag UserControl::Save()

@@ -58,13 +58,15 @@ protected:
     virtual void Terminate() { }
     virtual void AmbientChanged(const QString &name) { Q_UNUSED(name) }
 
-    void PropertyChanged(const QString &name) { Q_EMIT propertyChanged(name); }
+    // Setters call this; it is silent while the control takes its defaults or saved values.
+    void PropertyChanged(const QString &name);
 
 private:
     LiveObject m_live;
     Ambient m_ambient;
     Extender m_extender;
     bool m_terminated = false;
+    bool m_quiet = false;
 };
 
 } // namespace zelctl

@@ -24,6 +24,11 @@ public:
     }
 
     QString caption;
+    void setCaption(const QString &text)
+    {
+        caption = text;
+        PropertyChanged("Caption");
+    }
 
 protected:
     void InitProperties() override
@@ -34,7 +39,7 @@ protected:
     void ReadProperties(const PropertyBag &bag) override
     {
         m_calls << "ReadProperties";
-        caption = bag.ReadProperty("Caption", "default").toString();
+        setCaption(bag.ReadProperty("Caption", "default").toString());
     }
     void WriteProperties(PropertyBag &bag) override
     {
@@ -93,8 +98,12 @@ TEST(UserControlLifeCycle, savedControlIsLoadedThroughReadProperties)
     }
     calls.clear();
     RecordingControl second(calls);
+    QSignalSpy changes(&second, &UserControl::propertyChanged);
     second.Load(bag);
     EXPECT_EQ(second.caption, "Olá");
+    EXPECT_EQ(changes.count(), 0) << "loading marks nothing as changed";
+    second.setCaption("novo");
+    EXPECT_EQ(changes.count(), 1);
     EXPECT_EQ(calls, QStringList({ "Initialize", "ReadProperties" }));
 }
 
