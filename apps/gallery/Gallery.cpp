@@ -3,6 +3,12 @@
 #include "Sections.h"
 
 #include "frame/ClassRegistry.h"
+#include "frame/FormFile.h"
+#include "frame/UserControl.h"
+
+#include <QFileDialog>
+#include <QMenuBar>
+#include <QMessageBox>
 
 #include <QGroupBox>
 #include <QLabel>
@@ -38,6 +44,7 @@ Gallery::Gallery(QWidget *parent)
     scroll->setWidget(form);
     setCentralWidget(scroll);
     resize(900, 700);
+    addFileMenu();
 
     addSection(QStringLiteral("NIB"), createNibSection());
     addSection(QStringLiteral("Escolha do país"), createCountrySection());
@@ -52,4 +59,48 @@ void Gallery::addSection(const QString &title, QWidget *content)
     auto *layout = new QVBoxLayout(box);
     layout->addWidget(content);
     m_sections->insertWidget(m_sections->count() - 1, box);
+}
+
+QList<zelctl::UserControl *> Gallery::controls() const
+{
+    return centralWidget()->findChildren<zelctl::UserControl *>();
+}
+
+bool Gallery::saveForm(const QString &path, QString *error) const
+{
+    if (zelctl::FormFile::save(path, controls()))
+        return true;
+    *error = QStringLiteral("Não foi possível gravar o formulário em %1.").arg(path);
+    return false;
+}
+
+bool Gallery::openForm(const QString &path, QString *error)
+{
+    QJsonObject form;
+    if (!zelctl::FormFile::load(path, &form)) {
+        *error = QStringLiteral("%1 não é um formulário que se possa ler.").arg(path);
+        return false;
+    }
+    zelctl::FormFile::apply(form, controls());
+    return true;
+}
+
+void Gallery::addFileMenu()
+{
+    QMenu *file = menuBar()->addMenu(QStringLiteral("&Ficheiro"));
+    const QString filter = QStringLiteral("Formulários (*.json)");
+    file->addAction(QStringLiteral("&Abrir formulário..."), this, [this, filter] {
+        const QString path = QFileDialog::getOpenFileName(this, QStringLiteral("Abrir formulário"), {}, filter);
+        QString error;
+        if (!path.isEmpty() && !openForm(path, &error))
+            QMessageBox::warning(this, windowTitle(), error);
+    });
+    file->addAction(QStringLiteral("&Guardar formulário..."), this, [this, filter] {
+        const QString path = QFileDialog::getSaveFileName(this, QStringLiteral("Guardar formulário"), {}, filter);
+        QString error;
+        if (!path.isEmpty() && !saveForm(path, &error))
+            QMessageBox::warning(this, windowTitle(), error);
+    });
+    file->addSeparator();
+    file->addAction(QStringLiteral("&Sair"), this, &QWidget::close);
 }

@@ -1,5 +1,5 @@
 // gallery: the demo host of the zelctl controls.
-//   gallery [--screenshot OUT.png]
+//   gallery [--form FILE] [--save-form FILE] [--screenshot OUT.png]
 
 #include "Gallery.h"
 
@@ -16,9 +16,24 @@ int main(int argc, char **argv)
     parser.addHelpOption();
     const QCommandLineOption screenshot("screenshot", "Render the window to a PNG file and quit.", "file");
     parser.addOption(screenshot);
+    const QCommandLineOption form("form", "Load the controls' properties from a form file.", "file");
+    parser.addOption(form);
+    const QCommandLineOption saveForm("save-form", "Save the controls' properties to a form file and quit.", "file");
+    parser.addOption(saveForm);
     parser.process(app);
 
     Gallery gallery;
+    QString error;
+    if (parser.isSet(form) && !gallery.openForm(parser.value(form), &error)) {
+        QTextStream(stderr) << "gallery: " << error << '\n';
+        return 1;
+    }
+    if (parser.isSet(saveForm)) {
+        if (gallery.saveForm(parser.value(saveForm), &error))
+            return 0;
+        QTextStream(stderr) << "gallery: " << error << '\n';
+        return 1;
+    }
     gallery.show();
     if (!parser.isSet(screenshot))
         return app.exec();
