@@ -7,3 +7,5 @@ QWidget *createNibSection();
 // A country picker: one button per filter mode opens the country dialog, and the chosen
 // country is shown with its flag.
 QWidget *createCountrySection();
+// A subject selector offering every kind, bound to the bundled declaration.
+QWidget *createSubjectSection();
