@@ -9,3 +9,5 @@ QWidget *createNibSection();
 QWidget *createCountrySection();
 // Information, warning and error buttons with their balloon tips.
 QWidget *createTipsSection();
+// A subject selector offering every kind, bound to the bundled declaration.
+QWidget *createSubjectSection();
