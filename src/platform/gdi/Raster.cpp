@@ -679,6 +679,8 @@ bool alphaBlend(const Surface &dst, Extent to, const Surface &src, Extent from, 
 
 void fillRect(const Surface &dst, const QRect &rect, quint32 value)
 {
+    if (rect.isEmpty())
+        return; // QRect's intersection would turn an inverted rectangle round
     const QRect area = rect & QRect(0, 0, dst.width, dst.height);
     if (area.isEmpty())
         return;

@@ -9,6 +9,7 @@
 #include <QWidget>
 
 #include <cmath>
+#include <cstring>
 
 namespace zelctl::gdi {
 
@@ -58,22 +59,29 @@ bool TextOut(HDC hdc, int x, int y, const QString &text)
     const Surface &surface = dc->bitmap.object->surface;
     if (surface.bpp != 24 && surface.bpp != 32)
         return false;
-    // QPainter draws straight into the bitmap's memory; a bottom-up bitmap is drawn through
-    // a vertical flip because its first row in memory is the bottom one.
-    QImage view(surface.bits, surface.width, surface.height, surface.stride,
-        surface.bpp == 32 ? QImage::Format_RGB32 : QImage::Format_BGR888);
-    view.setDotsPerMeterX(DotsPerMeter);
-    view.setDotsPerMeterY(DotsPerMeter);
-    QPainter painter(&view);
-    if (!surface.topDown) {
-        painter.translate(0, surface.height);
-        painter.scale(1, -1);
+    // QPainter draws straight into a top-down bitmap's memory. A bottom-up bitmap is drawn
+    // on a top-down copy, because glyphs drawn through a flipping transform come out
+    // rasterised differently.
+    const QImage::Format format = surface.bpp == 32 ? QImage::Format_RGB32 : QImage::Format_BGR888;
+    QImage image = surface.topDown ? QImage(surface.bits, surface.width, surface.height, surface.stride, format)
+                                   : QImage(surface.width, surface.height, format);
+    const size_t rowBytes = size_t(surface.width) * size_t(surface.bpp / 8);
+    if (!surface.topDown)
+        for (int row = 0; row < surface.height; ++row)
+            std::memcpy(image.scanLine(row), surface.row(row), rowBytes);
+    image.setDotsPerMeterX(DotsPerMeter);
+    image.setDotsPerMeterY(DotsPerMeter);
+    {
+        QPainter painter(&image);
+        const QFont font = qFont(*dc->font.object);
+        painter.setFont(font);
+        painter.setPen(platform::toQColor(dc->textColor));
+        const QFontMetricsF metrics(font, &image);
+        painter.drawText(QPointF(x, y + metrics.ascent()), text);
     }
-    const QFont font = qFont(*dc->font.object);
-    painter.setFont(font);
-    painter.setPen(platform::toQColor(dc->textColor));
-    const QFontMetricsF metrics(font, &view);
-    painter.drawText(QPointF(x, y + metrics.ascent()), text);
+    if (!surface.topDown)
+        for (int row = 0; row < surface.height; ++row)
+            std::memcpy(surface.row(row), image.constScanLine(row), rowBytes);
     return true;
 }
 
