@@ -2,7 +2,10 @@
 
 #include <algorithm>
 #include <cstring>
+#include <functional>
 #include <optional>
+#include <system_error>
+#include <thread>
 #include <vector>
 
 namespace zelctl::gdi::detail {
@@ -56,11 +59,11 @@ namespace {
 using U8x8 = quint8 __attribute__((vector_size(8)));
 using U8x16 = quint8 __attribute__((vector_size(16)));
 using U8x32 = quint8 __attribute__((vector_size(32)));
+using U16x8 = quint16 __attribute__((vector_size(16)));
 using U16x16 = quint16 __attribute__((vector_size(32)));
 using U32x8 = quint32 __attribute__((vector_size(32)));
 using I32x8 = qint32 __attribute__((vector_size(32)));
 using F32x8 = float __attribute__((vector_size(32)));
-using U32x16 = quint32 __attribute__((vector_size(64)));
 
 // ---- Geometry --------------------------------------------------------------------------
 
@@ -415,6 +418,30 @@ const Surface &detachSource(const Surface &dst, const Surface &src, Axis &x, Axi
     return shot.surface;
 }
 
+// ---- Bands ------------------------------------------------------------------------------
+
+// Large jobs are split into bands of target rows worked on by several threads, as QPainter
+// does; small ones stay on the calling thread, where starting threads would cost more than
+// they save.
+void forEachBand(size_t rows, qint64 pixels, const std::function<void(size_t, size_t)> &work)
+{
+    constexpr qint64 ThreadedPixels = 1 << 18;
+    const size_t cores = std::thread::hardware_concurrency();
+    const size_t bands = pixels < ThreadedPixels || cores < 2 ? 1 : std::min({ cores, size_t(4), rows });
+    std::vector<std::thread> helpers;
+    for (size_t band = 1; band < bands; ++band) {
+        const size_t begin = rows * band / bands, end = rows * (band + 1) / bands;
+        try {
+            helpers.emplace_back(work, begin, end);
+        } catch (const std::system_error &) {
+            work(begin, end); // no thread to be had: do it here
+        }
+    }
+    work(0, rows / bands);
+    for (std::thread &helper : helpers)
+        helper.join();
+}
+
 // ---- Nearest-pixel blits ---------------------------------------------------------------
 
 bool sameFormat(const Surface &dst, const Surface &src, const Translator &translate)
@@ -424,56 +451,58 @@ bool sameFormat(const Surface &dst, const Surface &src, const Translator &transl
 
 void nearestBlit(const Surface &dst, const Surface &src, const AxisMap &xs, const AxisMap &ys, Rop rop)
 {
-    Translator translate(dst, src);
     const int n = int(xs.src.size());
     const bool span = xs.isSpan(1);
-    std::vector<quint32> values(static_cast<size_t>(n));
     const int bytesPerPixel = dst.bpp / 8;
-    for (size_t k = 0; k < ys.src.size(); ++k) {
-        uchar *to = dst.row(ys.first + int(k));
-        const uchar *from = src.row(ys.src[k]);
-        // Enlarging repeats source rows: a copied row is the same as the row above it.
-        if (k > 0 && ys.src[k] == ys.src[k - 1] && rop == Rop::Copy && bytesPerPixel > 0) {
-            const qsizetype offset = qsizetype(xs.first) * bytesPerPixel;
-            std::memcpy(to + offset, dst.row(ys.first + int(k) - 1) + offset, size_t(n) * size_t(bytesPerPixel));
-            continue;
-        }
-        if (!span && dst.bpp == 32 && src.bpp == 32 && rop == Rop::Copy) {
-            gatherValues(src, from, xs.src.data(), n, reinterpret_cast<quint32 *>(to) + xs.first);
-            continue;
-        }
-        if (span && sameFormat(dst, src, translate)) {
-            const int bytes = dst.bpp / 8;
-            uchar *d = to + qsizetype(xs.first) * bytes;
-            const uchar *s = from + qsizetype(xs.src[0]) * bytes;
-            if (bytes == 4)
-                combine(reinterpret_cast<quint32 *>(d), reinterpret_cast<const quint32 *>(s), n, rop);
-            else
-                combine(d, s, qsizetype(n) * bytes, rop);
-            continue;
-        }
-        if (span && src.bpp == 8 && translate.isLookup() && rop == Rop::Copy && dst.bpp >= 24) {
-            const auto &lookup = translate.lookup();
-            const uchar *s = from + xs.src[0];
-            if (dst.bpp == 32) {
-                quint32 *d = reinterpret_cast<quint32 *>(to) + xs.first;
-                for (int i = 0; i < n; ++i)
-                    d[i] = lookup[s[i]];
-            } else {
-                uchar *d = to + 3 * qsizetype(xs.first);
-                for (int i = 0; i < n; ++i, d += 3) {
-                    const quint32 v = lookup[s[i]];
-                    d[0] = uchar(v);
-                    d[1] = uchar(v >> 8);
-                    d[2] = uchar(v >> 16);
-                }
+    forEachBand(ys.src.size(), qint64(n) * qint64(ys.src.size()), [&](size_t begin, size_t end) {
+        Translator translate(dst, src);
+        std::vector<quint32> values(static_cast<size_t>(n));
+        for (size_t k = begin; k < end; ++k) {
+            uchar *to = dst.row(ys.first + int(k));
+            const uchar *from = src.row(ys.src[k]);
+            // Enlarging repeats source rows: a copied row is the same as the row above it.
+            if (k > begin && ys.src[k] == ys.src[k - 1] && rop == Rop::Copy && bytesPerPixel > 0) {
+                const qsizetype offset = qsizetype(xs.first) * bytesPerPixel;
+                std::memcpy(to + offset, dst.row(ys.first + int(k) - 1) + offset, size_t(n) * size_t(bytesPerPixel));
+                continue;
             }
-            continue;
+            if (!span && dst.bpp == 32 && src.bpp == 32 && rop == Rop::Copy) {
+                gatherValues(src, from, xs.src.data(), n, reinterpret_cast<quint32 *>(to) + xs.first);
+                continue;
+            }
+            if (span && sameFormat(dst, src, translate)) {
+                const int bytes = dst.bpp / 8;
+                uchar *d = to + qsizetype(xs.first) * bytes;
+                const uchar *s = from + qsizetype(xs.src[0]) * bytes;
+                if (bytes == 4)
+                    combine(reinterpret_cast<quint32 *>(d), reinterpret_cast<const quint32 *>(s), n, rop);
+                else
+                    combine(d, s, qsizetype(n) * bytes, rop);
+                continue;
+            }
+            if (span && src.bpp == 8 && translate.isLookup() && rop == Rop::Copy && dst.bpp >= 24) {
+                const auto &lookup = translate.lookup();
+                const uchar *s = from + xs.src[0];
+                if (dst.bpp == 32) {
+                    quint32 *d = reinterpret_cast<quint32 *>(to) + xs.first;
+                    for (int i = 0; i < n; ++i)
+                        d[i] = lookup[s[i]];
+                } else {
+                    uchar *d = to + 3 * qsizetype(xs.first);
+                    for (int i = 0; i < n; ++i, d += 3) {
+                        const quint32 v = lookup[s[i]];
+                        d[0] = uchar(v);
+                        d[1] = uchar(v >> 8);
+                        d[2] = uchar(v >> 16);
+                    }
+                }
+                continue;
+            }
+            gatherValues(src, from, xs.src.data(), n, values.data());
+            translate.apply(values.data(), n);
+            storeValues(dst, to, xs.first, n, values.data(), rop);
         }
-        gatherValues(src, from, xs.src.data(), n, values.data());
-        translate.apply(values.data(), n);
-        storeValues(dst, to, xs.first, n, values.data(), rop);
-    }
+    });
 }
 
 // ---- Area-averaging blits --------------------------------------------------------------
@@ -517,16 +546,33 @@ public:
         Slot &slot = m_slots[size_t(m_next)];
         m_next ^= 1;
         slot.row = y;
-        gatherColors(m_src, m_src.row(y), m_xs.data(), int(m_xs.size()), m_colors.data());
-        for (size_t i = 0; i < m_colors.size(); ++i)
-            m_spread[i] = spread(m_colors[i]);
-        for (size_t k = 0; k < m_columns.first.size(); ++k) {
-            const quint32 *w = m_columns.weights.data() + m_columns.offset[k];
-            const quint64 *c = m_spread.data() + (m_columns.first[k] - m_columns.minSrc);
-            quint64 sum = 0;
-            for (int t = 0; t < m_columns.count[k]; ++t)
-                sum += c[t] * w[t];
-            slot.means[k] = sum;
+        const quint32 *colors = reinterpret_cast<const quint32 *>(m_src.row(y)) + m_columns.minSrc;
+        if (m_src.bpp != 32) {
+            gatherColors(m_src, m_src.row(y), m_xs.data(), int(m_xs.size()), m_colors.data());
+            colors = m_colors.data();
+        }
+        for (size_t i = 0; i < m_spread.size(); ++i)
+            m_spread[i] = spread(colors[i]);
+        const quint32 *weights = m_columns.weights.data();
+        const quint64 *spreadColors = m_spread.data() - m_columns.minSrc;
+        if (m_columns.maxCount <= 2) {
+            // Enlarging or mild shrinking: one or two taps; a lone tap is paired with itself
+            // at weight 0.
+            for (size_t k = 0; k < m_columns.first.size(); ++k) {
+                const quint32 *w = weights + m_columns.offset[k];
+                const quint64 *c = spreadColors + m_columns.first[k];
+                const bool two = m_columns.count[k] == 2;
+                slot.means[k] = c[0] * w[0] + c[two ? 1 : 0] * (two ? w[1] : 0);
+            }
+        } else {
+            for (size_t k = 0; k < m_columns.first.size(); ++k) {
+                const quint32 *w = weights + m_columns.offset[k];
+                const quint64 *c = spreadColors + m_columns.first[k];
+                quint64 sum = 0;
+                for (int t = 0; t < m_columns.count[k]; ++t)
+                    sum += c[t] * w[t];
+                slot.means[k] = sum;
+            }
         }
         return reinterpret_cast<const quint16 *>(slot.means.data());
     }
@@ -560,12 +606,15 @@ constexpr quint32 RowHalf = 1u << (RowShift - 1);
     if (!second)
         second = first;
     size_t i = 0;
-    for (; i + 16 <= channels; i += 16) {
-        U16x16 a, b;
+    for (; i + 8 <= channels; i += 8) {
+        U16x8 a, b;
         std::memcpy(&a, first + i, sizeof a);
         std::memcpy(&b, second + i, sizeof b);
-        const U32x16 sum = __builtin_convertvector(a, U32x16) * w0 + __builtin_convertvector(b, U32x16) * w1 + RowHalf;
-        const U8x16 bytes = __builtin_convertvector(sum >> RowShift, U8x16);
+        const U32x8 sum
+            = (__builtin_convertvector(a, U32x8) * w0 + __builtin_convertvector(b, U32x8) * w1 + RowHalf) >> RowShift;
+        // Each lane holds one byte now; gather the low bytes.
+        const U8x32 lanes = (U8x32)sum;
+        const U8x8 bytes = __builtin_shufflevector(lanes, lanes, 0, 4, 8, 12, 16, 20, 24, 28);
         std::memcpy(out + i, &bytes, sizeof bytes);
     }
     for (; i < channels; ++i)
@@ -591,44 +640,51 @@ void areaBlit(const Surface &dst, const Surface &src, const Axis &xAxis, const A
 {
     const Taps columns = areaTaps(xAxis, xs, src.width, ColumnWeightBits);
     const Taps rows = areaTaps(yAxis, ys, src.height, RowWeightBits);
-    FilteredRows filtered(src, columns);
     const int n = int(xs.src.size());
-    std::vector<quint32> sums(size_t(n) * 4);
-    std::vector<quint32> values(static_cast<size_t>(n));
-    std::optional<NearestCache> nearest;
-    if (dst.indexed())
-        nearest.emplace(dst);
 #if defined(__x86_64__)
     static const bool avx2 = __builtin_cpu_supports("avx2");
     const auto weigh = avx2 ? weighRowsAvx2 : weighRowsBaseline;
 #else
     const auto weigh = weighRowsBaseline;
 #endif
-    for (size_t k = 0; k < ys.src.size(); ++k) {
-        const int first = rows.first[k], count = rows.count[k];
-        const quint32 *w = rows.weights.data() + rows.offset[k];
-        if (count <= 2) {
-            const quint16 *top = filtered.row(first);
-            weigh(top, count == 2 ? filtered.row(first + 1, first) : nullptr, w, sums.size(), values.data());
-        } else {
-            // Shrinking by more than two rows: summed one row at a time.
-            for (int t = 0; t < count; ++t) {
-                const quint16 *line = filtered.row(first + t);
+    forEachBand(ys.src.size(), qint64(n) * qint64(ys.src.size()), [&](size_t begin, size_t end) {
+        FilteredRows filtered(src, columns);
+        std::vector<quint32> sums(size_t(n) * 4);
+        std::vector<quint32> values(static_cast<size_t>(n));
+        std::optional<NearestCache> nearest;
+        if (dst.indexed())
+            nearest.emplace(dst);
+        for (size_t k = begin; k < end; ++k) {
+            const int first = rows.first[k], count = rows.count[k];
+            const quint32 *w = rows.weights.data() + rows.offset[k];
+            // A copy into 32 bits goes straight into the target row.
+            const bool direct = dst.bpp == 32 && rop == Rop::Copy;
+            quint32 *out = direct ? reinterpret_cast<quint32 *>(dst.row(ys.first + int(k))) + xs.first : values.data();
+            if (count <= 2) {
+                const quint16 *top = filtered.row(first);
+                weigh(top, count == 2 ? filtered.row(first + 1, first) : nullptr, w, sums.size(), out);
+            } else {
+                // Shrinking by more than two rows: summed one row at a time.
+                for (int t = 0; t < count; ++t) {
+                    const quint16 *line = filtered.row(first + t);
+                    for (size_t i = 0; i < sums.size(); ++i)
+                        sums[i] = (t == 0 ? RowHalf : sums[i]) + w[t] * line[i];
+                }
+                uchar *bytes = reinterpret_cast<uchar *>(out);
                 for (size_t i = 0; i < sums.size(); ++i)
-                    sums[i] = (t == 0 ? RowHalf : sums[i]) + w[t] * line[i];
+                    bytes[i] = uchar(sums[i] >> RowShift);
             }
-            uchar *out = reinterpret_cast<uchar *>(values.data());
-            for (size_t i = 0; i < sums.size(); ++i)
-                out[i] = uchar(sums[i] >> RowShift);
+            if (direct)
+                continue;
+            if (nearest)
+                for (quint32 &v : values)
+                    v = (*nearest)(v);
+            else if (dst.bpp == 24)
+                for (quint32 &v : values)
+                    v &= 0xFFFFFFu;
+            storeValues(dst, dst.row(ys.first + int(k)), xs.first, n, values.data(), rop);
         }
-        if (nearest)
-            for (quint32 &v : values)
-                v = (*nearest)(v);
-        else if (dst.bpp == 24)
-            for (quint32 &v : values)
-                v &= 0xFFFFFFu;
-        storeValues(dst, dst.row(ys.first + int(k)), xs.first, n, values.data(), rop);
-    }
+    });
 }
 
 // ---- Alpha blending --------------------------------------------------------------------
@@ -832,24 +888,26 @@ bool alphaBlend(const Surface &dst, Extent to, const Surface &src, Extent from, 
     const int n = int(xs.src.size());
     const bool opaqueSource = !perPixel || source.bpp != 32;
     const bool span = xs.isSpan(1);
-    std::vector<quint32> colors(static_cast<size_t>(n));
-    std::optional<NearestCache> nearest;
-    if (dst.indexed())
-        nearest.emplace(dst);
-    for (size_t k = 0; k < ys.src.size(); ++k) {
-        uchar *row = dst.row(ys.first + int(k));
-        const uchar *from = source.row(ys.src[k]);
-        if (span && !opaqueSource && dst.bpp == 32) {
-            blendRow(reinterpret_cast<quint32 *>(row) + xs.first, reinterpret_cast<const quint32 *>(from) + xs.src[0],
-                n, constantAlpha);
-            continue;
+    forEachBand(ys.src.size(), qint64(n) * qint64(ys.src.size()), [&](size_t begin, size_t end) {
+        std::vector<quint32> colors(static_cast<size_t>(n));
+        std::optional<NearestCache> nearest;
+        if (dst.indexed())
+            nearest.emplace(dst);
+        for (size_t k = begin; k < end; ++k) {
+            uchar *row = dst.row(ys.first + int(k));
+            const uchar *from = source.row(ys.src[k]);
+            if (span && !opaqueSource && dst.bpp == 32) {
+                blendRow(reinterpret_cast<quint32 *>(row) + xs.first,
+                    reinterpret_cast<const quint32 *>(from) + xs.src[0], n, constantAlpha);
+                continue;
+            }
+            gatherColors(source, from, xs.src.data(), n, colors.data());
+            if (opaqueSource)
+                for (quint32 &c : colors)
+                    c |= 0xFF000000u;
+            blendInto(dst, row, xs.first, n, colors.data(), constantAlpha, nearest);
         }
-        gatherColors(source, from, xs.src.data(), n, colors.data());
-        if (opaqueSource)
-            for (quint32 &c : colors)
-                c |= 0xFF000000u;
-        blendInto(dst, row, xs.first, n, colors.data(), constantAlpha, nearest);
-    }
+    });
     return true;
 }
 

@@ -392,3 +392,38 @@ TEST(StretchBlt, matchesTheSamplingRulesAtManyScales)
         }
     }
 }
+
+TEST(StretchBlt, largeBlitsSplitIntoBandsGiveTheSamePixels)
+{
+    // Big enough to be shared among threads; every row is checked against the sampling
+    // rule, so a band that started or ended on the wrong row would show.
+    constexpr int sw = 300, sh = 200, tw = 900, th = 600;
+    TestBitmap src(sw, sh, 32);
+    for (int y = 0; y < sh; ++y)
+        for (int x = 0; x < sw; ++x)
+            src.setArgb(x, y, 0xFF000000u | quint32(x & 0xFF) << 16 | quint32(y & 0xFF) << 8 | quint32((x + y) & 0xFF));
+    TestBitmap dst(tw, th, 32);
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, tw, th, src.dc, 0, 0, sw, sh, SRCCOPY));
+    for (int y = 0; y < th; ++y)
+        for (int x = 0; x < tw; x += 37)
+            ASSERT_EQ(dst.argb(x, y), src.argb(x / 3, y / 3)) << x << "," << y;
+
+    TestBitmap blended(tw, th, 32);
+    blended.fill(0xFF000000u, tw, 32);
+    BLENDFUNCTION half;
+    half.SourceConstantAlpha = 128;
+    ASSERT_TRUE(AlphaBlend(blended.dc, 0, 0, tw, th, dst.dc, 0, 0, tw, th, half));
+    for (int y = 0; y < th; ++y)
+        for (int x = 0; x < tw; x += 41) {
+            const quint32 s = dst.argb(x, y), d = blended.argb(x, y);
+            for (int shift : { 0, 8, 16 })
+                ASSERT_NEAR(double(d >> shift & 0xFF), (s >> shift & 0xFF) * 128 / 255.0, 1.0) << x << "," << y;
+        }
+
+    SetStretchBltMode(dst.dc, HALFTONE);
+    TestBitmap flat(sw, sh, 24);
+    flat.fill(0x405060, sw, 24);
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, tw, th, flat.dc, 0, 0, sw, sh, SRCCOPY));
+    for (int y = 0; y < th; ++y)
+        ASSERT_EQ(dst.argb((y * 7) % tw, y), 0xFF405060u) << y;
+}
