@@ -310,21 +310,23 @@ private:
 
 // ---- Writing ---------------------------------------------------------------------------
 
-template <typename T> void combine(T *dst, const T *src, qsizetype n, Rop rop)
+// Copies or combines bytes: AND and OR act on bytes whatever the pixel format.
+void combineBytes(uchar *dst, const uchar *src, size_t n, Rop rop)
 {
-    switch (rop) {
-    case Rop::Copy:
-        std::memmove(dst, src, size_t(n) * sizeof(T));
-        break;
-    case Rop::And:
-        for (qsizetype i = 0; i < n; ++i)
-            dst[i] &= src[i];
-        break;
-    case Rop::Or:
-        for (qsizetype i = 0; i < n; ++i)
-            dst[i] |= src[i];
-        break;
+    if (rop == Rop::Copy) {
+        std::memmove(dst, src, n);
+        return;
     }
+    size_t i = 0;
+    for (; i + 32 <= n; i += 32) {
+        U8x32 a, b;
+        std::memcpy(&a, dst + i, sizeof a);
+        std::memcpy(&b, src + i, sizeof b);
+        a = rop == Rop::And ? (a & b) : (a | b);
+        std::memcpy(dst + i, &a, sizeof a);
+    }
+    for (; i < n; ++i)
+        dst[i] = rop == Rop::And ? (dst[i] & src[i]) : (dst[i] | src[i]);
 }
 
 quint32 combineValue(quint32 dst, quint32 src, Rop rop)
@@ -344,7 +346,7 @@ void storeValues(const Surface &dst, uchar *row, int x0, int n, const quint32 *v
 {
     switch (dst.bpp) {
     case 32:
-        combine(reinterpret_cast<quint32 *>(row) + x0, values, n, rop);
+        combineBytes(row + 4 * qsizetype(x0), reinterpret_cast<const uchar *>(values), size_t(n) * 4, rop);
         break;
     case 24: {
         uchar *p = row + 3 * qsizetype(x0);
@@ -474,10 +476,7 @@ void nearestBlit(const Surface &dst, const Surface &src, const AxisMap &xs, cons
                 const int bytes = dst.bpp / 8;
                 uchar *d = to + qsizetype(xs.first) * bytes;
                 const uchar *s = from + qsizetype(xs.src[0]) * bytes;
-                if (bytes == 4)
-                    combine(reinterpret_cast<quint32 *>(d), reinterpret_cast<const quint32 *>(s), n, rop);
-                else
-                    combine(d, s, qsizetype(n) * bytes, rop);
+                combineBytes(d, s, size_t(n) * size_t(bytes), rop);
                 continue;
             }
             if (span && src.bpp == 8 && translate.isLookup() && rop == Rop::Copy && dst.bpp >= 24) {
@@ -488,13 +487,12 @@ void nearestBlit(const Surface &dst, const Surface &src, const AxisMap &xs, cons
                     for (int i = 0; i < n; ++i)
                         d[i] = lookup[s[i]];
                 } else {
+                    // Four bytes a pixel, the fourth overwritten by the next pixel; the last
+                    // pixel writes its three only.
                     uchar *d = to + 3 * qsizetype(xs.first);
-                    for (int i = 0; i < n; ++i, d += 3) {
-                        const quint32 v = lookup[s[i]];
-                        d[0] = uchar(v);
-                        d[1] = uchar(v >> 8);
-                        d[2] = uchar(v >> 16);
-                    }
+                    for (int i = 0; i + 1 < n; ++i)
+                        std::memcpy(d + 3 * i, &lookup[s[i]], 4);
+                    std::memcpy(d + 3 * (n - 1), &lookup[s[n - 1]], 3);
                 }
                 continue;
             }
@@ -764,13 +762,15 @@ inline quint32 overWithConstant(quint32 s, quint32 d, quint32 constant)
     U32x8 source, target;
     std::memcpy(&source, s, sizeof source);
     std::memcpy(&target, d, sizeof target);
-    const U32x8 inverse = 255 - (source >> 24);
-    const U16x16 factor = (U16x16)(inverse | (inverse << 16));
+    // 255 − alpha of each pixel in both 16-bit lanes of the pixel.
+    const U8x32 inverse = ~(U8x32)source, zero = {};
+    const U16x16 factor = (U16x16)__builtin_shufflevector(inverse, zero, 3, 32, 3, 32, 7, 32, 7, 32, 11, 32, 11, 32, 15,
+        32, 15, 32, 19, 32, 19, 32, 23, 32, 23, 32, 27, 32, 27, 32, 31, 32, 31, 32);
     U16x16 rb = (U16x16)(target & 0x00FF00FFu) * factor + 0x80;
     U16x16 ag = (U16x16)((target >> 8) & 0x00FF00FFu) * factor + 0x80;
     rb = (rb + (rb >> 8)) >> 8;
-    ag = (ag + (ag >> 8)) >> 8;
-    const U8x32 scaled = (U8x32)((U32x8)rb | ((U32x8)ag << 8));
+    ag = (ag + (ag >> 8)) & 0xFF00;
+    const U8x32 scaled = (U8x32)((U32x8)rb | (U32x8)ag);
     const U8x32 sum = (U8x32)source + scaled;
     const U8x32 result = sum | (U8x32)(sum < scaled);
     std::memcpy(d, &result, sizeof result);
