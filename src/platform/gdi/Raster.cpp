@@ -57,7 +57,6 @@ namespace {
 
 // The compiler's vector types: SSE2 or AVX2 on x86-64, NEON on ARM.
 using U8x8 = quint8 __attribute__((vector_size(8)));
-using U8x16 = quint8 __attribute__((vector_size(16)));
 using U8x32 = quint8 __attribute__((vector_size(32)));
 using U16x8 = quint16 __attribute__((vector_size(16)));
 using U16x16 = quint16 __attribute__((vector_size(32)));
@@ -98,10 +97,11 @@ struct AxisMap
     int first = 0;
     std::vector<int> src;
 
-    bool isSpan(int step) const
+    // Whether the source coordinates run on one by one (no scaling, no mirroring).
+    bool isSpan() const
     {
         for (size_t i = 1; i < src.size(); ++i)
-            if (src[i] != src[i - 1] + step)
+            if (src[i] != src[i - 1] + 1)
                 return false;
         return true;
     }
@@ -454,7 +454,7 @@ bool sameFormat(const Surface &dst, const Surface &src, const Translator &transl
 void nearestBlit(const Surface &dst, const Surface &src, const AxisMap &xs, const AxisMap &ys, Rop rop)
 {
     const int n = int(xs.src.size());
-    const bool span = xs.isSpan(1);
+    const bool span = xs.isSpan();
     const int bytesPerPixel = dst.bpp / 8;
     forEachBand(ys.src.size(), qint64(n) * qint64(ys.src.size()), [&](size_t begin, size_t end) {
         Translator translate(dst, src);
@@ -887,7 +887,7 @@ bool alphaBlend(const Surface &dst, Extent to, const Surface &src, Extent from, 
     const AxisMap ys = mapAxis(y, dst.height, source.height);
     const int n = int(xs.src.size());
     const bool opaqueSource = !perPixel || source.bpp != 32;
-    const bool span = xs.isSpan(1);
+    const bool span = xs.isSpan();
     forEachBand(ys.src.size(), qint64(n) * qint64(ys.src.size()), [&](size_t begin, size_t end) {
         std::vector<quint32> colors(static_cast<size_t>(n));
         std::optional<NearestCache> nearest;
