@@ -771,8 +771,8 @@ inline quint32 overWithConstant(quint32 s, quint32 d, quint32 constant)
     rb = (rb + (rb >> 8)) >> 8;
     ag = (ag + (ag >> 8)) & 0xFF00;
     const U8x32 scaled = (U8x32)((U32x8)rb | (U32x8)ag);
-    const U8x32 sum = (U8x32)source + scaled;
-    const U8x32 result = sum | (U8x32)(sum < scaled);
+    // s + min(scaled, 255 − s) is the sum stopped at 255.
+    const U8x32 result = (U8x32)source + (scaled < inverse ? scaled : inverse);
     std::memcpy(d, &result, sizeof result);
 }
 
