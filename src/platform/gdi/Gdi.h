@@ -243,7 +243,8 @@ ZELCTL_EXPORT bool GetObject(HGDIOBJ object, DIBSECTION &section);
 // between bit depths: a table-based source goes through its colour table, a colour into a
 // table-based target takes the nearest entry; combinations act on the target's pixel
 // values. A 32-bit target fed from a source without alpha gets alpha 255. Both rectangles
-// are clipped to their bitmaps. Unknown raster operations fail.
+// are clipped to their bitmaps. Unknown raster operations and coordinates or extents
+// beyond ±2^27 fail.
 ZELCTL_EXPORT bool BitBlt(HDC dst, int x, int y, int width, int height, HDC src, int srcX, int srcY, quint32 rop);
 // As BitBlt, scaling with the stretch mode of dst (HALFTONE averages areas, the others take
 // the nearest pixel). A negative extent counts leftwards or upwards from its origin pixel;

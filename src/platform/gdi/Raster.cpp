@@ -846,8 +846,21 @@ void blendInto(const Surface &dst, uchar *row, int x0, int n, quint32 *colors, q
 
 } // namespace
 
+// Coordinates and extents beyond ±2^27 are refused, as they are on the original platform:
+// no bitmap comes near them, and the sampling arithmetic stays far from overflow.
+bool withinLimits(const Extent &a, const Extent &b)
+{
+    constexpr int Limit = 1 << 27;
+    for (int v : { a.x, a.y, a.width, a.height, b.x, b.y, b.width, b.height })
+        if (v < -Limit || v > Limit)
+            return false;
+    return true;
+}
+
 bool stretchBlit(const Surface &dst, Extent to, const Surface &src, Extent from, Rop rop, Sampling sampling)
 {
+    if (!withinLimits(to, from))
+        return false;
     if (to.width == 0 || to.height == 0)
         return true;
     if (from.width == 0 || from.height == 0)
@@ -870,7 +883,7 @@ bool stretchBlit(const Surface &dst, Extent to, const Surface &src, Extent from,
 
 bool alphaBlend(const Surface &dst, Extent to, const Surface &src, Extent from, quint8 constantAlpha, bool perPixel)
 {
-    if (to.width < 0 || to.height < 0 || from.width < 0 || from.height < 0)
+    if (!withinLimits(to, from) || to.width < 0 || to.height < 0 || from.width < 0 || from.height < 0)
         return false;
     if (from.x < 0 || from.y < 0 || qint64(from.x) + from.width > src.width
         || qint64(from.y) + from.height > src.height)

@@ -4,6 +4,8 @@
 
 #include <algorithm>
 #include <cmath>
+#include <iterator>
+#include <memory>
 
 using namespace zelctl::gdi;
 using zelctl::gdi::test::TestBitmap;
@@ -200,9 +202,10 @@ TEST(BitBlt, clipsAtEveryEdge)
     EXPECT_TRUE(BitBlt(dst.dc, 10, 0, 4, 4, src.dc, 0, 0, SRCCOPY));
     EXPECT_TRUE(BitBlt(dst.dc, 0, 0, 4, 4, src.dc, -10, 0, SRCCOPY));
     EXPECT_TRUE(BitBlt(dst.dc, 0, 0, 0, 4, src.dc, 0, 0, SRCCOPY));
-    EXPECT_TRUE(BitBlt(dst.dc, -2147483647, -2147483647, 2147483647, 2147483647, src.dc, 0, 0, SRCCOPY));
     EXPECT_EQ(rowOf(dst, 0, 4), (Values { 7, 7, 7, 7 }));
     EXPECT_FALSE(StretchBlt(dst.dc, 0, 0, 2, 2, src.dc, 0, 0, 0, 2, SRCCOPY)) << "nothing to sample";
+    EXPECT_FALSE(BitBlt(dst.dc, -2147483647, 0, 2147483647, 4, src.dc, 0, 0, SRCCOPY)) << "absurd coordinates";
+    EXPECT_EQ(rowOf(dst, 0, 4), (Values { 7, 7, 7, 7 }));
 }
 
 TEST(StretchBlt, negativeExtentsMirror)
@@ -426,4 +429,39 @@ TEST(StretchBlt, largeBlitsSplitIntoBandsGiveTheSamePixels)
     ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, tw, th, flat.dc, 0, 0, sw, sh, SRCCOPY));
     for (int y = 0; y < th; ++y)
         ASSERT_EQ(dst.argb((y * 7) % tw, y), 0xFF405060u) << y;
+}
+
+TEST(StretchBlt, survivesArbitraryArguments)
+{
+    // Awkward coordinates and extents on every depth: no call may touch memory outside its
+    // bitmaps (the sanitizers watch) or the padding at the end of each row.
+    const int values[] = { -2147483647 - 1, -134217728, -65536, -7, -1, 0, 1, 3, 9, 65536, 134217728, 2147483647 };
+    std::vector<std::unique_ptr<TestBitmap>> bitmaps;
+    for (int bpp : { 1, 4, 8, 24, 32 })
+        bitmaps.push_back(
+            std::make_unique<TestBitmap>(5, 3, bpp, bpp % 8 == 0, std::initializer_list<quint32> { 0, 0xFFFFFF }));
+    SetStretchBltMode(bitmaps[3]->dc, HALFTONE);
+    const int usedBytes[] = { 1, 3, 5, 15, 20 };
+    for (size_t b = 0; b < bitmaps.size(); ++b)
+        for (int y = 0; y < 3; ++y)
+            std::fill(bitmaps[b]->row(y) + usedBytes[b], bitmaps[b]->row(y) + bitmaps[b]->stride, uchar(0xA5));
+    unsigned seed = 1;
+    auto pick = [&] {
+        seed = seed * 1103515245u + 12345u;
+        return values[(seed >> 16) % std::size(values)];
+    };
+    BLENDFUNCTION over;
+    over.AlphaFormat = AC_SRC_ALPHA;
+    for (int i = 0; i < 4000; ++i) {
+        const TestBitmap &dst = *bitmaps[size_t(i) % bitmaps.size()];
+        const TestBitmap &src = *bitmaps[size_t(i / 5) % bitmaps.size()];
+        const int a = pick(), b = pick(), c = pick(), d = pick(), e = pick(), f = pick(), g = pick(), h = pick();
+        StretchBlt(dst.dc, a % 8, b % 8, c, d, src.dc, e % 8, f % 8, g, h, i % 3 == 0 ? SRCAND : SRCCOPY);
+        StretchBlt(dst.dc, a, b, c % 16, d % 16, src.dc, e, f, g % 16, h % 16, SRCPAINT);
+        AlphaBlend(dst.dc, a % 8, b % 8, c % 16, d % 16, src.dc, e % 4, f % 4, g % 6, h % 4, over);
+    }
+    for (size_t b = 0; b < bitmaps.size(); ++b)
+        for (int y = 0; y < 3; ++y)
+            for (int i = usedBytes[b]; i < bitmaps[b]->stride; ++i)
+                ASSERT_EQ(bitmaps[b]->row(y)[i], 0xA5) << "row padding of the " << b << "th bitmap";
 }
