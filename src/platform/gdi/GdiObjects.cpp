@@ -56,8 +56,9 @@ std::shared_ptr<Bitmap> makeBitmap(const BITMAPINFOHEADER &header, const RGBQUAD
 
 HandleTable &HandleTable::instance()
 {
-    static HandleTable table;
-    return table;
+    // Never destroyed: objects held in other statics may still be deleted during exit.
+    static HandleTable *const table = new HandleTable;
+    return *table;
 }
 
 HandleTable::HandleTable()
