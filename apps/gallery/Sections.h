@@ -9,3 +9,5 @@ QWidget *createNibSection();
 QWidget *createCountrySection();
 // Information, warning and error buttons with their balloon tips.
 QWidget *createTipsSection();
+// A NIF box on the bundled declaration and directory of holders.
+QWidget *createNifSection();
