@@ -51,7 +51,8 @@ QWidget *createNifSection()
     column->addWidget(events);
     column->addWidget(new QLabel(QStringLiteral("Experimente 251739465 (diretório de contribuintes), 263958477 "
                                                 "(guardado na declaração) ou ES12345678Z; a bandeira abre a "
-                                                "lista de países.")));
+                                                "lista de países e o botão direito o menu, com a ficha de "
+                                                "contribuinte.")));
 
     QObject::connect(nif, &cNIF::NameUpdated, holder, [holder](const QString &name) { holder->setText(name); });
     QObject::connect(nif, &cNIF::Cleared, holder, [holder] { holder->setText(QStringLiteral("(sem titular)")); });

@@ -1,9 +1,11 @@
 #include "cNIF.h"
 
+#include "NifPopupMenu.h"
 #include "ShapeWidget.h"
 #include "common/modFuncs.h"
 #include "companion/Declaration.h"
 #include "companion/NIFGrabber.h"
+#include "frmEditNIF.h"
 #include "platform/ModalPresenter.h"
 #include "platform/Settings.h"
 #include "platform/WindowHandles.h"
@@ -13,6 +15,8 @@
 #include "tips/clsBalloonTip.h"
 #include "validation/nifValidator.h"
 
+#include <QAction>
+#include <QContextMenuEvent>
 #include <QLineEdit>
 #include <QMouseEvent>
 #include <QPointer>
@@ -127,6 +131,7 @@ public:
     void fetchFinished();
     void layout();
     void uncount();
+    void openRecordForm();
 
     cNIF *q;
     QLineEdit *nif;
@@ -136,6 +141,7 @@ public:
     QPointer<companion::NIFGrabber> grabber;
     QPointer<companion::Declaration> declaration;
     clsBalloonTip *tip = nullptr;
+    NifPopupMenu *popup = nullptr;
 
     QString country = QString(Portugal);
     QString lastAppliedCountry;
@@ -192,6 +198,13 @@ void cNIF::Private::uncount()
         counted = false;
         mod_CTL::nifControlTerminated();
     }
+}
+
+void cNIF::Private::openRecordForm()
+{
+    frmEditNIF form(q->window());
+    form.SetNIFControl(q);
+    platform::showModal(form);
 }
 
 void cNIF::Private::layout()
@@ -329,6 +342,8 @@ cNIF::cNIF(QWidget *parent)
     palette.setColor(QPalette::Window, platform::toQColor(d->backColor));
     setPalette(palette);
     resize(DefaultSize);
+    d->popup = new NifPopupMenu(*this, *d->nif);
+    connect(d->popup->entry("mnu_ficha"), &QAction::triggered, this, [this] { d->openRecordForm(); });
     d->cPicture->installEventFilter(this);
     d->nif->installEventFilter(this);
     setCountryID(QString(Portugal));
@@ -353,12 +368,38 @@ void cNIF::resizeEvent(QResizeEvent *event)
 
 bool cNIF::eventFilter(QObject *watched, QEvent *event)
 {
-    if (watched == d->cPicture && event->type() == QEvent::MouseButtonRelease) {
+    if (watched != d->cPicture && watched != d->nif)
+        return UserControl::eventFilter(watched, event);
+    switch (event->type()) {
+    case QEvent::MouseButtonPress:
+        if (static_cast<QMouseEvent *>(event)->button() == Qt::RightButton) {
+            PopupContextMenu();
+            return true;
+        }
+        break;
+    case QEvent::MouseButtonRelease: {
         const auto *mouse = static_cast<QMouseEvent *>(event);
-        if (mouse->button() == Qt::LeftButton && d->cPicture->rect().contains(mouse->position().toPoint()))
+        if (watched == d->cPicture && mouse->button() == Qt::LeftButton
+            && d->cPicture->rect().contains(mouse->position().toPoint()))
             ShowCountryList();
-    } else if (watched == d->nif && event->type() == QEvent::FocusIn) {
-        d->refreshTip();
+        break;
+    }
+    case QEvent::ContextMenu:
+        // The control's own menu replaces the box's: the right button opens it when pressed,
+        // the menu key here.
+        if (static_cast<QContextMenuEvent *>(event)->reason() == QContextMenuEvent::Keyboard)
+            PopupContextMenu();
+        return true;
+    case QEvent::FocusIn:
+        if (watched == d->nif)
+            d->refreshTip();
+        break;
+    case QEvent::KeyPress:
+        if (watched == d->nif && d->popup->handleShortcut(*static_cast<QKeyEvent *>(event)))
+            return true;
+        break;
+    default:
+        break;
     }
     return UserControl::eventFilter(watched, event);
 }
@@ -501,10 +542,12 @@ void cNIF::RefreshMe()
         d->name.clear();
         d->setStateColours(Black, White);
     } else if (IsValid() && IsAccepted()) {
+        d->popup->entry("mnu_ficha")->setEnabled(true);
         Q_EMIT NIFIndicated();
         GetNIFInformation();
         d->setStateColours(ValidText, White);
     } else {
+        d->popup->entry("mnu_ficha")->setEnabled(false);
         d->name.clear();
         d->Shape1->setBorderColor(InvalidBack);
         d->setStateColours(White, InvalidBack);
@@ -697,6 +740,11 @@ void cNIF::setLocked(bool locked)
     } else {
         RefreshMe();
     }
+}
+
+void cNIF::PopupContextMenu()
+{
+    d->popup->popup();
 }
 
 void cNIF::InitProperties()

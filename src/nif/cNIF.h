@@ -124,6 +124,9 @@ public:
     bool Locked() const;
     void setLocked(bool locked);
 
+    // Shows the context menu at the pointer, unless DisablePopupMenu is set.
+    Q_INVOKABLE void PopupContextMenu();
+
 Q_SIGNALS:
     // The number changed (not raised for the change that drops a typed country code).
     void Changed();
