@@ -21,6 +21,24 @@ namespace {
 
 enum Button { Apply = 0, Ok = 1, Cancel = 2, PublicInformation = 3 };
 
+// The input of a record id (the templates, element 0, carry none).
+template <typename T = QWidget> T *inputOf(const QWidget &form, const QString &id)
+{
+    for (QWidget *widget : form.findChildren<QWidget *>()) {
+        if (widget->property("Tag").toString() == id && widget->property("Index").toInt() > 0)
+            return qobject_cast<T *>(widget);
+    }
+    return nullptr;
+}
+
+void press(const QWidget &form, int index)
+{
+    for (auto *button : form.findChildren<CommandButton *>()) {
+        if (button->Index() == index)
+            QTest::mouseClick(button, Qt::LeftButton);
+    }
+}
+
 class RecordForm : public ::testing::Test
 {
 protected:
@@ -44,15 +62,7 @@ protected:
         log = std::make_unique<EventLog>(*control);
     }
 
-    // The input of a record id (the templates, element 0, carry none).
-    template <typename T = QWidget> T *row(const QString &id) const
-    {
-        for (QWidget *widget : editor->findChildren<QWidget *>()) {
-            if (widget->property("Tag").toString() == id && widget->property("Index").toInt() > 0)
-                return qobject_cast<T *>(widget);
-        }
-        return nullptr;
-    }
+    template <typename T = QWidget> T *row(const QString &id) const { return inputOf<T>(*editor, id); }
 
     QStringList rowIds() const
     {
@@ -77,13 +87,7 @@ protected:
         return {};
     }
 
-    void press(int index)
-    {
-        for (auto *button : editor->findChildren<CommandButton *>()) {
-            if (button->Index() == index)
-                QTest::mouseClick(button, Qt::LeftButton);
-        }
-    }
+    void press(int index) { ::press(*editor, index); }
 
     void retype(QLineEdit *box, const QString &text)
     {
@@ -121,6 +125,9 @@ TEST_F(RecordForm, loadsTheRecordIntoItsRows)
     EXPECT_EQ(label(9), "Status:");
 
     EXPECT_EQ(row<QLineEdit>("servico")->text(), "3131");
+    retype(row<QLineEdit>("servico"), "123456");
+    EXPECT_EQ(row<QLineEdit>("servico")->text(), "1234") << "a tax office code has 4 characters";
+    EXPECT_EQ(row<QLineEdit>("servico")->width(), 2000 / 15);
     EXPECT_EQ(row<QComboBox>("estadocivil")->currentText(), "Casado");
     EXPECT_EQ(row<QComboBox>("estadocivil")->count(), 6);
     EXPECT_EQ(row<cNIF>("conjuge")->Value(), "PT198765436");
@@ -128,14 +135,6 @@ TEST_F(RecordForm, loadsTheRecordIntoItsRows)
     EXPECT_EQ(row<QLineEdit>("nib")->text(), "");
     EXPECT_TRUE(row<QLineEdit>("status")->isReadOnly());
     EXPECT_FALSE(row<QLineEdit>("email")->isReadOnly());
-}
-
-TEST_F(RecordForm, taxOfficeCodeTakesFourCharacters)
-{
-    auto *office = row<QLineEdit>("servico");
-    retype(office, "123456");
-    EXPECT_EQ(office->text(), "1234");
-    EXPECT_EQ(office->width(), 2000 / 15);
 }
 
 TEST_F(RecordForm, maritalStatusRulesTheSpouseRow)
@@ -211,10 +210,7 @@ TEST_F(RecordForm, applyWritesThroughTheControlAndStaysOpen)
     EXPECT_TRUE(updates.contains("UpdatedInformation:telefone"));
     EXPECT_FALSE(updates.contains("UpdatedInformation:conjuge")) << "emptying raises no update";
     EXPECT_FALSE(updates.contains("UpdatedInformation:email")) << "unchanged values raise nothing";
-}
 
-TEST_F(RecordForm, okAppliesAndCloses)
-{
     QSignalSpy accepted(editor.get(), &QDialog::accepted);
     retype(row<QLineEdit>("email"), "joana@example.invalid");
     press(Ok);
@@ -245,27 +241,12 @@ TEST(RecordFormFetch, showsFetchedValuesWhenTheFetchEnds)
 
     frmEditNIF editor;
     editor.SetNIFControl(control);
-    for (QComboBox *list : editor.findChildren<QComboBox *>()) {
-        if (list->property("Index").toInt() > 0) {
-            EXPECT_EQ(list->currentIndex(), -1) << "nothing known, nothing chosen";
-        }
-    }
-    for (CommandButton *button : editor.findChildren<CommandButton *>()) {
-        if (button->Index() == PublicInformation)
-            button->click();
-    }
+    EXPECT_EQ(inputOf<QComboBox>(editor, "estadocivil")->currentIndex(), -1) << "nothing known, nothing chosen";
+    press(editor, PublicInformation);
     ASSERT_EQ(grabber->fetched.size(), 2);
     grabber->answer("PT" + AnaNif,
         { { "NAME", "ANA LOPES" }, { "ESTADOCIVIL", "Divorciado" }, { "DATANASCIMENTO", "1981-04-17" } });
     EXPECT_EQ(editor.findChild<QLineEdit *>("xNome")->text(), "ANA LOPES");
-    for (QWidget *widget : editor.findChildren<QWidget *>()) {
-        const QString id = widget->property("Tag").toString();
-        if (widget->property("Index").toInt() == 0)
-            continue;
-        if (id == "estadocivil") {
-            EXPECT_EQ(qobject_cast<QComboBox *>(widget)->currentText(), "Divorciado") << "a state given by name";
-        } else if (id == "datanascimento") {
-            EXPECT_EQ(qobject_cast<QLineEdit *>(widget)->text(), "1981-04-17");
-        }
-    }
+    EXPECT_EQ(inputOf<QComboBox>(editor, "estadocivil")->currentText(), "Divorciado") << "a state given by name";
+    EXPECT_EQ(inputOf<QLineEdit>(editor, "datanascimento")->text(), "1981-04-17");
 }
