@@ -49,10 +49,12 @@ QWidget *createNifSection()
     auto *events = new QLabel;
     events->setWordWrap(true);
     column->addWidget(events);
-    column->addWidget(new QLabel(QStringLiteral("Experimente 251739465 (diretório de contribuintes), 263958477 "
-                                                "(guardado na declaração) ou ES12345678Z; a bandeira abre a "
-                                                "lista de países e o botão direito o menu, com a ficha de "
-                                                "contribuinte.")));
+    auto *hint = new QLabel(QStringLiteral("Experimente 251739465 (diretório de contribuintes), 263958477 "
+                                           "(guardado na declaração) ou ES12345678Z; a bandeira abre a "
+                                           "lista de países e o botão direito o menu, com a ficha de "
+                                           "contribuinte."));
+    hint->setWordWrap(true);
+    column->addWidget(hint);
 
     QObject::connect(nif, &cNIF::NameUpdated, holder, [holder](const QString &name) { holder->setText(name); });
     QObject::connect(nif, &cNIF::Cleared, holder, [holder] { holder->setText(QStringLiteral("(sem titular)")); });
