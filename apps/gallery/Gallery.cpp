@@ -50,6 +50,7 @@ Gallery::Gallery(QWidget *parent)
     addSection(QStringLiteral("Escolha do país"), createCountrySection());
     addSection(QStringLiteral("Dicas e botões de informação"), createTipsSection());
     addSection(QStringLiteral("Sujeito da declaração"), createSubjectSection());
+    addSection(QStringLiteral("NIF"), createNifSection());
     // Last: which classes this build serves.
     addSection(QStringLiteral("Classes da biblioteca"), classList());
 }

@@ -11,3 +11,5 @@ QWidget *createCountrySection();
 QWidget *createTipsSection();
 // A subject selector offering every kind, bound to the bundled declaration.
 QWidget *createSubjectSection();
+// A NIF box on the bundled declaration and directory of holders.
+QWidget *createNifSection();

@@ -1,0 +1,267 @@
+#include "NifTestSupport.h"
+
+#include "nif/PopupMenuPresenter.h"
+#include "nif/frmEditNIF.h"
+#include "support/TestSupport.h"
+
+#include <QAction>
+#include <QApplication>
+#include <QClipboard>
+#include <QContextMenuEvent>
+#include <QMenu>
+#include <QTest>
+#include <QTimer>
+
+#include <gtest/gtest.h>
+
+using namespace zelctl;
+using namespace zelctl::test;
+
+namespace {
+
+// Stands in for the user at the context menu: records what it offered and chooses the
+// entry named `choice` (when it is enabled).
+class MenuChooser
+{
+public:
+    explicit MenuChooser(QString choice = {})
+        : m_previous(setPopupMenuPresenter([this, choice](QMenu &menu, const QPoint &) {
+            ++shown;
+            entries.clear();
+            for (const QAction *action : menu.actions()) {
+                entries << QStringList { action->objectName(), action->text(), action->shortcut().toString(),
+                    action->isEnabled() ? "on" : "off" }
+                               .join('|');
+            }
+            defaultEntry = menu.defaultAction() ? menu.defaultAction()->objectName() : QString();
+            QAction *action = choice.isEmpty() ? nullptr : menu.findChild<QAction *>(choice);
+            if (action && action->isEnabled())
+                action->trigger();
+        }))
+    { }
+    ~MenuChooser() { setPopupMenuPresenter(std::move(m_previous)); }
+
+    bool offered(const QString &name) const
+    {
+        return entries.filter(QRegularExpression("^" + name + "\\|.*\\|on$")).size() == 1;
+    }
+
+    int shown = 0;
+    QStringList entries;
+    QString defaultEntry;
+
+private:
+    PopupMenuPresenter m_previous;
+};
+
+class NifMenu : public ::testing::Test
+{
+protected:
+    void SetUp() override
+    {
+        control = new cNIF(&form);
+        control->InitNew();
+        form.show();
+        QApplication::setActiveWindow(&form);
+        ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
+        box = entryBox(*control);
+        box->setFocus();
+    }
+
+    void choose(const QString &entry)
+    {
+        MenuChooser chooser(entry);
+        control->PopupContextMenu();
+        ASSERT_EQ(chooser.shown, 1);
+    }
+
+    void paste(const QString &clipboardText)
+    {
+        QGuiApplication::clipboard()->setText(clipboardText);
+        choose("mnu_paste");
+    }
+
+    static QString clipboard() { return QGuiApplication::clipboard()->text(); }
+
+    ScriptedGrabberFactory grabbers;
+    QWidget form;
+    cNIF *control = nullptr;
+    QLineEdit *box = nullptr;
+};
+
+} // namespace
+
+TEST_F(NifMenu, offersItsEntriesOnTheBoxAndTheFlag)
+{
+    MenuChooser chooser;
+    QTest::mouseClick(box, Qt::RightButton);
+    ASSERT_EQ(chooser.shown, 1);
+    EXPECT_EQ(chooser.entries,
+        QStringList({ "mnu_undo|&Desfazer|Ctrl+Z|off", "mnu_blank00|||on", "mnu_cut|&Cortar|Ctrl+X|on",
+            "mnu_Copy|&Copiar|Ctrl+C|on", "mnu_paste|&Colar|Ctrl+V|on", "mnu_Delete|&Apagar||on", "mnu_blank01|||on",
+            "mnu_selectall|&Escolher tudo|Ctrl+A|on", "mnu_blank02|||on",
+            "mnu_RefreshNIFInfo|&Reobter informações...||on", "mnu_search|&Pesquisar...||off",
+            "mnu_listnif|&Escolher da lista...||off", "mnu_ficha|&Ficha de contribuinte||off" }));
+    EXPECT_EQ(chooser.defaultEntry, "mnu_paste");
+
+    QTest::keyClicks(box, PlainNif);
+    QTest::mouseClick(control->findChild<QWidget *>("cPicture"), Qt::RightButton);
+    EXPECT_EQ(chooser.shown, 2);
+    EXPECT_TRUE(chooser.offered("mnu_ficha")) << "a valid number has a record";
+    EXPECT_TRUE(chooser.offered("mnu_undo"));
+
+    QTest::keyClick(box, Qt::Key_Backspace);
+    control->PopupContextMenu();
+    EXPECT_FALSE(chooser.offered("mnu_ficha"));
+}
+
+TEST_F(NifMenu, disabledMenuShowsNoMenuAtAll)
+{
+    control->setDisablePopupMenu(true);
+    MenuChooser chooser;
+    bool sawAMenu = false;
+    QObject watch;
+    // Any menu at all (the box's own included) would be the active pop-up when this runs.
+    QTimer::singleShot(0, &watch, [&] {
+        if (QWidget *popup = QApplication::activePopupWidget()) {
+            sawAMenu = true;
+            popup->close();
+        }
+    });
+    QTest::mouseClick(box, Qt::RightButton);
+    QTest::mouseClick(control->findChild<QWidget *>("cPicture"), Qt::RightButton);
+    QContextMenuEvent byMouse(QContextMenuEvent::Mouse, QPoint(5, 5), box->mapToGlobal(QPoint(5, 5)));
+    QApplication::sendEvent(box, &byMouse);
+    QContextMenuEvent byKey(QContextMenuEvent::Keyboard, QPoint(5, 5), box->mapToGlobal(QPoint(5, 5)));
+    QApplication::sendEvent(box, &byKey);
+    QMetaObject::invokeMethod(control, "PopupContextMenu");
+    QCoreApplication::processEvents();
+    EXPECT_EQ(chooser.shown, 0);
+    EXPECT_FALSE(sawAMenu);
+
+    control->setDisablePopupMenu(false);
+    QApplication::sendEvent(box, &byKey);
+    EXPECT_EQ(chooser.shown, 1) << "the menu key opens the control's menu";
+}
+
+TEST_F(NifMenu, copyAndCutTakeTheWholeNumber)
+{
+    QTest::keyClicks(box, PlainNif);
+    box->setSelection(2, 3);
+    choose("mnu_Copy");
+    EXPECT_EQ(clipboard(), PlainNif) << "no country code, selection ignored";
+    EXPECT_EQ(box->text(), PlainNif);
+
+    QGuiApplication::clipboard()->clear();
+    box->setSelection(2, 3);
+    choose("mnu_cut");
+    EXPECT_EQ(clipboard(), PlainNif);
+    EXPECT_EQ(box->text(), "126789") << "only the selection goes";
+
+    box->deselect();
+    choose("mnu_cut");
+    EXPECT_EQ(clipboard(), "126789");
+    EXPECT_EQ(box->text(), "");
+}
+
+TEST_F(NifMenu, pasteReadsTheCountryCode)
+{
+    struct Case
+    {
+        const char *rule;
+        QString clipboard;
+        QString country;
+        QString text;
+    };
+    const QString longNumber = "US" + QString(298, '7');
+    const Case cases[] = {
+        { "a member state's number", "ES12345678Z", "ES", "12345678Z" },
+        { "a bare number is Portuguese", PlainNif, "PT", PlainNif },
+        { "any code before digits", "us123456", "US", "123456" },
+        { "the first 100 characters", longNumber, "US", QString(98, '7') },
+        { "an empty clipboard", "", "PT", "" },
+        { "text without a code", "abc", "PT", "abc" },
+    };
+    for (const Case &c : cases) {
+        control->setCountryID("FR");
+        box->setText("0000");
+        paste(c.clipboard);
+        EXPECT_EQ(control->CountryID(), c.country) << c.rule;
+        EXPECT_EQ(box->text(), c.text) << c.rule;
+    }
+    paste("US123456");
+    EXPECT_TRUE(control->IsValid()) << "numbers of a country without a check are valid";
+}
+
+TEST_F(NifMenu, deleteSelectAllAndUndo)
+{
+    QTest::keyClicks(box, "12345");
+    choose("mnu_selectall");
+    EXPECT_EQ(box->selectedText(), "12345");
+
+    choose("mnu_Delete");
+    EXPECT_EQ(box->text(), "");
+    choose("mnu_undo");
+    EXPECT_EQ(box->text(), "12345") << "undo takes the last edit back";
+
+    paste("ES12345678Z");
+    EXPECT_EQ(box->text(), "12345678Z");
+    choose("mnu_undo");
+    EXPECT_EQ(box->text(), "12345");
+}
+
+TEST_F(NifMenu, shortcutsRunTheMenuCommands)
+{
+    QGuiApplication::clipboard()->setText("ES12345678Z");
+    QTest::keyClick(box, Qt::Key_V, Qt::ControlModifier);
+    EXPECT_EQ(control->CountryID(), "ES");
+    EXPECT_EQ(box->text(), "12345678Z");
+
+    box->setSelection(0, 2);
+    QTest::keyClick(box, Qt::Key_C, Qt::ControlModifier);
+    EXPECT_EQ(clipboard(), "12345678Z");
+    QTest::keyClick(box, Qt::Key_A, Qt::ControlModifier);
+    QTest::keyClick(box, Qt::Key_X, Qt::ControlModifier);
+    EXPECT_EQ(box->text(), "");
+    QTest::keyClick(box, Qt::Key_Z, Qt::ControlModifier);
+    EXPECT_EQ(box->text(), "12345678Z");
+}
+
+TEST_F(NifMenu, lockedBoxKeepsItsText)
+{
+    control->setValue("PT" + PlainNif);
+    control->setLocked(true);
+    MenuChooser chooser;
+    control->PopupContextMenu();
+    for (const char *entry : { "mnu_undo", "mnu_cut", "mnu_paste", "mnu_Delete" })
+        EXPECT_FALSE(chooser.offered(entry)) << entry;
+    EXPECT_TRUE(chooser.offered("mnu_Copy"));
+
+    QGuiApplication::clipboard()->setText("ES12345678Z");
+    QTest::keyClick(box, Qt::Key_V, Qt::ControlModifier);
+    QTest::keyClick(box, Qt::Key_X, Qt::ControlModifier);
+    EXPECT_EQ(control->Value(), "PT" + PlainNif);
+    EXPECT_EQ(clipboard(), "ES12345678Z");
+}
+
+TEST_F(NifMenu, refreshEntryFetchesAgain)
+{
+    control->setValue("PT" + AnaNif);
+    ScriptedGrabber *grabber = grabbers.last;
+    grabber->answer("PT" + AnaNif, {});
+    choose("mnu_RefreshNIFInfo");
+    EXPECT_EQ(grabber->fetched, QStringList({ "PT" + AnaNif, "PT" + AnaNif }));
+}
+
+TEST_F(NifMenu, recordEntryOpensTheRecordForm)
+{
+    control->setValue("PT" + PlainNif);
+    ModalDriver driver([](QDialog &dialog) {
+        EXPECT_NE(qobject_cast<frmEditNIF *>(&dialog), nullptr);
+        EXPECT_EQ(dialog.windowTitle(), "Editar informação de contribuinte");
+        EXPECT_EQ(dialog.findChild<cNIF *>("cNIF1")->Value(), "PT" + PlainNif);
+        return int(QDialog::Rejected);
+    });
+    choose("mnu_ficha");
+    EXPECT_EQ(driver.shownCount(), 1);
+}

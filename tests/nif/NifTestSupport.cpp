@@ -1,0 +1,77 @@
+#include "NifTestSupport.h"
+
+#include "tips/clsBalloonTip.h"
+
+#include <QPalette>
+
+namespace zelctl::test {
+
+void ScriptedGrabber::answer(const QString &number, const QHash<QString, QString> &data)
+{
+    Q_EMIT Starting();
+    if (!data.isEmpty()) {
+        fields = data;
+        fields.insert(QStringLiteral("ID"), number);
+        Q_EMIT ReceivedInformation(number);
+    }
+    busy = false;
+    Q_EMIT Finished();
+}
+
+ScriptedGrabberFactory::ScriptedGrabberFactory()
+    : m_previous(companion::setNIFGrabberFactory([this](QObject *parent) {
+        last = new ScriptedGrabber(parent);
+        return last;
+    }))
+{ }
+
+ScriptedGrabberFactory::~ScriptedGrabberFactory()
+{
+    companion::setNIFGrabberFactory(std::move(m_previous));
+}
+
+EventLog::EventLog(cNIF &control)
+{
+    const auto plain = [this](const char *name) { return [this, name] { events << QString::fromLatin1(name); }; };
+    QObject::connect(&control, &cNIF::Changed, plain("Changed"));
+    QObject::connect(&control, &cNIF::Validated, plain("Validated"));
+    QObject::connect(&control, &cNIF::NIFIndicated, plain("NIFIndicated"));
+    QObject::connect(&control, &cNIF::Cleared, plain("Cleared"));
+    QObject::connect(&control, &cNIF::DataFinished, plain("DataFinished"));
+    QObject::connect(
+        &control, &cNIF::UpdatedInformation, [this](const QString &id) { events << "UpdatedInformation:" + id; });
+    QObject::connect(&control, &cNIF::NameUpdated, [this](const QString &name) { events << "NameUpdated:" + name; });
+}
+
+platform::OleColor textColour(cNIF &control)
+{
+    return platform::fromQColor(entryBox(control)->palette().color(QPalette::Text));
+}
+
+platform::OleColor backColour(cNIF &control)
+{
+    return platform::fromQColor(entryBox(control)->palette().color(QPalette::Base));
+}
+
+platform::OleColor statusColour(cNIF &control)
+{
+    return control.findChild<QWidget *>(QStringLiteral("Shape1"))->property("BorderColor").toUInt();
+}
+
+QString tipText(cNIF &control)
+{
+    const auto *tip = control.findChild<clsBalloonTip *>(QStringLiteral("tip"));
+    return tip ? tip->TipText() : QStringLiteral("<no tip>");
+}
+
+void storeInfo(companion::Declaration &declaration, const QString &key, const QString &value)
+{
+    declaration.DeclarationData().NifInfoStore().Write(key, value);
+}
+
+QString storedInfo(companion::Declaration &declaration, const QString &key)
+{
+    return declaration.DeclarationData().NifInfoStore().Read(key).toString();
+}
+
+} // namespace zelctl::test

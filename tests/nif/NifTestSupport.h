@@ -1,0 +1,82 @@
+#pragma once
+
+#include "companion/JsonDeclaration.h"
+#include "companion/NIFGrabber.h"
+#include "nif/cNIF.h"
+#include "platform/OleColor.h"
+
+#include <QHash>
+#include <QLineEdit>
+#include <QStringList>
+
+namespace zelctl::test {
+
+// A fetcher the test answers by hand: Fetch only records the number; answer() raises the
+// three events as a real fetch would, later. Field keys are compared exactly.
+class ScriptedGrabber : public companion::NIFGrabber
+{
+    Q_OBJECT
+
+public:
+    using NIFGrabber::NIFGrabber;
+
+    bool IsBusy() const override { return busy; }
+    QString HolderName() const override { return fields.value(QStringLiteral("NAME")); }
+    QString GetField(const QString &key) const override { return fields.value(key); }
+    void SetField(const QString &key, const QString &value) override { fields.insert(key, value); }
+    void Fetch(const QString &taxNumber, const QVariant &) override
+    {
+        fetched << taxNumber;
+        busy = true;
+    }
+
+    // Starting, then (unless data is empty) ReceivedInformation for number, then Finished.
+    void answer(const QString &number, const QHash<QString, QString> &data);
+
+    QStringList fetched;
+    bool busy = false;
+    QHash<QString, QString> fields;
+};
+
+// Installs a factory of ScriptedGrabber for the controls made while it lives.
+class ScriptedGrabberFactory
+{
+public:
+    ScriptedGrabberFactory();
+    ~ScriptedGrabberFactory();
+    ScriptedGrabber *last = nullptr;
+
+private:
+    companion::NIFGrabberFactory m_previous;
+};
+
+// Every event of a control, as "Name" or "Name:argument", in the order raised.
+class EventLog
+{
+public:
+    explicit EventLog(cNIF &control);
+    QStringList events;
+    int count(const QString &event) const { return int(events.count(event)); }
+    void clear() { events.clear(); }
+};
+
+inline QLineEdit *entryBox(cNIF &control)
+{
+    return control.findChild<QLineEdit *>(QStringLiteral("nif"));
+}
+
+platform::OleColor textColour(cNIF &control);
+platform::OleColor backColour(cNIF &control);
+platform::OleColor statusColour(cNIF &control);
+QString tipText(cNIF &control);
+
+// Writes a value into a declaration's NIF information store.
+void storeInfo(companion::Declaration &declaration, const QString &key, const QString &value);
+QString storedInfo(companion::Declaration &declaration, const QString &key);
+
+// Valid Portuguese numbers.
+inline const QString AnaNif = QStringLiteral("210345675");
+inline const QString PlainNif = QStringLiteral("123456789");
+inline const QString OtherNif = QStringLiteral("251739465");
+
+} // namespace zelctl::test

@@ -1,0 +1,252 @@
+#include "NifTestSupport.h"
+
+#include "companion/CommandButton.h"
+#include "nif/frmEditNIF.h"
+#include "support/TestSupport.h"
+
+#include <QApplication>
+#include <QComboBox>
+#include <QLabel>
+#include <QSignalSpy>
+#include <QTest>
+
+#include <gtest/gtest.h>
+
+#include <map>
+
+using namespace zelctl;
+using namespace zelctl::test;
+
+namespace {
+
+enum Button { Apply = 0, Ok = 1, Cancel = 2, PublicInformation = 3 };
+
+// The input of a record id (the templates, element 0, carry none).
+template <typename T = QWidget> T *inputOf(const QWidget &form, const QString &id)
+{
+    for (QWidget *widget : form.findChildren<QWidget *>()) {
+        if (widget->property("Tag").toString() == id && widget->property("Index").toInt() > 0)
+            return qobject_cast<T *>(widget);
+    }
+    return nullptr;
+}
+
+void press(const QWidget &form, int index)
+{
+    for (auto *button : form.findChildren<CommandButton *>()) {
+        if (button->Index() == index)
+            QTest::mouseClick(button, Qt::LeftButton);
+    }
+}
+
+class RecordForm : public ::testing::Test
+{
+protected:
+    void SetUp() override
+    {
+        const QString key = "PT" + PlainNif + ".";
+        for (const auto &[id, value] : std::map<QString, QString> { { "nome", "MARIA" }, { "servico", "3131" },
+                 { "estadocivil", "1" }, { "conjuge", "PT198765436" }, { "email", "maria@example.invalid" },
+                 { "datanascimento", "1980-05-07" }, { "status", "Activo" } })
+            storeInfo(declaration, key + id, value);
+        control = new cNIF(&host);
+        control->InitNew();
+        control->setIRSClass(&declaration);
+        control->setValue("PT" + PlainNif);
+        host.show();
+        editor = std::make_unique<frmEditNIF>(&host);
+        editor->SetNIFControl(control);
+        editor->show();
+        QApplication::setActiveWindow(editor.get());
+        ASSERT_TRUE(QTest::qWaitForWindowActive(editor.get()));
+        log = std::make_unique<EventLog>(*control);
+    }
+
+    template <typename T = QWidget> T *row(const QString &id) const { return inputOf<T>(*editor, id); }
+
+    QStringList rowIds() const
+    {
+        std::map<int, QString> ids;
+        for (QWidget *widget : editor->findChild<QWidget *>("pFrame")->findChildren<QWidget *>()) {
+            const int index = widget->property("Index").toInt();
+            if (index > 0 && widget->objectName() != "tDesc")
+                ids[index] = widget->property("Tag").toString();
+        }
+        QStringList ordered;
+        for (const auto &[index, id] : ids)
+            ordered << id;
+        return ordered;
+    }
+
+    QString label(int index) const
+    {
+        for (auto *label : editor->findChildren<QLabel *>("tDesc")) {
+            if (label->property("Index").toInt() == index)
+                return label->text();
+        }
+        return {};
+    }
+
+    void press(int index) { ::press(*editor, index); }
+
+    void retype(QLineEdit *box, const QString &text)
+    {
+        box->setFocus();
+        box->selectAll();
+        QTest::keyClicks(box, text);
+    }
+
+    QString stored(const QString &id) { return storedInfo(declaration, "PT" + PlainNif + "." + id); }
+
+    ScriptedGrabberFactory grabbers;
+    companion::JsonDeclaration declaration;
+    QWidget host;
+    cNIF *control = nullptr;
+    std::unique_ptr<frmEditNIF> editor;
+    std::unique_ptr<EventLog> log;
+};
+
+} // namespace
+
+TEST_F(RecordForm, loadsTheRecordIntoItsRows)
+{
+    EXPECT_EQ(editor->windowTitle(), "Editar informação de contribuinte");
+    auto *shown = editor->findChild<cNIF *>("cNIF1");
+    EXPECT_EQ(shown->Value(), "PT" + PlainNif);
+    EXPECT_TRUE(shown->Locked());
+    EXPECT_TRUE(shown->DisablePopupMenu());
+    EXPECT_EQ(editor->findChild<QLineEdit *>("xNome")->text(), "MARIA");
+
+    EXPECT_EQ(rowIds(),
+        QStringList({ "servico", "estadocivil", "conjuge", "nib", "email", "datanascimento", "territorio", "telefone",
+            "status" }));
+    EXPECT_EQ(label(1), "Código SF:");
+    EXPECT_EQ(label(7), "territorio");
+    EXPECT_EQ(label(9), "Status:");
+
+    EXPECT_EQ(row<QLineEdit>("servico")->text(), "3131");
+    retype(row<QLineEdit>("servico"), "123456");
+    EXPECT_EQ(row<QLineEdit>("servico")->text(), "1234") << "a tax office code has 4 characters";
+    EXPECT_EQ(row<QLineEdit>("servico")->width(), 2000 / 15);
+    EXPECT_EQ(row<QComboBox>("estadocivil")->currentText(), "Casado");
+    EXPECT_EQ(row<QComboBox>("estadocivil")->count(), 6);
+    EXPECT_EQ(row<cNIF>("conjuge")->Value(), "PT198765436");
+    EXPECT_TRUE(row<cNIF>("conjuge")->Enabled()) << "a married holder's spouse can be given";
+    EXPECT_EQ(row<QLineEdit>("nib")->text(), "");
+    EXPECT_TRUE(row<QLineEdit>("status")->isReadOnly());
+    EXPECT_FALSE(row<QLineEdit>("email")->isReadOnly());
+}
+
+TEST_F(RecordForm, maritalStatusRulesTheSpouseRow)
+{
+    auto *status = row<QComboBox>("estadocivil");
+    auto *spouse = row<cNIF>("conjuge");
+    status->setCurrentIndex(0);
+    EXPECT_FALSE(spouse->Enabled());
+    status->setCurrentIndex(2);
+    EXPECT_TRUE(spouse->Enabled());
+    status->setCurrentIndex(5);
+    EXPECT_FALSE(spouse->Enabled());
+}
+
+TEST_F(RecordForm, birthDateIsNormalisedWhenLeft)
+{
+    auto *birth = row<QLineEdit>("datanascimento");
+    auto *phone = row<QLineEdit>("telefone");
+    retype(birth, "1980-5-7");
+    phone->setFocus();
+    EXPECT_EQ(birth->text(), "1980-05-07");
+    retype(birth, "7/5/1981");
+    phone->setFocus();
+    EXPECT_EQ(birth->text(), "1981-05-07");
+    retype(birth, "ontem");
+    phone->setFocus();
+    EXPECT_EQ(birth->text(), "");
+}
+
+TEST_F(RecordForm, cancelWritesNothing)
+{
+    QSignalSpy rejected(editor.get(), &QDialog::rejected);
+    retype(editor->findChild<QLineEdit *>("xNome"), "JOANA");
+    retype(row<QLineEdit>("servico"), "9999");
+    row<QComboBox>("estadocivil")->setCurrentIndex(0);
+    press(Cancel);
+
+    EXPECT_EQ(rejected.count(), 1);
+    EXPECT_EQ(stored("nome"), "MARIA");
+    EXPECT_EQ(stored("servico"), "3131");
+    EXPECT_EQ(stored("estadocivil"), "1");
+    EXPECT_EQ(control->Nome(), "MARIA");
+    EXPECT_TRUE(log->events.filter(QRegularExpression("Updated")).isEmpty()) << log->events.join(' ').toStdString();
+    EXPECT_EQ(editor->findChild<cNIF *>("cNIF1")->Nome(), "JOANA") << "the shown number follows the name box";
+}
+
+TEST_F(RecordForm, applyWritesThroughTheControlAndStaysOpen)
+{
+    QSignalSpy finished(editor.get(), &QDialog::finished);
+    retype(editor->findChild<QLineEdit *>("xNome"), "JOANA");
+    retype(row<QLineEdit>("servico"), "1155");
+    row<QComboBox>("estadocivil")->setCurrentIndex(0);
+    row<cNIF>("conjuge")->setValue("");
+    retype(row<QLineEdit>("telefone"), "213456789");
+    log->clear();
+    press(Apply);
+
+    EXPECT_EQ(finished.count(), 0);
+    EXPECT_TRUE(editor->isVisible());
+    EXPECT_EQ(stored("nome"), "JOANA");
+    EXPECT_EQ(stored("servico"), "1155");
+    EXPECT_EQ(stored("estadocivil"), "0");
+    EXPECT_EQ(stored("estadocivil.text"), "Solteiro");
+    EXPECT_EQ(stored("conjuge"), "") << "an empty number is stored empty";
+    EXPECT_EQ(stored("telefone"), "213456789");
+    EXPECT_EQ(stored("status"), "Activo");
+    EXPECT_EQ(control->Nome(), "JOANA");
+
+    const QStringList updates = log->events.filter(QRegularExpression("^(Updated|NameUpdated)"));
+    EXPECT_EQ(updates.mid(0, 2), QStringList({ "UpdatedInformation:nome", "NameUpdated:JOANA" }));
+    EXPECT_TRUE(updates.contains("UpdatedInformation:servico"));
+    EXPECT_TRUE(updates.contains("UpdatedInformation:estadocivil.text"));
+    EXPECT_TRUE(updates.contains("UpdatedInformation:telefone"));
+    EXPECT_FALSE(updates.contains("UpdatedInformation:conjuge")) << "emptying raises no update";
+    EXPECT_FALSE(updates.contains("UpdatedInformation:email")) << "unchanged values raise nothing";
+
+    QSignalSpy accepted(editor.get(), &QDialog::accepted);
+    retype(row<QLineEdit>("email"), "joana@example.invalid");
+    press(Ok);
+    EXPECT_EQ(accepted.count(), 1);
+    EXPECT_EQ(stored("email"), "joana@example.invalid");
+}
+
+TEST_F(RecordForm, publicInformationReloadsTheStoredValues)
+{
+    retype(row<QLineEdit>("email"), "typed@example.invalid");
+    retype(editor->findChild<QLineEdit *>("xNome"), "OUTRO");
+    log->clear();
+    press(PublicInformation);
+    EXPECT_EQ(log->count("DataFinished"), 1) << "the control looked the holder up";
+    EXPECT_EQ(row<QLineEdit>("email")->text(), "maria@example.invalid");
+    EXPECT_EQ(editor->findChild<QLineEdit *>("xNome")->text(), "MARIA");
+    EXPECT_TRUE(editor->isVisible());
+}
+
+TEST(RecordFormFetch, showsFetchedValuesWhenTheFetchEnds)
+{
+    ScriptedGrabberFactory grabbers;
+    QWidget host;
+    auto *control = new cNIF(&host);
+    control->setValue("PT" + AnaNif);
+    ScriptedGrabber *grabber = grabbers.last;
+    grabber->answer("PT" + AnaNif, {});
+
+    frmEditNIF editor;
+    editor.SetNIFControl(control);
+    EXPECT_EQ(inputOf<QComboBox>(editor, "estadocivil")->currentIndex(), -1) << "nothing known, nothing chosen";
+    press(editor, PublicInformation);
+    ASSERT_EQ(grabber->fetched.size(), 2);
+    grabber->answer("PT" + AnaNif,
+        { { "NAME", "ANA LOPES" }, { "ESTADOCIVIL", "Divorciado" }, { "DATANASCIMENTO", "1981-04-17" } });
+    EXPECT_EQ(editor.findChild<QLineEdit *>("xNome")->text(), "ANA LOPES");
+    EXPECT_EQ(inputOf<QComboBox>(editor, "estadocivil")->currentText(), "Divorciado") << "a state given by name";
+    EXPECT_EQ(inputOf<QLineEdit>(editor, "datanascimento")->text(), "1981-04-17");
+}
