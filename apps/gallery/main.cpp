@@ -1,10 +1,13 @@
 // gallery: the demo host of the zelctl controls.
-//   gallery [--form FILE] [--save-form FILE] [--screenshot OUT.png]
+//   gallery [--root DIR] [--form FILE] [--save-form FILE] [--screenshot OUT.png]
 
 #include "Gallery.h"
 
+#include "platform/Settings.h"
+
 #include <QApplication>
 #include <QCommandLineParser>
+#include <QDir>
 #include <QTextStream>
 #include <QTimer>
 
@@ -16,11 +19,17 @@ int main(int argc, char **argv)
     parser.addHelpOption();
     const QCommandLineOption screenshot("screenshot", "Render the window to a PNG file and quit.", "file");
     parser.addOption(screenshot);
+    const QCommandLineOption root("root", "The application's root folder (its data/ holds the bundled data).", "dir");
+    parser.addOption(root);
     const QCommandLineOption form("form", "Load the controls' properties from a form file.", "file");
     parser.addOption(form);
     const QCommandLineOption saveForm("save-form", "Save the controls' properties to a form file and quit.", "file");
     parser.addOption(saveForm);
     parser.process(app);
+
+    // The root folder is the application's setting; an installer, here the demo script, sets it.
+    if (parser.isSet(root))
+        zelctl::platform::SaveSetting("zEL", "Setup", "RootPath", QDir(parser.value(root)).absolutePath() + '/');
 
     Gallery gallery;
     QString error;

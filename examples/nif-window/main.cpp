@@ -1,6 +1,6 @@
-// A window holding one control of the library, created by name through its class factory
-// as a host form would, with its properties set late-bound.
-//   nif-window [--check]   (--check: create, set, read back and quit; exit 0 on success)
+// A window holding a NIF box, created by name through the library's class factory as a
+// host form would, with its properties set and its methods called late-bound.
+//   nif-window [--check]   (--check: create, set, validate and quit; exit 0 on success)
 
 #include "frame/ClassRegistry.h"
 #include "frame/UserControl.h"
@@ -16,19 +16,20 @@ int main(int argc, char **argv)
     window.setWindowTitle("zelctl");
     auto *layout = new QVBoxLayout(&window);
 
-    auto *control = qobject_cast<zelctl::UserControl *>(zelctl::CreateObject("UKAZELCTL.cNIB", &window));
-    if (!control) {
-        QTextStream(stderr) << "nif-window: the library does not serve cNIB\n";
+    auto *nif = qobject_cast<zelctl::UserControl *>(zelctl::CreateObject("UKAZELCTL.cNIF", &window));
+    if (!nif) {
+        QTextStream(stderr) << "nif-window: the library does not serve cNIF\n";
         return 1;
     }
-    control->InitNew();
-    control->setProperty("Text", "003506510000001234580");
-    layout->addWidget(control);
+    nif->InitNew();
+    nif->setProperty("Value", "PT123456789");
+    layout->addWidget(nif);
+    QObject::connect(nif, SIGNAL(Validated()), &window, SLOT(update()));
 
     bool valid = false;
-    QMetaObject::invokeMethod(control, "Valid", Q_RETURN_ARG(bool, valid));
+    QMetaObject::invokeMethod(nif, "IsValid", Q_RETURN_ARG(bool, valid));
     if (app.arguments().contains("--check")) {
-        QTextStream(stdout) << "cNIB valid: " << (valid ? "yes" : "no") << '\n';
+        QTextStream(stdout) << nif->property("Value").toString() << (valid ? " is valid" : " is not valid") << '\n';
         return valid ? 0 : 1;
     }
     window.show();

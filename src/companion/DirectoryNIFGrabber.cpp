@@ -58,9 +58,10 @@ void DirectoryNIFGrabber::Fetch(const QString &taxNumber, const QVariant &option
 void DirectoryNIFGrabber::answer(const QString &taxNumber)
 {
     // The file is read at every fetch, so edits show without restarting the host.
+    // The fields answer for the last fetch only: a number nobody knows leaves none.
     const QJsonObject holder = readDirectory(m_directoryFile).value(taxNumber).toObject();
+    m_fields.clear();
     if (!holder.isEmpty()) {
-        m_fields.clear();
         for (auto it = holder.begin(); it != holder.end(); ++it)
             m_fields.insert(it.key().toUpper(), it.value().toVariant().toString());
         m_fields.insert(QStringLiteral("ID"), taxNumber);

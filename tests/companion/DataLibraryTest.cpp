@@ -54,7 +54,7 @@ TEST(DirectoryNIFGrabber, finishesAlsoWhenNothingIsFound)
     grabber.Fetch("PT999999990");
     QTRY_VERIFY(!grabber.IsBusy());
     EXPECT_EQ(log.events, QStringList({ "Starting", "Finished" }));
-    EXPECT_EQ(grabber.GetField("NOME"), "antes") << "nothing found leaves the fields";
+    EXPECT_EQ(grabber.GetField("NOME"), "") << "the fields answer for the last fetch, which found nothing";
 
     DirectoryNIFGrabber missing("/nonexistent/contribuintes.json");
     EventLog missingLog(missing);
