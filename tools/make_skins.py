@@ -71,8 +71,9 @@ def go_button(name, disc, rim):
 
 def frame_set(top_name, back_name, bottom_name, band, border, body):
     """A frame of three slices: a coloured band with rounded top corners, a body with a
-    border on both sides, and a bottom edge with rounded corners."""
-    width = 40
+    border on both sides, and a bottom edge with rounded corners. The frame stretches
+    them to its width, so they are drawn about as wide as a frame usually is."""
+    width = 200
     palette = [band, border, body]
     top = Canvas(width, 24, palette)
     for y in range(24):
@@ -83,15 +84,15 @@ def frame_set(top_name, back_name, bottom_name, band, border, body):
 
     back = Canvas(width, 4, palette)
     back.fill(0, 0, width, 4, 3)
-    back.fill(0, 0, 2, 4, 2)
-    back.fill(width - 2, 0, width, 4, 2)
+    back.fill(0, 0, 1, 4, 2)
+    back.fill(width - 1, 0, width, 4, 2)
     back.save(back_name)
 
     bottom = Canvas(width, 12, palette)
     for y in range(12):
         for x in range(width):
             if inside_rounded(x, y + 36, width, 48, 8, top=False, bottom=True):
-                edge = x < 2 or x >= width - 2 or y >= 10
+                edge = x < 1 or x >= width - 1 or y >= 10
                 bottom.set(x, y, 2 if edge else 3)
     bottom.save(bottom_name)
 
@@ -117,17 +118,19 @@ def growth_set():
     top.fill(0, 24, 8, 26, 2)
     top.save("gr-top-red.gif")
 
-    background = Canvas(8, 8, palette)
-    background.fill(0, 0, 8, 8, 3)
+    # Stretched to the panel's width: drawn about as wide as a panel usually is.
+    width = 200
+    background = Canvas(width, 8, palette)
+    background.fill(0, 0, width, 8, 3)
     background.fill(0, 0, 1, 8, 1)
-    background.fill(7, 0, 8, 8, 1)
+    background.fill(width - 1, 0, width, 8, 1)
     background.save("gr-background-red.gif")
 
-    bottom = Canvas(8, 16, palette)
-    bottom.fill(0, 0, 8, 14, 3)
+    bottom = Canvas(width, 16, palette)
+    bottom.fill(0, 0, width, 14, 3)
     bottom.fill(0, 0, 1, 16, 1)
-    bottom.fill(7, 0, 8, 16, 1)
-    bottom.fill(0, 14, 8, 16, 1)
+    bottom.fill(width - 1, 0, width, 16, 1)
+    bottom.fill(0, 14, width, 16, 1)
     bottom.save("gr-bottom-red.gif")
 
 

@@ -42,6 +42,7 @@ Gallery::Gallery(QWidget *parent)
     addSection(QStringLiteral("NIB"), createNibSection());
     addSection(QStringLiteral("Escolha do país"), createCountrySection());
     addSection(QStringLiteral("Dicas e botões de informação"), createTipsSection());
+    addSection(QStringLiteral("Controlos com skin"), createSkinsSection());
     // Last: which classes this build serves.
     addSection(QStringLiteral("Classes da biblioteca"), classList());
 }

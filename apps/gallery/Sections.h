@@ -9,3 +9,6 @@ QWidget *createNibSection();
 QWidget *createCountrySection();
 // Information, warning and error buttons with their balloon tips.
 QWidget *createTipsSection();
+// Skinned navigation buttons with tips, number badges, a sub-menu, a frame, a growing
+// panel and a slide-open panel.
+QWidget *createSkinsSection();
