@@ -251,9 +251,11 @@ ZELCTL_EXPORT bool BitBlt(HDC dst, int x, int y, int width, int height, HDC src,
 ZELCTL_EXPORT bool StretchBlt(HDC dst, int x, int y, int width, int height, HDC src, int srcX, int srcY, int srcWidth,
     int srcHeight, quint32 rop);
 // Source-over: dst = src·k + dst·(1 − srcA·k), k = SourceConstantAlpha / 255, with srcA the
-// pixel's alpha for a 32-bit source with AC_SRC_ALPHA (premultiplied pixels) and 1
-// otherwise. Scales by the nearest pixel. Fails for negative extents and for a source
-// rectangle outside the source bitmap; the target is clipped.
+// pixel's alpha for a 32-bit source with AC_SRC_ALPHA and 1 otherwise, each channel within
+// 1 of the exact value. With AC_SRC_ALPHA the pixels are premultiplied (no colour channel
+// above alpha); a channel that would pass 255 stays at 255. Scales by the nearest pixel,
+// whatever the stretch mode. Fails for negative extents and for a source rectangle outside
+// the source bitmap; the target is clipped.
 ZELCTL_EXPORT bool AlphaBlend(HDC dst, int x, int y, int width, int height, HDC src, int srcX, int srcY, int srcWidth,
     int srcHeight, BLENDFUNCTION blend);
 

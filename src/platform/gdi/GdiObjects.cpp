@@ -29,7 +29,7 @@ std::shared_ptr<Bitmap> makeBitmap(const BITMAPINFOHEADER &header, const RGBQUAD
         return nullptr;
 
     auto bitmap = std::make_shared<Bitmap>();
-    bitmap->storage.reset(new (std::nothrow) quint32[size_t(stride / 4 * height)]());
+    bitmap->storage.reset(new (PixelAlignment, std::nothrow) quint32[size_t(stride / 4 * height)]());
     if (!bitmap->storage)
         return nullptr;
     bitmap->header = header;

@@ -2,6 +2,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <cmath>
+
 using namespace zelctl::gdi;
 using zelctl::gdi::test::TestBitmap;
 
@@ -277,6 +280,16 @@ TEST(StretchBlt, halftoneAveragesAreas)
     ASSERT_TRUE(StretchBlt(dst.dc, 1, 0, -2, 1, src.dc, 0, 0, 4, 1, SRCCOPY));
     EXPECT_EQ(rowOf(dst, 0, 2), (Values { grey(125), grey(50) }));
 
+    // Thirds, across and down: (30 + 60 + 120) / 3.
+    TestBitmap thirds(3, 3, 24);
+    setRow(thirds, 0, { grey(30), grey(60), grey(120) });
+    for (int y = 1; y < 3; ++y)
+        thirds.setRgb(0, y, grey(y == 1 ? 60 : 120));
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 1, 1, thirds.dc, 0, 0, 3, 1, SRCCOPY));
+    EXPECT_EQ(dst.rgb(0, 0), grey(70));
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 1, 1, thirds.dc, 0, 0, 1, 3, SRCCOPY));
+    EXPECT_EQ(dst.rgb(0, 0), grey(70));
+
     // Enlarging 2 -> 3: the middle pixel straddles both source pixels equally.
     ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 3, 1, src.dc, 1, 0, 2, 1, SRCCOPY));
     EXPECT_EQ(rowOf(dst, 0, 3), (Values { grey(100), grey(150), grey(200) }));
@@ -319,4 +332,98 @@ TEST(StretchBlt, halftoneClipsItsFootprintToTheSource)
     // Half of the footprint outside: the part inside counts alone.
     ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 1, 1, src.dc, -1, 0, 2, 1, SRCCOPY));
     EXPECT_EQ(dst.rgb(0, 0), grey(40));
+}
+
+TEST(StretchBlt, matchesTheSamplingRulesAtManyScales)
+{
+    // A 19 × 11 source of varied colours, scaled to several sizes, mirrored or not; each
+    // target pixel is checked against the rule worked out here in floating point.
+    constexpr int sw = 19, sh = 11;
+    TestBitmap src(sw, sh, 32);
+    for (int y = 0; y < sh; ++y)
+        for (int x = 0; x < sw; ++x)
+            src.setArgb(x, y, 0xFF000000u | quint32(x * 13) << 16 | quint32(y * 23) << 8 | quint32((x * y * 7) & 0xFF));
+    struct Scale
+    {
+        int width;
+        int height;
+    };
+    for (const Scale &scale :
+        { Scale { 7, 4 }, Scale { 40, 23 }, Scale { 57, 5 }, Scale { 6, 33 }, Scale { 19, 11 } }) {
+        for (bool mirrored : { false, true }) {
+            for (int mode : { COLORONCOLOR, HALFTONE }) {
+                TestBitmap dst(scale.width, scale.height, 32);
+                SetStretchBltMode(dst.dc, mode);
+                const int x = mirrored ? scale.width - 1 : 0;
+                const int w = mirrored ? -scale.width : scale.width;
+                ASSERT_TRUE(StretchBlt(dst.dc, x, 0, w, scale.height, src.dc, 0, 0, sw, sh, SRCCOPY));
+                for (int ty = 0; ty < scale.height; ++ty) {
+                    for (int tx = 0; tx < scale.width; ++tx) {
+                        const int lx = mirrored ? scale.width - 1 - tx : tx;
+                        const quint32 got = dst.argb(tx, ty);
+                        for (int shift : { 0, 8, 16 }) {
+                            double want;
+                            if (mode == COLORONCOLOR) {
+                                const int sx = (2 * lx + 1) * sw / (2 * scale.width);
+                                const int sy = (2 * ty + 1) * sh / (2 * scale.height);
+                                want = (src.argb(sx, sy) >> shift) & 0xFF;
+                            } else {
+                                // Coverage-weighted mean over the footprint.
+                                const double x0 = double(lx) * sw / scale.width, x1 = double(lx + 1) * sw / scale.width;
+                                const double y0 = double(ty) * sh / scale.height,
+                                             y1 = double(ty + 1) * sh / scale.height;
+                                double sum = 0;
+                                for (int sy = int(y0); sy < sh && sy < y1; ++sy)
+                                    for (int sx = int(x0); sx < sw && sx < x1; ++sx) {
+                                        const double cover = (std::min<double>(sx + 1, x1) - std::max<double>(sx, x0))
+                                            * (std::min<double>(sy + 1, y1) - std::max<double>(sy, y0));
+                                        sum += cover * ((src.argb(sx, sy) >> shift) & 0xFF);
+                                    }
+                                want = sum / ((x1 - x0) * (y1 - y0));
+                            }
+                            ASSERT_LE(std::abs(double((got >> shift) & 0xFF) - want), mode == HALFTONE ? 1.0 : 0.0)
+                                << scale.width << "x" << scale.height << (mirrored ? " mirrored" : "") << " mode "
+                                << mode << " at " << tx << "," << ty;
+                        }
+                        ASSERT_EQ(got >> 24, 0xFFu);
+                    }
+                }
+            }
+        }
+    }
+}
+
+TEST(StretchBlt, largeBlitsSplitIntoBandsGiveTheSamePixels)
+{
+    // Big enough to be shared among threads; every row is checked against the sampling
+    // rule, so a band that started or ended on the wrong row would show.
+    constexpr int sw = 300, sh = 200, tw = 900, th = 600;
+    TestBitmap src(sw, sh, 32);
+    for (int y = 0; y < sh; ++y)
+        for (int x = 0; x < sw; ++x)
+            src.setArgb(x, y, 0xFF000000u | quint32(x & 0xFF) << 16 | quint32(y & 0xFF) << 8 | quint32((x + y) & 0xFF));
+    TestBitmap dst(tw, th, 32);
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, tw, th, src.dc, 0, 0, sw, sh, SRCCOPY));
+    for (int y = 0; y < th; ++y)
+        for (int x = 0; x < tw; x += 37)
+            ASSERT_EQ(dst.argb(x, y), src.argb(x / 3, y / 3)) << x << "," << y;
+
+    TestBitmap blended(tw, th, 32);
+    blended.fill(0xFF000000u, tw, 32);
+    BLENDFUNCTION half;
+    half.SourceConstantAlpha = 128;
+    ASSERT_TRUE(AlphaBlend(blended.dc, 0, 0, tw, th, dst.dc, 0, 0, tw, th, half));
+    for (int y = 0; y < th; ++y)
+        for (int x = 0; x < tw; x += 41) {
+            const quint32 s = dst.argb(x, y), d = blended.argb(x, y);
+            for (int shift : { 0, 8, 16 })
+                ASSERT_NEAR(double(d >> shift & 0xFF), (s >> shift & 0xFF) * 128 / 255.0, 1.0) << x << "," << y;
+        }
+
+    SetStretchBltMode(dst.dc, HALFTONE);
+    TestBitmap flat(sw, sh, 24);
+    flat.fill(0x405060, sw, 24);
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, tw, th, flat.dc, 0, 0, sw, sh, SRCCOPY));
+    for (int y = 0; y < th; ++y)
+        ASSERT_EQ(dst.argb((y * 7) % tw, y), 0xFF405060u) << y;
 }
