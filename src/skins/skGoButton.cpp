@@ -5,6 +5,7 @@
 #include "platform/Pointer.h"
 #include "tips/clsBalloonTip.h"
 
+#include <QGuiApplication>
 #include <QMouseEvent>
 
 #include <array>
@@ -145,6 +146,7 @@ void skGoButton::setEnabled(bool enabled)
     if (enabled == Enabled())
         return;
     QWidget::setEnabled(enabled);
+    // No change event when a disabled container keeps the button disabled anyway.
     Repaint();
 }
 
@@ -194,6 +196,14 @@ void skGoButton::AmbientChanged(const QString &name)
     }
 }
 
+void skGoButton::changeEvent(QEvent *event)
+{
+    SurfaceHost::changeEvent(event);
+    // The container disabling the form greys the button too.
+    if (event->type() == QEvent::EnabledChange)
+        Repaint();
+}
+
 void skGoButton::resizeEvent(QResizeEvent *event)
 {
     SurfaceHost::resizeEvent(event);
@@ -217,16 +227,30 @@ void skGoButton::mouseMoveEvent(QMouseEvent *event)
         Repaint();
         break;
     case skinCommon::HoverChange::Left:
-        Q_EMIT MouseOut();
-        // While a button is held the capture stays, so the release still comes here.
-        if (!held)
-            platform::releaseCapture();
-        d->hovering = false;
-        Repaint();
+        pointerLeft(held);
         break;
     case skinCommon::HoverChange::None:
         break;
     }
+}
+
+void skGoButton::leaveEvent(QEvent *event)
+{
+    SurfaceHost::leaveEvent(event);
+    // Where the window system cannot capture the pointer, leaving the window is the last
+    // the control hears of it.
+    if (d->hovering && QGuiApplication::mouseButtons() == Qt::NoButton)
+        pointerLeft(false);
+}
+
+void skGoButton::pointerLeft(bool held)
+{
+    Q_EMIT MouseOut();
+    // While a button is held the capture stays, so the release still comes here.
+    if (!held)
+        platform::releaseCapture();
+    d->hovering = false;
+    Repaint();
 }
 
 void skGoButton::mousePressEvent(QMouseEvent *event)

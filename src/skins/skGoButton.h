@@ -84,12 +84,16 @@ protected:
     void Terminate() override;
     void AmbientChanged(const QString &name) override;
 
+    void changeEvent(QEvent *event) override;
     void resizeEvent(QResizeEvent *event) override;
     void mouseMoveEvent(QMouseEvent *event) override;
+    void leaveEvent(QEvent *event) override;
     void mousePressEvent(QMouseEvent *event) override;
     void mouseReleaseEvent(QMouseEvent *event) override;
 
 private:
+    // The pointer went off the control: MouseOut, capture back unless a button is held.
+    void pointerLeft(bool held);
     void loadDesignPreview();
     void click();
 

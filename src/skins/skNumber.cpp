@@ -4,6 +4,7 @@
 
 #include "platform/Pointer.h"
 
+#include <QGuiApplication>
 #include <QMouseEvent>
 
 #include <cmath>
@@ -236,14 +237,28 @@ void skNumber::mouseMoveEvent(QMouseEvent *event)
         redraw();
         break;
     case skinCommon::HoverChange::Left:
-        Q_EMIT MouseOut();
-        platform::releaseCapture();
-        d->active = false;
-        redraw();
+        pointerLeft(held);
         break;
     case skinCommon::HoverChange::None:
         break;
     }
+}
+
+void skNumber::leaveEvent(QEvent *event)
+{
+    SurfaceHost::leaveEvent(event);
+    // Where the window system cannot capture the pointer, leaving the window is the last
+    // the control hears of it.
+    if (d->active && QGuiApplication::mouseButtons() == Qt::NoButton)
+        pointerLeft(false);
+}
+
+void skNumber::pointerLeft(bool)
+{
+    Q_EMIT MouseOut();
+    platform::releaseCapture();
+    d->active = false;
+    redraw();
 }
 
 void skNumber::mousePressEvent(QMouseEvent *event)

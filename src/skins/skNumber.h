@@ -74,11 +74,14 @@ protected:
 
     void resizeEvent(QResizeEvent *event) override;
     void mouseMoveEvent(QMouseEvent *event) override;
+    void leaveEvent(QEvent *event) override;
     void mousePressEvent(QMouseEvent *event) override;
     void mouseReleaseEvent(QMouseEvent *event) override;
     void mouseDoubleClickEvent(QMouseEvent *event) override;
 
 private:
+    // The pointer went off the badge: MouseOut and the capture back, held button or not.
+    void pointerLeft(bool held);
     void redraw();
 
     std::unique_ptr<skNumberPrivate> const d;

@@ -5,6 +5,7 @@
 #include "platform/Pointer.h"
 #include "platform/Twips.h"
 
+#include <QGuiApplication>
 #include <QMouseEvent>
 
 #include <cmath>
@@ -335,15 +336,30 @@ void skSubMenu::mouseMoveEvent(QMouseEvent *event)
         Redraw();
         break;
     case skinCommon::HoverChange::Left:
-        Q_EMIT MouseOut();
-        if (!held)
-            platform::releaseCapture();
-        d->hovering = false;
-        Redraw();
+        pointerLeft(held);
         break;
     case skinCommon::HoverChange::None:
         break;
     }
+}
+
+void skSubMenu::leaveEvent(QEvent *event)
+{
+    SurfaceHost::leaveEvent(event);
+    // Where the window system cannot capture the pointer, leaving the window is the last
+    // the control hears of it.
+    if (d->hovering && QGuiApplication::mouseButtons() == Qt::NoButton)
+        pointerLeft(false);
+}
+
+void skSubMenu::pointerLeft(bool held)
+{
+    Q_EMIT MouseOut();
+    // While a button is held the capture stays, so the release still comes here.
+    if (!held)
+        platform::releaseCapture();
+    d->hovering = false;
+    Redraw();
 }
 
 void skSubMenu::mousePressEvent(QMouseEvent *event)

@@ -106,10 +106,13 @@ protected:
     void hideEvent(QHideEvent *event) override;
     void focusOutEvent(QFocusEvent *event) override;
     void mouseMoveEvent(QMouseEvent *event) override;
+    void leaveEvent(QEvent *event) override;
     void mousePressEvent(QMouseEvent *event) override;
     void mouseReleaseEvent(QMouseEvent *event) override;
 
 private:
+    // The pointer went off the control: MouseOut, capture back unless a button is held.
+    void pointerLeft(bool held);
     // Returns the x where the caption starts, in pixels.
     int drawArrowBox();
     int drawSlices(int captionWidth);

@@ -4,6 +4,7 @@
 #include "skins/skinCommon.h"
 #include "tips/clsBalloonTip.h"
 
+#include <QApplication>
 #include <QSignalSpy>
 
 using namespace zelctl;
@@ -72,6 +73,15 @@ TEST_F(GoButton, disabledShowsTheNormalPictureAndedOnGreyWhateverItsState)
     EXPECT_FALSE(button->mask().contains(QPoint(1, 1))) << "the mask is the one of the enabled look";
 }
 
+TEST_F(GoButton, aDisabledContainerGreysTheButtonToo)
+{
+    form.setEnabled(false);
+    EXPECT_EQ(centre(), platform::rgb(72, 96, 48));
+    EXPECT_TRUE(button->Enabled()) << "the button's own state is unchanged";
+    form.setEnabled(true);
+    EXPECT_EQ(centre(), Normal);
+}
+
 TEST_F(GoButton, keepsItselfSquare)
 {
     QSignalSpy resized(button, &skGoButton::Resize);
@@ -103,6 +113,16 @@ TEST_F(GoButton, raisesMouseInOnceAndMouseOutOnceAndRedraws)
     EXPECT_FALSE(button->Hovering());
     EXPECT_EQ(centre(), Normal);
     EXPECT_EQ(platform::capturedWidget(), nullptr) << "an idle button keeps no capture";
+}
+
+TEST_F(GoButton, leavingTheWindowEndsTheHoverWhereThereIsNoCapture)
+{
+    QTest::mouseMove(button, QPoint(20, 20));
+    QEvent leave(QEvent::Leave);
+    QApplication::sendEvent(button, &leave);
+    EXPECT_EQ(events, (QStringList { "MouseIn", "MouseOut" }));
+    EXPECT_FALSE(button->Hovering());
+    EXPECT_EQ(centre(), Normal);
 }
 
 TEST_F(GoButton, keepsTheCaptureWhileTheButtonIsHeldOutside)
