@@ -40,8 +40,7 @@ TEST_F(Number, drawsADiscWithAnXorRingAndMasksTheBackground)
     badge->setCaption(QString());
     EXPECT_EQ(pixel(*badge, 15, 15), 0x404040u);
     EXPECT_EQ(pixel(*badge, 0, 0), 0xFFFFFFu);
-    EXPECT_EQ(count(0xFFFFFFu ^ 0x404040u), count(0xBFBFBFu));
-    EXPECT_GT(count(0xBFBFBFu), 0) << "the ring of mixed colour round the disc";
+    EXPECT_GT(count(0xFFFFFFu ^ 0x404040u), 0) << "the ring of mixed colour round the disc";
     EXPECT_EQ(count(0xFFFFFFu) + count(0x404040u) + count(0xBFBFBFu), 30 * 30) << "no caption: only the disc";
     EXPECT_TRUE(badge->mask().contains(QPoint(15, 15)));
     EXPECT_FALSE(badge->mask().contains(QPoint(0, 0)));
