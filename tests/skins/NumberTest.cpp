@@ -112,8 +112,11 @@ TEST_F(Number, clicksAndDoubleClicksReachTheHost)
     QTest::mouseClick(badge, Qt::LeftButton, {}, QPoint(15, 15));
     EXPECT_EQ(clicked.count(), 1);
     EXPECT_EQ(down, 1);
+    // The second press of a double click, then its release.
     QTest::mouseDClick(badge, Qt::LeftButton, {}, QPoint(15, 15));
+    QTest::mouseRelease(badge, Qt::LeftButton, {}, QPoint(15, 15));
     EXPECT_EQ(doubleClicked.count(), 1);
+    EXPECT_EQ(clicked.count(), 1);
 }
 
 TEST_F(Number, persistsWithItsReadAndWriteDefaults)
