@@ -51,6 +51,7 @@ Gallery::Gallery(QWidget *parent)
     addSection(QStringLiteral("Dicas e botões de informação"), createTipsSection());
     addSection(QStringLiteral("Sujeito da declaração"), createSubjectSection());
     addSection(QStringLiteral("NIF"), createNifSection());
+    addSection(QStringLiteral("Controlos com skin"), createSkinsSection());
     // Last: which classes this build serves.
     addSection(QStringLiteral("Classes da biblioteca"), classList());
 }

@@ -13,3 +13,6 @@ QWidget *createTipsSection();
 QWidget *createSubjectSection();
 // A NIF box on the bundled declaration and directory of holders.
 QWidget *createNifSection();
+// Skinned navigation buttons with tips, number badges, a sub-menu, a frame, a growing
+// panel and a slide-open panel.
+QWidget *createSkinsSection();

@@ -1,6 +1,7 @@
 #include "CommandButton.h"
 
 #include "KeyCodes.h"
+#include "platform/OleColor.h"
 #include "platform/Twips.h"
 
 #include <QKeyEvent>
@@ -65,6 +66,30 @@ int CommandButton::Index() const
 void CommandButton::setIndex(int index)
 {
     d->index = index;
+}
+
+quint32 CommandButton::ForeColor() const
+{
+    return platform::fromQColor(palette().color(QPalette::ButtonText));
+}
+
+void CommandButton::setForeColor(quint32 color)
+{
+    QPalette colours = palette();
+    colours.setColor(QPalette::ButtonText, platform::toQColor(color));
+    setPalette(colours);
+}
+
+void CommandButton::enterEvent(QEnterEvent *event)
+{
+    QPushButton::enterEvent(event);
+    Q_EMIT MouseHover(true);
+}
+
+void CommandButton::leaveEvent(QEvent *event)
+{
+    QPushButton::leaveEvent(event);
+    Q_EMIT MouseHover(false);
 }
 
 int CommandButton::Left() const

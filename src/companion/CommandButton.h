@@ -33,6 +33,7 @@ class ZELCTL_EXPORT CommandButton : public QPushButton
     Q_PROPERTY(int Top READ Top WRITE setTop)
     Q_PROPERTY(int Width READ Width WRITE setWidth)
     Q_PROPERTY(int Height READ Height WRITE setHeight)
+    Q_PROPERTY(quint32 ForeColor READ ForeColor WRITE setForeColor)
 
 public:
     explicit CommandButton(QWidget *parent = nullptr);
@@ -71,6 +72,10 @@ public:
     // The element's index in its array, or -1 for a lone button.
     int Index() const;
 
+    // Colour of the caption, 0x00BBGGRR or a system colour.
+    quint32 ForeColor() const;
+    void setForeColor(quint32 color);
+
     int Left() const;
     int Top() const;
     int Width() const;
@@ -90,8 +95,13 @@ Q_SIGNALS:
     void DblClick(int Index);
     // Before the button handles the key; setting KeyCode to 0 keeps the key from it.
     void KeyDown(int Index, int &KeyCode, int Shift);
+    // The pointer came onto the button (true) or left it (false), so a container can
+    // restyle it.
+    void MouseHover(bool Hovering);
 
 protected:
+    void enterEvent(QEnterEvent *event) override;
+    void leaveEvent(QEvent *event) override;
     void mouseDoubleClickEvent(QMouseEvent *event) override;
     void keyPressEvent(QKeyEvent *event) override;
 

@@ -115,6 +115,27 @@ TEST(CommandButton, defaultButtonAnswersEnter)
     EXPECT_EQ(indexes(clicks), QList<int> { 0 });
 }
 
+TEST(CommandButton, reportsThePointerComingAndGoingAndTakesACaptionColour)
+{
+    QWidget form;
+    form.resize(200, 100);
+    auto *button = new CommandButton(&form);
+    button->setGeometry(10, 10, 50, 30);
+    form.show();
+    ASSERT_TRUE(QTest::qWaitForWindowExposed(&form));
+    QTest::mouseMove(&form, QPoint(150, 80));
+    QSignalSpy hover(button, &CommandButton::MouseHover);
+    QTest::mouseMove(button, QPoint(20, 10));
+    QTest::mouseMove(&form, QPoint(150, 70));
+    ASSERT_EQ(hover.count(), 2);
+    EXPECT_TRUE(hover.at(0).at(0).toBool());
+    EXPECT_FALSE(hover.at(1).at(0).toBool());
+
+    button->setForeColor(0xC00000);
+    EXPECT_EQ(button->ForeColor(), 0xC00000u);
+    EXPECT_EQ(button->palette().color(QPalette::ButtonText), QColor(0, 0, 0xC0));
+}
+
 TEST(KeyCodes, qtKeysMapToVirtualKeyCodes)
 {
     const std::pair<int, int> cases[] = { { Qt::Key_A, 65 }, { Qt::Key_Z, 90 }, { Qt::Key_0, 48 }, { Qt::Key_9, 57 },

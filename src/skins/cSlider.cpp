@@ -1,0 +1,123 @@
+#include "cSlider.h"
+
+#include "skinCommon.h"
+
+#include "companion/CommandButton.h"
+
+#include <QResizeEvent>
+
+namespace zelctl {
+
+namespace {
+
+// Room left between the contents and the button of an open slider.
+constexpr int OpenGap = 300;
+constexpr int ButtonWidth = 240;
+
+// The arrow symbols of the button's symbol font.
+const QString OpenGlyph = QStringLiteral("ç");
+const QString ClosedGlyph = QStringLiteral("è");
+
+constexpr quint32 HoverCaptionColor = 0xC00000;
+constexpr quint32 CaptionColor = 0x404040;
+
+} // namespace
+
+class cSliderPrivate
+{
+public:
+    bool open = false;
+    CommandButton *cc = nullptr;
+};
+
+cSlider::cSlider(QWidget *parent)
+    : UserControl(parent)
+    , d(std::make_unique<cSliderPrivate>())
+{
+    d->cc = new CommandButton(this);
+    d->cc->setObjectName(QStringLiteral("cc"));
+    d->cc->setFont(QFont(QStringLiteral("Wingdings"), 10));
+    d->cc->setWidth(ButtonWidth);
+    styleButton(false);
+    connect(d->cc, &CommandButton::Click, this, [this] { setSlideOpen(!d->open); });
+    connect(d->cc, &CommandButton::MouseHover, this, [this](bool hovering) { styleButton(hovering); });
+
+    // Every slider starts closed; its Slided waits for the event loop, when a host can hear it.
+    close();
+    QMetaObject::invokeMethod(this, &cSlider::Slided, Qt::QueuedConnection);
+}
+
+cSlider::~cSlider() = default;
+
+bool cSlider::SlideOpen() const
+{
+    return d->open;
+}
+
+void cSlider::setSlideOpen(bool open)
+{
+    if (open == d->open)
+        return;
+    d->open = open;
+    if (open)
+        this->open();
+    else
+        close();
+    Q_EMIT Slided();
+}
+
+CommandButton *cSlider::button() const
+{
+    return d->cc;
+}
+
+void cSlider::resizeEvent(QResizeEvent *event)
+{
+    UserControl::resizeEvent(event);
+    placeButton();
+}
+
+int cSlider::contentsRight() const
+{
+    int right = 0;
+    for (QObject *child : children()) {
+        auto *control = qobject_cast<QWidget *>(child);
+        if (!control || control == d->cc)
+            continue;
+        right = std::max(right, skinCommon::twips(control->x() + control->width()));
+    }
+    return right;
+}
+
+void cSlider::open()
+{
+    extender().setWidth(contentsRight() + d->cc->Width() + OpenGap);
+    d->cc->setLeft(skinCommon::twips(width()) - d->cc->Width());
+    d->cc->setCaption(OpenGlyph);
+    d->cc->raise();
+}
+
+void cSlider::close()
+{
+    extender().setWidth(d->cc->Width());
+    d->cc->Move(0, 0);
+    d->cc->setCaption(ClosedGlyph);
+    d->cc->raise();
+}
+
+void cSlider::placeButton()
+{
+    const int innerWidth = skinCommon::twips(width());
+    const int innerHeight = skinCommon::twips(height());
+    const int left = d->open ? innerWidth - d->cc->Width() : 0;
+    d->cc->Move(left, 0, d->cc->Width(), innerHeight);
+}
+
+void cSlider::styleButton(bool hovering)
+{
+    d->cc->setForeColor(hovering ? HoverCaptionColor : CaptionColor);
+}
+
+ZELCTL_REGISTER_CLASS(cSlider)
+
+} // namespace zelctl

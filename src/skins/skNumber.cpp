@@ -1,0 +1,289 @@
+#include "skNumber.h"
+
+#include "skinCommon.h"
+
+#include "platform/Pointer.h"
+
+#include <QGuiApplication>
+#include <QMouseEvent>
+
+#include <cmath>
+
+namespace zelctl {
+
+namespace {
+
+constexpr platform::OleColor DefaultBackColor = 0xFFFFFF;
+constexpr platform::OleColor DefaultBackground = 0x404040;
+constexpr platform::OleColor DefaultForeground = 0xFFFFFF;
+constexpr platform::OleColor DefaultBackgroundActive = 0x5652B8;
+constexpr platform::OleColor DefaultForegroundActive = 0xFFFFFF;
+
+// Sets one point as a dot of the given diameter, in copy or XOR pen mode.
+void dot(gdi::HDC dc, int x, int y, int diameter, platform::OleColor color, int penMode)
+{
+    const gdi::HPEN pen = gdi::CreatePen(gdi::PS_SOLID, diameter, color);
+    const gdi::HGDIOBJ previous = gdi::SelectObject(dc, pen);
+    gdi::SetROP2(dc, penMode);
+    gdi::PSet(dc, x, y, color);
+    gdi::SetROP2(dc, gdi::R2_COPYPEN);
+    gdi::SelectObject(dc, previous);
+    gdi::DeleteObject(pen);
+}
+
+} // namespace
+
+class skNumberPrivate
+{
+public:
+    platform::OleColor backColor = DefaultBackColor;
+    platform::OleColor background = DefaultBackground;
+    platform::OleColor foreground = DefaultForeground;
+    platform::OleColor backgroundActive = DefaultBackgroundActive;
+    platform::OleColor foregroundActive = DefaultForegroundActive;
+    bool active = false;
+    QString caption;
+    QString skinId;
+    bool pressedHere = false;
+};
+
+skNumber::skNumber(QWidget *parent)
+    : SurfaceHost(parent)
+    , d(std::make_unique<skNumberPrivate>())
+{
+    setMouseTracking(true);
+}
+
+skNumber::~skNumber() = default;
+
+QString skNumber::Caption() const
+{
+    return d->caption;
+}
+
+void skNumber::setCaption(const QString &caption)
+{
+    d->caption = caption;
+    PropertyChanged(QStringLiteral("Caption"));
+    redraw();
+}
+
+platform::OleColor skNumber::BackColor() const
+{
+    return d->backColor;
+}
+
+void skNumber::setBackColor(platform::OleColor color)
+{
+    d->backColor = color;
+    redraw();
+}
+
+platform::OleColor skNumber::Background() const
+{
+    return d->background;
+}
+
+void skNumber::setBackground(platform::OleColor color)
+{
+    d->background = color;
+    redraw();
+}
+
+platform::OleColor skNumber::BackgroundActive() const
+{
+    return d->backgroundActive;
+}
+
+void skNumber::setBackgroundActive(platform::OleColor color)
+{
+    d->backgroundActive = color;
+    redraw();
+}
+
+platform::OleColor skNumber::Foreground() const
+{
+    return d->foreground;
+}
+
+void skNumber::setForeground(platform::OleColor color)
+{
+    d->foreground = color;
+    redraw();
+}
+
+platform::OleColor skNumber::ForegroundActive() const
+{
+    return d->foregroundActive;
+}
+
+void skNumber::setForegroundActive(platform::OleColor color)
+{
+    d->foregroundActive = color;
+    redraw();
+}
+
+bool skNumber::Active() const
+{
+    return d->active;
+}
+
+void skNumber::setActive(bool active)
+{
+    if (active == d->active)
+        return;
+    d->active = active;
+    redraw();
+}
+
+QString skNumber::SkinID() const
+{
+    return d->skinId;
+}
+
+void skNumber::setSkinID(const QString &skinId)
+{
+    if (skinId == d->skinId)
+        return;
+    d->skinId = skinId;
+    PropertyChanged(QStringLiteral("SkinID"));
+    Q_EMIT RequestSkinRepait();
+}
+
+void skNumber::InitProperties()
+{
+    d->background = DefaultBackground;
+    d->foreground = DefaultForeground;
+    d->backgroundActive = DefaultBackgroundActive;
+    d->foregroundActive = DefaultForegroundActive;
+    redraw();
+}
+
+void skNumber::ReadProperties(const PropertyBag &bag)
+{
+    const auto color = [&bag](const char *name, platform::OleColor fallback) {
+        return platform::OleColor(bag.ReadProperty(QLatin1String(name), fallback).toUInt());
+    };
+    d->caption = bag.ReadProperty(QStringLiteral("Caption"), QStringLiteral("1")).toString();
+    d->background = color("Background", DefaultBackground);
+    d->foreground = color("Foreground", DefaultForeground);
+    d->backgroundActive = color("BackgroundActive", DefaultBackgroundActive);
+    d->foregroundActive = color("ForegroundActive", DefaultForegroundActive);
+    d->active = bag.ReadProperty(QStringLiteral("Active"), false).toBool();
+    d->skinId = bag.ReadProperty(QStringLiteral("SkinID"), QString()).toString();
+    setBackColor(color("BackColor", DefaultBackColor));
+}
+
+void skNumber::WriteProperties(PropertyBag &bag)
+{
+    bag.WriteProperty(QStringLiteral("Caption"), d->caption, QString());
+    bag.WriteProperty(QStringLiteral("BackColor"), d->backColor, DefaultBackColor);
+    bag.WriteProperty(QStringLiteral("Background"), d->background, DefaultBackground);
+    bag.WriteProperty(QStringLiteral("Foreground"), d->foreground, DefaultForeground);
+    bag.WriteProperty(QStringLiteral("BackgroundActive"), d->backgroundActive, DefaultBackgroundActive);
+    bag.WriteProperty(QStringLiteral("ForegroundActive"), d->foregroundActive, DefaultForegroundActive);
+    bag.WriteProperty(QStringLiteral("Active"), d->active);
+    bag.WriteProperty(QStringLiteral("SkinID"), d->skinId, QString());
+}
+
+void skNumber::redraw()
+{
+    const gdi::HDC dc = surface().hdc();
+    surface().clear(d->backColor);
+    const int w = width();
+    const int h = height();
+    const platform::OleColor disc = d->active ? d->backgroundActive : d->background;
+    const platform::OleColor text = d->active ? d->foregroundActive : d->foreground;
+
+    // The caption grows with the badge, down to a smallest readable size.
+    QFont captionFont = font();
+    captionFont.setPointSize(w <= 16 ? 6 : w / 2);
+    setFont(captionFont);
+
+    // The XOR pass leaves a one-pixel ring of mixed colour round the solid disc.
+    dot(dc, w / 2, h / 2, w - 1, disc, gdi::R2_XORPEN);
+    dot(dc, w / 2, h / 2, w - 2, disc, gdi::R2_COPYPEN);
+
+    if (!d->caption.isEmpty()) {
+        const gdi::HFONT gdiFont = gdi::CreateFont(captionFont.family(), captionFont.pointSizeF(), captionFont.bold());
+        const gdi::HGDIOBJ previous = gdi::SelectObject(dc, gdiFont);
+        gdi::SIZE extent;
+        gdi::GetTextExtentPoint32(dc, d->caption, extent);
+        gdi::SetTextColor(dc, text);
+        gdi::TextOut(dc, int(std::floor((w - extent.cx) / 2.0)), int(std::floor((h - extent.cy) / 2.0)), d->caption);
+        gdi::SelectObject(dc, previous);
+        gdi::DeleteObject(gdiFont);
+    }
+    surface().setMaskColor(d->backColor);
+    update();
+}
+
+void skNumber::resizeEvent(QResizeEvent *event)
+{
+    SurfaceHost::resizeEvent(event);
+    if (width() != height())
+        resize(width(), width());
+    else
+        redraw();
+}
+
+void skNumber::mouseMoveEvent(QMouseEvent *event)
+{
+    const bool held = event->buttons() != Qt::NoButton;
+    switch (skinCommon::trackPointer(this, event->globalPosition(), d->active, held)) {
+    case skinCommon::HoverChange::Entered:
+        d->active = true;
+        Q_EMIT MouseIn();
+        redraw();
+        break;
+    case skinCommon::HoverChange::Left:
+        pointerLeft(held);
+        break;
+    case skinCommon::HoverChange::None:
+        break;
+    }
+}
+
+void skNumber::leaveEvent(QEvent *event)
+{
+    SurfaceHost::leaveEvent(event);
+    // Where the window system cannot capture the pointer, leaving the window is the last
+    // the control hears of it.
+    if (d->active && QGuiApplication::mouseButtons() == Qt::NoButton)
+        pointerLeft(false);
+}
+
+void skNumber::pointerLeft(bool)
+{
+    Q_EMIT MouseOut();
+    platform::releaseCapture();
+    d->active = false;
+    redraw();
+}
+
+void skNumber::mousePressEvent(QMouseEvent *event)
+{
+    skinCommon::MouseArgs args = skinCommon::mouseArgs(event);
+    if (event->button() == Qt::LeftButton)
+        d->pressedHere = true;
+    Q_EMIT MouseDown(args.Button, args.Shift, args.X, args.Y);
+}
+
+void skNumber::mouseReleaseEvent(QMouseEvent *event)
+{
+    skinCommon::MouseArgs args = skinCommon::mouseArgs(event);
+    Q_EMIT MouseUp(args.Button, args.Shift, args.X, args.Y);
+    if (event->button() == Qt::LeftButton && std::exchange(d->pressedHere, false)
+        && skinCommon::pointerInside(this, event->globalPosition()))
+        Q_EMIT Clicked();
+}
+
+void skNumber::mouseDoubleClickEvent(QMouseEvent *event)
+{
+    if (event->button() == Qt::LeftButton)
+        Q_EMIT DoubleClicked();
+}
+
+ZELCTL_REGISTER_CLASS(skNumber)
+
+} // namespace zelctl

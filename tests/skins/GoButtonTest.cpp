@@ -1,0 +1,229 @@
+#include "SkinTestSupport.h"
+
+#include "skins/skGoButton.h"
+#include "skins/skinCommon.h"
+#include "tips/clsBalloonTip.h"
+
+#include <QApplication>
+#include <QSignalSpy>
+
+using namespace zelctl;
+using zelctl::test::pixel;
+
+namespace {
+
+constexpr platform::OleColor Normal = 0x3264C8; // RGB(200, 100, 50)
+constexpr platform::OleColor Hover = 0x00FF00;
+constexpr platform::OleColor Pressed = 0xFF0000;
+
+class GoButton : public zelctl::test::SkinForm
+{
+protected:
+    zelctl::test::PictureFolder pictures;
+    skGoButton *button = new skGoButton(&form);
+    QStringList events;
+
+    void SetUp() override
+    {
+        button->setGeometry(20, 20, 40, 40);
+        // Round-ish pictures: a transparent border that the black mask cuts away.
+        button->setImageSource(0, pictures.write("normal.png", QSize(40, 40), QColor(200, 100, 50), 4));
+        button->setImageSource(1, pictures.write("hover.png", QSize(40, 40), QColor(0, 255, 0), 4));
+        button->setImageSource(2, pictures.write("pressed.png", QSize(40, 40), QColor(0, 0, 255), 4));
+        showForm();
+        button->Repaint();
+        QObject::connect(button, &skGoButton::MouseIn, [this] { events << "MouseIn"; });
+        QObject::connect(button, &skGoButton::MouseOut, [this] { events << "MouseOut"; });
+        QObject::connect(button, &skGoButton::Click, [this] { events << "Click"; });
+        QObject::connect(button, &skGoButton::MouseDown,
+            [this](qint16 &b, qint16 &, float &, float &) { events << QStringLiteral("MouseDown %1").arg(b); });
+        QObject::connect(button, &skGoButton::MouseUp,
+            [this](qint16 &b, qint16 &, float &, float &) { events << QStringLiteral("MouseUp %1").arg(b); });
+    }
+
+    platform::OleColor centre() { return pixel(*button, 20, 20); }
+};
+
+} // namespace
+
+TEST_F(GoButton, showsTheNormalHoverAndPressedPicturesWithTheBlackBorderMasked)
+{
+    EXPECT_EQ(centre(), Normal);
+    EXPECT_EQ(pixel(*button, 1, 1), 0x000000u);
+    EXPECT_TRUE(button->mask().contains(QPoint(20, 20)));
+    EXPECT_FALSE(button->mask().contains(QPoint(1, 1)));
+
+    button->setHovering(true);
+    button->Repaint();
+    EXPECT_EQ(centre(), Hover);
+    button->setActive(true);
+    EXPECT_EQ(centre(), Pressed) << "pressed wins over hover";
+}
+
+TEST_F(GoButton, disabledShowsTheNormalPictureAndedOnGreyWhateverItsState)
+{
+    button->setHovering(true);
+    button->setActive(true);
+    button->setEnabled(false);
+    EXPECT_FALSE(button->Enabled());
+    // RGB(200, 100, 50) AND RGB(120, 120, 120).
+    EXPECT_EQ(centre(), platform::rgb(72, 96, 48));
+    // Transparent pixels leave the grey as it is.
+    EXPECT_EQ(pixel(*button, 1, 1), 0x787878u);
+    EXPECT_FALSE(button->mask().contains(QPoint(1, 1))) << "the mask is the one of the enabled look";
+}
+
+TEST_F(GoButton, aDisabledContainerGreysTheButtonToo)
+{
+    form.setEnabled(false);
+    EXPECT_EQ(centre(), platform::rgb(72, 96, 48));
+    EXPECT_TRUE(button->Enabled()) << "the button's own state is unchanged";
+    form.setEnabled(true);
+    EXPECT_EQ(centre(), Normal);
+}
+
+TEST_F(GoButton, keepsItselfSquare)
+{
+    QSignalSpy resized(button, &skGoButton::Resize);
+    button->resize(26, 20); // 390 × 300 twips
+    EXPECT_EQ(button->size(), QSize(20, 20));
+    EXPECT_EQ(resized.count(), 2) << "the corrected size raises Resize once more";
+
+    resized.clear();
+    button->resize(20, 20);
+    button->resize(30, 30);
+    EXPECT_EQ(button->size(), QSize(30, 30));
+    EXPECT_EQ(resized.count(), 1);
+    EXPECT_EQ(centre(), Normal) << "a square resize repaints";
+}
+
+TEST_F(GoButton, raisesMouseInOnceAndMouseOutOnceAndRedraws)
+{
+    QTest::mouseMove(button, QPoint(20, 20));
+    QTest::mouseMove(button, QPoint(22, 21));
+    QTest::mouseMove(button, QPoint(25, 25));
+    EXPECT_EQ(events, QStringList { "MouseIn" });
+    EXPECT_TRUE(button->Hovering());
+    EXPECT_EQ(centre(), Hover);
+    EXPECT_EQ(platform::capturedWidget(), button);
+
+    QTest::mouseMove(&form, QPoint(300, 200));
+    QTest::mouseMove(&form, QPoint(310, 210));
+    EXPECT_EQ(events, (QStringList { "MouseIn", "MouseOut" }));
+    EXPECT_FALSE(button->Hovering());
+    EXPECT_EQ(centre(), Normal);
+    EXPECT_EQ(platform::capturedWidget(), nullptr) << "an idle button keeps no capture";
+}
+
+TEST_F(GoButton, leavingTheWindowEndsTheHoverWhereThereIsNoCapture)
+{
+    QTest::mouseMove(button, QPoint(20, 20));
+    QEvent leave(QEvent::Leave);
+    QApplication::sendEvent(button, &leave);
+    EXPECT_EQ(events, (QStringList { "MouseIn", "MouseOut" }));
+    EXPECT_FALSE(button->Hovering());
+    EXPECT_EQ(centre(), Normal);
+}
+
+TEST_F(GoButton, keepsTheCaptureWhileTheButtonIsHeldOutside)
+{
+    QTest::mouseMove(button, QPoint(20, 20));
+    QTest::mousePress(button, Qt::LeftButton, {}, QPoint(20, 20));
+    EXPECT_TRUE(button->Active());
+    EXPECT_EQ(centre(), Pressed);
+
+    QTest::mouseMove(button, QPoint(200, 150));
+    EXPECT_EQ(events, (QStringList { "MouseIn", "MouseDown 1", "MouseOut" }));
+    EXPECT_EQ(platform::capturedWidget(), button) << "the release must still come here";
+
+    QTest::mouseRelease(button, Qt::LeftButton, {}, QPoint(200, 150));
+    EXPECT_EQ(events, (QStringList { "MouseIn", "MouseDown 1", "MouseOut", "MouseUp 1" })) << "no click outside";
+    EXPECT_FALSE(button->Active());
+    EXPECT_EQ(centre(), Normal);
+    EXPECT_EQ(platform::capturedWidget(), nullptr);
+}
+
+TEST_F(GoButton, aClickRaisesClickThenMouseOutAndShowsTheNormalPicture)
+{
+    QTest::mouseMove(button, QPoint(20, 20));
+    QTest::mouseClick(button, Qt::LeftButton, {}, QPoint(20, 20));
+    EXPECT_EQ(events, (QStringList { "MouseIn", "MouseDown 1", "MouseUp 1", "Click", "MouseOut" }));
+    EXPECT_FALSE(button->Hovering());
+    EXPECT_FALSE(button->Active());
+    EXPECT_EQ(centre(), Normal);
+    EXPECT_EQ(platform::capturedWidget(), nullptr);
+
+    // The right button neither presses nor clicks.
+    events.clear();
+    QTest::mouseClick(button, Qt::RightButton, {}, QPoint(20, 20));
+    EXPECT_EQ(events, (QStringList { "MouseDown 2", "MouseUp 2" }));
+}
+
+TEST_F(GoButton, picturesSlotsFollowTheIndexAndLoadingRules)
+{
+    EXPECT_EQ(button->setImageSource(6, pictures.path("normal.png")), skinCommon::ErrSubscriptOutOfRange);
+    EXPECT_EQ(button->setImageSource(-1, pictures.path("normal.png")), skinCommon::ErrSubscriptOutOfRange);
+    EXPECT_EQ(button->ImageSource(6), QString());
+
+    // A failed load keeps the path and the previous picture.
+    EXPECT_EQ(button->setImageSource(0, pictures.path("missing.gif")), skinCommon::ErrFileNotFound);
+    EXPECT_EQ(button->ImageSource(0), pictures.path("missing.gif"));
+    QFile text(pictures.path("notes.gif"));
+    ASSERT_TRUE(text.open(QIODevice::WriteOnly));
+    text.write("not a picture");
+    text.close();
+    EXPECT_EQ(button->setImageSource(0, text.fileName()), skinCommon::ErrInvalidPicture);
+    button->Repaint();
+    EXPECT_EQ(centre(), Normal);
+
+    // Slots 3 to 5 are kept but never drawn; an empty path empties a slot.
+    EXPECT_EQ(button->setImageSource(5, pictures.path("hover.png")), skinCommon::ErrNone);
+    EXPECT_EQ(button->ImageSource(5), pictures.path("hover.png"));
+    EXPECT_EQ(button->setImageSource(0, QString()), skinCommon::ErrNone);
+    button->Repaint();
+    EXPECT_EQ(centre(), 0x000000u);
+    EXPECT_FALSE(button->mask().contains(QPoint(20, 20)));
+}
+
+TEST_F(GoButton, tooltipIsABalloonTitledNavegacao)
+{
+    const qint32 before = clsBalloonTip().TooltipCount();
+    button->setTooltip(QStringLiteral("Seguinte"));
+    EXPECT_EQ(button->Tooltip(), QStringLiteral("Seguinte"));
+    EXPECT_EQ(clsBalloonTip().TooltipCount(), before + 1);
+    button->setTooltip(QStringLiteral("Passo seguinte"));
+    EXPECT_EQ(clsBalloonTip().TooltipCount(), before + 1) << "a new tip replaces the old one";
+    button->setTooltip(QString());
+    EXPECT_EQ(button->Tooltip(), QString());
+    EXPECT_EQ(clsBalloonTip().TooltipCount(), before);
+}
+
+TEST_F(GoButton, persistsSkinIdAndTooltipAndLoadsWithoutAskingForASkin)
+{
+    EXPECT_TRUE(button->Save().isEmpty()) << "empty values are not written";
+
+    PropertyBag bag;
+    bag.WriteProperty("SkinID", "verde");
+    bag.WriteProperty("Tooltip", "Avançar");
+    skGoButton loaded(&form);
+    QSignalSpy requests(&loaded, &skGoButton::RequestSkinRepait);
+    loaded.Load(bag);
+    EXPECT_EQ(loaded.SkinID(), QStringLiteral("verde"));
+    EXPECT_EQ(loaded.Tooltip(), QStringLiteral("Avançar"));
+    EXPECT_EQ(requests.count(), 0);
+    EXPECT_EQ(loaded.Save(), bag);
+}
+
+TEST_F(GoButton, designModePreviewsTheDefaultPicturesWithoutTouchingThePaths)
+{
+    skGoButton preview(&form);
+    preview.setGeometry(100, 20, 32, 32);
+    Ambient designer;
+    designer.UserMode = false;
+    preview.setAmbient(designer);
+    preview.Load(PropertyBag());
+    preview.Repaint();
+    EXPECT_EQ(preview.ImageSource(0), QString());
+    EXPECT_EQ(pixel(preview, 5, 16), platform::rgb(232, 119, 34)) << "the orange disc of btn_go_normal.gif";
+    EXPECT_FALSE(preview.mask().contains(QPoint(0, 0))) << "the picture's transparent corner";
+}

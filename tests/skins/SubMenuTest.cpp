@@ -1,0 +1,207 @@
+#include "SkinTestSupport.h"
+
+#include "skins/skSubMenu.h"
+
+#include <QSignalSpy>
+
+using namespace zelctl;
+using zelctl::test::pixel;
+
+namespace {
+
+constexpr platform::OleColor Clear = 0xFFFFFF;
+constexpr platform::OleColor Fill = 0xC3AB00;
+
+class SubMenu : public zelctl::test::SkinForm
+{
+protected:
+    skSubMenu *item = new skSubMenu(&form);
+    QStringList events;
+
+    void SetUp() override
+    {
+        item->InitNew();
+        // 300 twips high: half the height is 150 twips, ten one-pixel steps.
+        item->setGeometry(10, 10, 200, 20);
+        showForm();
+        QObject::connect(item, &skSubMenu::MouseIn, [this] { events << "MouseIn"; });
+        QObject::connect(item, &skSubMenu::MouseOut, [this] { events << "MouseOut"; });
+        QObject::connect(item, &skSubMenu::Clicked, [this] { events << "Clicked"; });
+        QObject::connect(
+            item, &skSubMenu::MouseUp, [this](qint16 &, qint16 &, float &, float &) { events << "MouseUp"; });
+    }
+};
+
+} // namespace
+
+TEST_F(SubMenu, arrowBoxHasANotchOnTheLeftAndAPointOnTheRight)
+{
+    item->Redraw();
+    EXPECT_EQ(pixel(*item, 100, 10), Fill);
+    // The notch: its tip reaches x = 10 at mid height.
+    EXPECT_EQ(pixel(*item, 0, 0), Clear);
+    EXPECT_EQ(pixel(*item, 0, 19), Clear);
+    EXPECT_EQ(pixel(*item, 9, 10), Clear);
+    EXPECT_EQ(pixel(*item, 5, 2), Fill);
+    EXPECT_EQ(pixel(*item, 11, 10), Fill);
+    // The point: the box ends at 190, the point narrows to x = 199.
+    EXPECT_EQ(pixel(*item, 195, 10), Fill);
+    EXPECT_EQ(pixel(*item, 195, 2), Clear);
+    EXPECT_EQ(pixel(*item, 199, 10), Fill);
+    EXPECT_EQ(pixel(*item, 199, 8), Clear);
+    EXPECT_EQ(pixel(*item, 189, 0), Fill);
+    EXPECT_FALSE(item->mask().contains(QPoint(0, 10)));
+    EXPECT_FALSE(item->mask().contains(QPoint(195, 2)));
+    EXPECT_TRUE(item->mask().contains(QPoint(100, 10)));
+}
+
+TEST_F(SubMenu, backgroundPrefersActiveOverHover)
+{
+    QTest::mouseMove(item, QPoint(100, 10));
+    EXPECT_EQ(pixel(*item, 100, 10), 0xE1D57Fu);
+    item->setActive(true);
+    EXPECT_EQ(pixel(*item, 100, 10), 0x7FD5E1u);
+}
+
+TEST_F(SubMenu, transparencyMinusOneLeavesTheBoxOpaque)
+{
+    item->setTransparencyColor(skSubMenu::NoTransparency);
+    item->Redraw();
+    EXPECT_TRUE(item->mask().isEmpty());
+    EXPECT_EQ(pixel(*item, 100, 10), Fill);
+}
+
+TEST_F(SubMenu, colourChangesWaitForRedraw)
+{
+    item->Redraw();
+    item->setBackColor(0x0000FF);
+    EXPECT_EQ(pixel(*item, 100, 10), Fill);
+    item->Redraw();
+    EXPECT_EQ(pixel(*item, 100, 10), 0x0000FFu);
+}
+
+TEST_F(SubMenu, captionThatNeedsRoomFirstOnlyWidensTheItem)
+{
+    item->resize(30, 20);
+    item->Redraw();
+    const QImage before = item->surface().image().copy(0, 0, 30, 20);
+    QSignalSpy resized(item, &skSubMenu::Resize);
+    item->setCaption(QStringLiteral("Rendimentos"));
+    EXPECT_GT(item->width(), 40);
+    EXPECT_EQ(resized.count(), 1);
+    EXPECT_EQ(item->surface().image().copy(0, 0, 30, 20), before) << "nothing drawn yet";
+
+    const int width = item->width();
+    item->Redraw();
+    EXPECT_EQ(item->width(), width);
+    // Caption after the notch: the first white pixels lie right of x = 21 (315 twips).
+    const QImage drawn = item->surface().image();
+    int firstText = width;
+    for (int y = 0; y < 20; ++y)
+        for (int x = 12; x < width - 12; ++x)
+            if (platform::fromQColor(QColor(drawn.pixel(x, y))) == 0xFFFFFFu)
+                firstText = std::min(firstText, x);
+    EXPECT_GE(firstText, 21);
+    EXPECT_LT(firstText, 30);
+}
+
+TEST_F(SubMenu, slicesAreAndedOnWhiteOrOnGreyWhenHovered)
+{
+    zelctl::test::PictureFolder pictures;
+    // Every piece is ANDed onto what lies below: the ends onto the stretched middle.
+    item->setImageFile(0, pictures.write("left.png", QSize(4, 24), QColor(255, 0, 255)));
+    item->setImageFile(1, pictures.write("middle.png", QSize(10, 24), QColor(255, 255, 0)));
+    item->setImageFile(2, pictures.write("right.png", QSize(4, 24), QColor(0, 255, 255)));
+    item->resize(300, 24);
+    item->setCaption(QString());
+    EXPECT_EQ(item->size(), QSize(14, 24)) << "left width + caption width + middle width";
+    EXPECT_EQ(pixel(*item, 2, 5), platform::rgb(255, 0, 0));
+    EXPECT_EQ(pixel(*item, 6, 5), platform::rgb(255, 255, 0));
+    EXPECT_EQ(pixel(*item, 12, 5), platform::rgb(0, 255, 0));
+    EXPECT_TRUE(item->mask().isEmpty());
+
+    // Now narrower than twice its height: the next Redraw widens it again first.
+    item->Redraw();
+    EXPECT_EQ(item->width(), 48);
+
+    // Hovering draws on light grey (and narrows the item once more).
+    QTest::mouseMove(item, QPoint(2, 5));
+    EXPECT_TRUE(item->hovering());
+    EXPECT_EQ(item->width(), 14);
+    EXPECT_EQ(pixel(*item, 2, 5), platform::rgb(192, 0, 0)) << "the pieces ANDed on light grey";
+}
+
+TEST_F(SubMenu, clickRaisesClickedBeforeMouseOutAndUndoesActive)
+{
+    QObject::connect(item, &skSubMenu::Clicked, item, [this] { item->setActive(true); });
+    QTest::mouseMove(item, QPoint(100, 10));
+    QTest::mouseClick(item, Qt::LeftButton, {}, QPoint(100, 10));
+    EXPECT_EQ(events, (QStringList { "MouseIn", "MouseUp", "Clicked", "MouseOut" }));
+    EXPECT_FALSE(item->Active());
+    EXPECT_FALSE(item->hovering());
+    EXPECT_EQ(pixel(*item, 100, 10), Fill);
+
+    // Moving on inside hovers again; leaving gives the pointer back.
+    QTest::mouseMove(item, QPoint(101, 11));
+    QTest::mouseMove(&form, QPoint(300, 200));
+    QTest::mouseMove(&form, QPoint(301, 201));
+    EXPECT_EQ(events.mid(4), (QStringList { "MouseIn", "MouseOut" }));
+    EXPECT_EQ(platform::capturedWidget(), nullptr);
+}
+
+TEST_F(SubMenu, leavingWithTheButtonHeldKeepsTheCapture)
+{
+    QTest::mouseMove(item, QPoint(100, 10));
+    QTest::mousePress(item, Qt::LeftButton, {}, QPoint(100, 10));
+    QTest::mouseMove(item, QPoint(250, 200));
+    EXPECT_EQ(events, (QStringList { "MouseIn", "MouseOut" }));
+    EXPECT_EQ(platform::capturedWidget(), item);
+    QTest::mouseRelease(item, Qt::LeftButton, {}, QPoint(250, 200));
+    EXPECT_EQ(events.last(), QStringLiteral("MouseUp"));
+    EXPECT_EQ(platform::capturedWidget(), nullptr);
+}
+
+TEST_F(SubMenu, imageFileIgnoresBadIndicesAndDoesNotReloadTheSamePath)
+{
+    zelctl::test::PictureFolder pictures;
+    const QString left = pictures.write("left.png", QSize(10, 20), QColor(255, 0, 0));
+    item->setImageFile(4, left);
+    item->setImageFile(QStringLiteral("um"), left);
+    EXPECT_EQ(item->ImageFile(4), QString());
+    item->setImageFile(QStringLiteral("0"), left);
+    EXPECT_EQ(item->ImageFile(0), left);
+
+    // The file changes on disk; the same path keeps the picture already loaded.
+    pictures.write("left.png", QSize(10, 20), QColor(0, 255, 0));
+    item->setImageFile(0, left);
+    item->Redraw();
+    EXPECT_EQ(pixel(*item, 2, 5), 0x0000FFu);
+
+    // A missing file leaves the slot empty: the arrow box again.
+    item->setImageFile(0, pictures.path("missing.gif"));
+    item->Redraw();
+    EXPECT_EQ(pixel(*item, 100, 10), Fill);
+}
+
+TEST_F(SubMenu, persistsEveryPropertyInOrderWithTheirReadDefaults)
+{
+    item->setCaption(QStringLiteral("Anexo A"));
+    item->setMargin(60);
+    const PropertyBag saved = item->Save();
+    EXPECT_EQ(saved.names(),
+        (QStringList { "ForeColor", "BackColor", "HoverForeColor", "HoverBackColor", "ActiveForeColor",
+            "ActiveBackColor", "Caption", "Margin", "TransparentBack" }));
+    EXPECT_EQ(saved.ReadProperty("ActiveBackColor").toUInt(), 0x7FD5E1u);
+
+    skSubMenu loaded(&form);
+    Ambient named;
+    named.DisplayName = QStringLiteral("skSubMenu3");
+    loaded.setAmbient(named);
+    loaded.Load(PropertyBag());
+    EXPECT_EQ(loaded.ActiveBackColor(), 0xE1D57Fu) << "a saved item without the value";
+    EXPECT_EQ(loaded.Caption(), QStringLiteral("skSubMenu3"));
+    EXPECT_EQ(loaded.TransparencyColor(), 0xFFFFFFu);
+
+    loaded.Load(saved);
+    EXPECT_EQ(loaded.Save(), saved);
+}
