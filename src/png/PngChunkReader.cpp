@@ -59,8 +59,7 @@ const char *parseHeader(const Chunk &chunk, Header &header, FileInfo &info)
         return reason::CompressionFlag;
     if (d[11] > 0)
         return reason::FilterFlag;
-    if (header.bitDepth != 1 && header.bitDepth != 2 && header.bitDepth != 4 && header.bitDepth != 8
-        && header.bitDepth != 16)
+    if (!header.validBitDepth())
         return reason::BitDepthFlag;
     if (header.colorType > 6 || header.colorType == 1 || header.colorType == 5)
         return reason::ColorTypeFlag;

@@ -46,6 +46,8 @@ std::optional<int32_t> sampleColor(const Header &header, const QByteArray &palet
         const auto *p = reinterpret_cast<const uint8_t *>(palette.constData()) + sample * 3;
         return int32_t(p[0] | p[1] << 8 | p[2] << 16);
     }
+    if (!header.validBitDepth())
+        return std::nullopt; // no valid header read yet
     int level = sample & 0xFF;
     if (header.bitDepth < 8) {
         const int maximum = (1 << header.bitDepth) - 1;

@@ -42,6 +42,10 @@ struct Header
     // Bits per pixel of the stream: 0 for a colour type the reader rejects.
     int streamBitsPerPixel() const;
     bool interlaced() const { return interlaceMethod == 1; }
+    bool validBitDepth() const
+    {
+        return bitDepth == 1 || bitDepth == 2 || bitDepth == 4 || bitDepth == 8 || bitDepth == 16;
+    }
 };
 
 // Pixels of a pass (0-6, or NonInterlacedPass) in one dimension.

@@ -351,7 +351,7 @@ QByteArray StdPNG::Palette() const
         return {};
     if (d->header.colorType == png::Indexed)
         return d->info.paletteBytes;
-    if (d->header.colorType != png::Grey)
+    if (d->header.colorType != png::Grey || !d->header.validBitDepth())
         return {};
     const int maximum = d->header.bitDepth >= 8 ? 255 : (1 << d->header.bitDepth) - 1;
     QByteArray ramp;
@@ -364,7 +364,7 @@ void StdPNG::setPalette(const QByteArray &palette)
 {
     png::Header &header = d->header;
     png::FileInfo &info = d->info;
-    if (d->hidden() || (header.colorType != png::Indexed && header.colorType != png::Grey))
+    if (d->hidden() || !header.validBitDepth() || (header.colorType != png::Indexed && header.colorType != png::Grey))
         return;
     if (palette.isEmpty()) {
         if (header.colorType == png::Indexed && info.transparentColor == -1) {
