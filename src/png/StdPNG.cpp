@@ -2,8 +2,10 @@
 
 #include "PngChunkReader.h"
 #include "PngDecoder.h"
+#include "PngProgressiveDisplay.h"
 #include "PngText.h"
 #include "platform/OleColor.h"
+#include "platform/gdi/Gdi.h"
 #include "stdPNGdata.h"
 
 #include <QFile>
@@ -14,6 +16,7 @@
 #include <zlib.h>
 
 #include <new>
+#include <optional>
 
 namespace zelctl {
 
@@ -211,14 +214,39 @@ bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool ma
     if (!imageData.CreateBitmap(header.width, header.height, bitCount, png::colorTable(header, info, bitCount)))
         return fail(png::reason::Bitmap);
 
+    std::optional<png::ProgressiveDisplay> display;
+    if (!(stateFlags & NoProgressiveTarget)) {
+        display.emplace(destinationDC, destinationHwnd, x, y, displayBackground);
+        if (!display->start(imageData)) {
+            display.reset();
+            stateFlags |= NoProgressiveTarget;
+        }
+    }
     png::DecodeObserver observer;
     observer.progress = [&](int percentage) { Q_EMIT q->Progress(percentage); };
+    if (display && (stateFlags & ScannerDisplay)) {
+        observer.rowsConverted = [&](qint32 first, qint32 count) { display->showRows(imageData, first, count); };
+    } else if (display) {
+        const bool fade = stateFlags & FadeInDisplay;
+        observer.passConverted = [&, fade](int pass) { display->showPass(imageData, pass, fade); };
+    }
     if (!png::decodeImage(header, info, options, stream.get(), streamLength, imageData.Bits(), observer))
         return fail(png::reason::Unfilter);
     if (!alive)
         return false;
+    display.reset();
     if (displayBackground != -1)
         png::applyConstantOpacity(imageData.Bits(), alphaBlendValue);
+
+    if (destinationDC && destinationHwnd)
+        stateFlags &= ~PropertiesHidden;
+    if ((stateFlags & NoProgressiveTarget) || !(stateFlags & DisplayBits)) {
+        // An image laid on a background already carries the opacity.
+        const quint8 opacity = displayBackground != -1 ? 255 : alphaBlendValue;
+        png::ProgressiveDisplay::paintWhole(imageData, destinationDC, destinationHwnd, x, y, opacity);
+    }
+    if (notOwnDC)
+        imageData.SetOwnDC(false);
     stateFlags = 0;
     return true;
 }
@@ -389,12 +417,12 @@ void StdPNG::setPalette(const QByteArray &palette)
 
 qint32 StdPNG::handle() const
 {
-    return 0;
+    return d->imageData.BitmapHandle();
 }
 
 qint32 StdPNG::hdc() const
 {
-    return 0;
+    return d->imageData.OwnDC();
 }
 
 bool StdPNG::HasOwnDC() const
@@ -405,6 +433,9 @@ bool StdPNG::HasOwnDC() const
 void StdPNG::setHasOwnDC(bool own)
 {
     d->notOwnDC = !own;
+    // A running load needs its DC for the progressive display; it applies the setting at the end.
+    if (d->stateFlags < LoadInProgress)
+        d->imageData.SetOwnDC(own);
 }
 
 qint32 StdPNG::TransparentStyle() const
@@ -438,6 +469,32 @@ const stdPNGdata &StdPNG::ImageData() const
     return d->imageData;
 }
 
-void StdPNG::Paint(qint32, qint32, qint32, qint32, qint32, qint32, qint32, qint32, qint32, qint32, quint8) { }
+void StdPNG::Paint(qint32 hdc, qint32 destX, qint32 destY, qint32 destCx, qint32 destCy, qint32 PngDC, qint32 pngX,
+    qint32 pngY, qint32 pngCx, qint32 pngCy, quint8 AlphaBlend)
+{
+    const stdPNGdata &image = d->imageData;
+    if (d->stateFlags >= LoadInProgress || !image.HasBitmap() || hdc == 0 || destCx < 0 || destCy < 0)
+        return;
+    const png::BitmapView bits = image.Bits();
+    destCx = destCx ? destCx : bits.width;
+    destCy = destCy ? destCy : bits.height;
+    pngCx = pngCx < 1 ? bits.width : pngCx;
+    pngCy = pngCy < 1 ? bits.height : pngCy;
+    const qint32 source = PngDC ? PngDC : image.OwnDC();
+    if (!source)
+        return;
+    const bool borrowed = source != image.OwnDC();
+    const gdi::HGDIOBJ previous = borrowed ? gdi::SelectObject(source, image.BitmapHandle()) : 0;
+    if (bits.bitCount == 32) {
+        gdi::BLENDFUNCTION blend;
+        blend.SourceConstantAlpha = AlphaBlend;
+        blend.AlphaFormat = gdi::AC_SRC_ALPHA;
+        gdi::AlphaBlend(hdc, destX, destY, destCx, destCy, source, pngX, pngY, pngCx, pngCy, blend);
+    } else {
+        gdi::StretchBlt(hdc, destX, destY, destCx, destCy, source, pngX, pngY, pngCx, pngCy, gdi::SRCCOPY);
+    }
+    if (borrowed && previous)
+        gdi::SelectObject(source, previous);
+}
 
 } // namespace zelctl

@@ -26,11 +26,19 @@ public:
     explicit stdPNGdata(QObject *parent = nullptr);
     ~stdPNGdata() override;
 
-    // Replaces the bitmap by a new one with all bytes 0; colours are 0x00RRGGBB entries for
-    // bit counts up to 8. False when the bitmap cannot be made.
+    // Replaces the bitmap by a new one with all bytes 0, selected into a new memory DC of its
+    // own; colours are 0x00RRGGBB entries for bit counts up to 8. False when the bitmap
+    // cannot be made.
     bool CreateBitmap(int32_t width, int32_t height, int bitCount, const std::vector<uint32_t> &colors);
+    // Releases the bitmap and its own DC.
     void ReleaseBitmap();
     bool HasBitmap() const;
+
+    // The bitmap handle, 0 without a bitmap; the own DC, 0 without one.
+    qint32 BitmapHandle() const;
+    qint32 OwnDC() const;
+    // Creates (selecting the bitmap) or deletes (deselecting it first) the own DC.
+    void SetOwnDC(bool own);
 
     png::BitmapView Bits() const;
     int BitCount() const;
