@@ -19,7 +19,8 @@ class stdPNGdata;
 // Loads a PNG file into a device-independent bitmap, reports the file's header and
 // ancillary data, and paints the bitmap into a device context. A load can show the image
 // on a caller's DC while it decodes (ProgessiveDisplay). Property reads give 0, "" or an
-// empty list while a load hides them (during the ProgessiveDisplay event of an opaque image).
+// empty list while a load hides them: an opaque image from its ProgessiveDisplay event to the
+// end of the load.
 class ZELCTL_EXPORT StdPNG : public QObject
 {
     Q_OBJECT
