@@ -49,6 +49,7 @@ Gallery::Gallery(QWidget *parent)
     addSection(QStringLiteral("NIB"), createNibSection());
     addSection(QStringLiteral("Escolha do país"), createCountrySection());
     addSection(QStringLiteral("Dicas e botões de informação"), createTipsSection());
+    addSection(QStringLiteral("Seleção"), createSelectionSection());
     // Last: which classes this build serves.
     addSection(QStringLiteral("Classes da biblioteca"), classList());
 }

@@ -9,3 +9,5 @@ QWidget *createNibSection();
 QWidget *createCountrySection();
 // Information, warning and error buttons with their balloon tips.
 QWidget *createTipsSection();
+// A selection of a few items with images, and the selection of an EU country.
+QWidget *createSelectionSection();
