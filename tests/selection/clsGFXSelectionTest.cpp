@@ -91,17 +91,27 @@ class SelectionTest : public ::testing::Test
 protected:
     void SetUp() override { frmSelector::setZoomStepInterval(0); }
 
-    // Runs SelectFrom with `user` acting on the shown dialog.
-    GFXResult select(const GFXSelection &s, const QList<GFXItem> &items, const std::function<void(QDialog &)> &user)
+    // Runs `call` with `user` acting on each dialog it shows.
+    template <typename Call> auto driven(const std::function<void(QDialog &)> &user, Call call)
     {
         test::ModalDriver driver([&](QDialog &dialog) {
             dialog.show();
             user(dialog);
             return dialog.result();
         });
-        const GFXResult result = selection.SelectFrom(s, items);
+        auto answer = call();
         shown = driver.shownCount();
-        return result;
+        return answer;
+    }
+
+    GFXResult select(const GFXSelection &s, const QList<GFXItem> &items, const std::function<void(QDialog &)> &user)
+    {
+        return driven(user, [&] { return selection.SelectFrom(s, items); });
+    }
+
+    QString selectCountry(GSEL_CountryFilterList mode, QString &filter, const std::function<void(QDialog &)> &user)
+    {
+        return driven(user, [&] { return selection.SelectCountry({}, mode, filter); });
     }
 
     clsGFXSelection selection;
@@ -318,21 +328,7 @@ TEST(SelectionClass, isCreatedByNameAndCalledLateBound)
     EXPECT_EQ(selection.SelectFreguesia(QStringLiteral("Sintra")), "");
 }
 
-class SelectCountryTest : public SelectionTest
-{
-protected:
-    QString selectCountry(GSEL_CountryFilterList mode, QString &filter, const std::function<void(QDialog &)> &user)
-    {
-        test::ModalDriver driver([&](QDialog &dialog) {
-            dialog.show();
-            user(dialog);
-            return dialog.result();
-        });
-        const QString code = selection.SelectCountry({}, mode, filter);
-        shown = driver.shownCount();
-        return code;
-    }
-};
+using SelectCountryTest = SelectionTest;
 
 TEST_F(SelectCountryTest, onlyPortugalNeedsNoDialog)
 {
