@@ -52,6 +52,7 @@ Gallery::Gallery(QWidget *parent)
     addSection(QStringLiteral("Sujeito da declaração"), createSubjectSection());
     addSection(QStringLiteral("NIF"), createNifSection());
     addSection(QStringLiteral("Controlos com skin"), createSkinsSection());
+    addSection(QStringLiteral("Seleção"), createSelectionSection());
     // Last: which classes this build serves.
     addSection(QStringLiteral("Classes da biblioteca"), classList());
 }

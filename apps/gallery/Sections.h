@@ -16,3 +16,5 @@ QWidget *createNifSection();
 // Skinned navigation buttons with tips, number badges, a sub-menu, a frame, a growing
 // panel and a slide-open panel.
 QWidget *createSkinsSection();
+// A selection of a few items with images, and the selection of an EU country.
+QWidget *createSelectionSection();

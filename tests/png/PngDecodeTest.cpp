@@ -1,0 +1,254 @@
+#include "PngPixels.h"
+#include "PngTestFiles.h"
+
+#include <QSignalSpy>
+
+#include <gtest/gtest.h>
+
+using namespace zelctl;
+using namespace zelctl::test;
+
+namespace {
+
+struct Format
+{
+    int colorType;
+    int bitDepth;
+};
+
+const Format formats[] = {
+    { 0, 1 }, { 0, 2 }, { 0, 4 }, { 0, 8 }, { 0, 16 }, { 2, 8 }, { 2, 16 }, { 3, 1 }, { 3, 2 }, { 3, 4 },
+    { 3, 8 }, { 4, 8 }, { 4, 16 }, { 6, 8 }, { 6, 16 },
+};
+
+const std::pair<int, int> sizes[] = { { 1, 1 }, { 1, 9 }, { 9, 1 }, { 7, 17 }, { 13, 5 }, { 33, 17 }, { 20, 40 } };
+
+std::string describe(const ImageSpec &spec)
+{
+    return "type " + std::to_string(spec.colorType) + " depth " + std::to_string(spec.bitDepth) + " "
+        + std::to_string(spec.width) + "x" + std::to_string(spec.height) + (spec.interlaced ? " interlaced" : "")
+        + (spec.withTransparency ? " tRNS" : "");
+}
+
+// Compares every pixel of StdPNG's bitmap with libpng's reading under the bitmap's rules:
+// premultiplied and truncated alpha in 32 bits, transparent pixels all zero.
+void expectSamePixels(const ImageSpec &spec, bool make32)
+{
+    const QByteArray file = writeWithLibpng(spec);
+    int width = 0;
+    int height = 0;
+    const std::vector<uint8_t> expected = readWithLibpng(file, width, height);
+
+    StdPNG image;
+    image.setTransparentStyle(StdPNG::alphaTransparent);
+    ASSERT_TRUE(image.LoadData(file, true, make32)) << describe(spec) << ": " << image.FailureReason().toStdString();
+    ASSERT_EQ(image.Width(), width);
+    ASSERT_EQ(image.Height(), height);
+    const bool alpha = image.BitCount_BMP() == 32;
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x) {
+            const uint8_t *rgba = expected.data() + (size_t(y) * size_t(width) + size_t(x)) * 4;
+            std::array<uint8_t, 4> want = { rgba[2], rgba[1], rgba[0], 255 };
+            if (alpha) {
+                const unsigned a = rgba[3];
+                want = { uint8_t(rgba[2] * a / 255), uint8_t(rgba[1] * a / 255), uint8_t(rgba[0] * a / 255),
+                    uint8_t(a) };
+            }
+            ASSERT_EQ(bitmapPixel(image, x, y), want) << describe(spec) << " at " << x << "," << y;
+        }
+    }
+}
+
+} // namespace
+
+TEST(PngDecode, matchesLibpngForEveryFormatSizeAndInterlacing)
+{
+    uint32_t seed = 1;
+    for (const Format &format : formats) {
+        for (const auto &[width, height] : sizes) {
+            for (const bool interlaced : { false, true }) {
+                ImageSpec spec { width, height, format.colorType, format.bitDepth, interlaced, false, seed++ };
+                expectSamePixels(spec, false);
+                if (format.colorType <= 3) {
+                    spec.withTransparency = true;
+                    expectSamePixels(spec, false);
+                }
+            }
+        }
+    }
+}
+
+TEST(PngDecode, matchesLibpngInThirtyTwoBits)
+{
+    uint32_t seed = 500;
+    for (const Format &format : formats) {
+        for (const bool interlaced : { false, true })
+            expectSamePixels({ 11, 19, format.colorType, format.bitDepth, interlaced, false, seed++ }, true);
+    }
+}
+
+TEST(PngDecode, choosesTheBitmapFormatOfEachImage)
+{
+    struct Row
+    {
+        Format format;
+        bool transparency;
+        int bitCount;
+        size_t tableSize;
+    };
+    const Row rows[] = {
+        { { 0, 1 }, false, 1, 2 },
+        { { 0, 2 }, false, 4, 4 },
+        { { 0, 4 }, false, 4, 16 },
+        { { 0, 8 }, false, 8, 256 },
+        { { 0, 16 }, false, 8, 256 },
+        { { 3, 1 }, false, 1, 2 },
+        { { 3, 2 }, false, 4, 4 },
+        { { 3, 4 }, false, 4, 16 },
+        { { 3, 8 }, false, 8, 256 },
+        { { 2, 8 }, false, 24, 0 },
+        { { 2, 16 }, false, 24, 0 },
+        { { 6, 8 }, false, 32, 0 },
+        { { 4, 16 }, false, 32, 0 },
+        { { 3, 4 }, true, 32, 0 },
+        { { 0, 8 }, true, 32, 0 },
+        { { 2, 8 }, true, 32, 0 },
+    };
+    for (const Row &row : rows) {
+        StdPNG image;
+        image.setTransparentStyle(StdPNG::alphaTransparent);
+        const ImageSpec spec { 10, 3, row.format.colorType, row.format.bitDepth, false, row.transparency, 7 };
+        ASSERT_TRUE(image.LoadData(writeWithLibpng(spec))) << describe(spec);
+        EXPECT_EQ(image.BitCount_BMP(), row.bitCount) << describe(spec);
+        EXPECT_EQ(image.ImageData().ColorTable().size(), row.tableSize) << describe(spec);
+        EXPECT_EQ(image.ScanLineWidth(), ((10 * row.bitCount + 31) & ~31) / 8) << describe(spec);
+    }
+}
+
+TEST(PngDecode, showsTwoBitGreyThroughFourLevels)
+{
+    StdPNG image;
+    ASSERT_TRUE(image.LoadData(writeWithLibpng({ 4, 1, 0, 2, false, false, 3 })));
+    const std::vector<uint32_t> expected = { 0x000000, 0x555555, 0xAAAAAA, 0xFFFFFF };
+    EXPECT_EQ(image.ImageData().ColorTable(), expected);
+    EXPECT_EQ(image.Palette(), QByteArray::fromHex("000000555555aaaaaaffffff"));
+}
+
+TEST(PngDecode, premultipliesSixteenBitRgbaFromTheFirstBytes)
+{
+    // One pixel R 0xFFFF, G 0x0000, B 0x8000, A 0x8000.
+    const QByteArray rows = QByteArray::fromHex("00" "ffff" "0000" "8000" "8000");
+    const QByteArray file = signature() + ihdr(1, 1, 16, 6) + chunk("IDAT", deflate(rows)) + chunk("IEND", {});
+    StdPNG image;
+    image.setTransparentStyle(StdPNG::alphaTransparent);
+    ASSERT_TRUE(image.LoadData(file));
+    EXPECT_EQ(bitmapPixel(image, 0, 0), (std::array<uint8_t, 4> { 0x40, 0x00, 0x80, 0x80 }));
+}
+
+TEST(PngDecode, leavesPaletteEntriesWithAlphaZeroAllZero)
+{
+    QByteArray palette;
+    for (int i = 0; i < 8; ++i)
+        palette += QByteArray::fromHex("ff8040");
+    const QByteArray trns = QByteArray::fromHex("ffffffffff00");
+    const QByteArray rows = QByteArray::fromHex("00" "0501");
+    const QByteArray file = signature() + ihdr(2, 1, 8, 3) + chunk("PLTE", palette) + chunk("tRNS", trns)
+        + chunk("IDAT", deflate(rows)) + chunk("IEND", {});
+    StdPNG image;
+    image.setTransparentStyle(StdPNG::alphaTransparent);
+    ASSERT_TRUE(image.LoadData(file));
+    EXPECT_EQ(bitmapPixel(image, 0, 0), (std::array<uint8_t, 4> { 0, 0, 0, 0 }));
+    EXPECT_EQ(bitmapPixel(image, 1, 0), (std::array<uint8_t, 4> { 0x40, 0x80, 0xff, 0xff }));
+}
+
+TEST(PngDecode, restoresEveryFilterType)
+{
+    // Two rows of two RGB pixels per filter type, filtered by hand from known values.
+    const QByteArray first = QByteArray::fromHex("102030405060");
+    const QByteArray second = QByteArray::fromHex("11213141f0f0");
+    const auto filtered = [&](int type) {
+        QByteArray rows;
+        QByteArray previous(6, '\0');
+        for (const QByteArray &row : { first, second }) {
+            rows.append(char(type));
+            for (int i = 0; i < 6; ++i) {
+                const int a = i >= 3 ? uint8_t(row[i - 3]) : 0;
+                const int b = uint8_t(previous[i]);
+                const int c = i >= 3 ? uint8_t(previous[i - 3]) : 0;
+                int predictor = 0;
+                switch (type) {
+                case 1:
+                    predictor = a;
+                    break;
+                case 2:
+                    predictor = b;
+                    break;
+                case 3:
+                    predictor = (a + b) / 2;
+                    break;
+                case 4: {
+                    const int p = a + b - c;
+                    const int pa = std::abs(p - a), pb = std::abs(p - b), pc = std::abs(p - c);
+                    predictor = pa <= pb && pa <= pc ? a : pb <= pc ? b : c;
+                    break;
+                }
+                }
+                rows.append(char(uint8_t(row[i]) - predictor));
+            }
+            previous = row;
+        }
+        return rows;
+    };
+    for (int type = 0; type <= 4; ++type) {
+        const QByteArray file = signature() + ihdr(2, 2, 8, 2) + chunk("IDAT", deflate(filtered(type)))
+            + chunk("IEND", {});
+        StdPNG image;
+        ASSERT_TRUE(image.LoadData(file)) << "filter " << type;
+        EXPECT_EQ(bitmapPixel(image, 1, 0), (std::array<uint8_t, 4> { 0x60, 0x50, 0x40, 255 })) << "filter " << type;
+        EXPECT_EQ(bitmapPixel(image, 1, 1), (std::array<uint8_t, 4> { 0xf0, 0xf0, 0x41, 255 })) << "filter " << type;
+    }
+}
+
+TEST(PngDecode, failsOnAnUnknownFilterType)
+{
+    StdPNG image;
+    EXPECT_FALSE(image.LoadData(greyFile(4, 4, {}, 5)));
+    EXPECT_EQ(image.handle(), 0);
+    EXPECT_EQ(image.BitCount_BMP(), 0);
+    EXPECT_TRUE(image.LoadData(greyFile(4, 4, {}, 4)));
+}
+
+TEST(PngDecode, refusesAStreamShorterThanTheHeaderPromises)
+{
+    QByteArray rows;
+    for (int y = 0; y < 3; ++y)
+        rows += QByteArray(1, '\0') + QByteArray(4, char(y));
+    const QByteArray file = signature() + ihdr(4, 4, 8, 0) + chunk("IDAT", deflate(rows)) + chunk("IEND", {});
+    StdPNG image;
+    EXPECT_FALSE(image.LoadData(file));
+    EXPECT_EQ(image.ImageData().HasBitmap(), false);
+}
+
+TEST(PngDecode, refusesColorTypesWithBitDepthsPngDoesNotHave)
+{
+    // The header check lets RGB at 1 bit through; the decoder must still refuse it.
+    const QByteArray file = signature() + ihdr(8, 1, 1, 2) + chunk("IDAT", deflate(QByteArray(4, '\0')))
+        + chunk("IEND", {});
+    StdPNG image;
+    EXPECT_FALSE(image.LoadData(file));
+    EXPECT_EQ(image.FailureReason(), "Invalid combination of color type and bit depth.");
+}
+
+TEST(PngDecode, reportsProgressAfterEachSixteenRowsAndAtTheEnd)
+{
+    StdPNG image;
+    QList<int> values;
+    QObject::connect(&image, &StdPNG::Progress, [&](qint32 p) { values.append(p); });
+    ASSERT_TRUE(image.LoadData(greyFile(3, 40)));
+    EXPECT_EQ(values, (QList<int> { 0, 16 * 100 / 40, 32 * 100 / 40, 100 }));
+
+    // A one-pixel-wide interlaced image has pixels in passes 1, 3, 5 and 7 only.
+    values.clear();
+    ASSERT_TRUE(image.LoadData(writeWithLibpng({ 1, 8, 0, 8, true, false, 1 })));
+    EXPECT_EQ(values, (QList<int> { 0, 1 * 100 / 7, 3 * 100 / 7, 5 * 100 / 7, 100 }));
+}

@@ -1,0 +1,221 @@
+#include "PngTestFiles.h"
+
+#include <png.h>
+#include <zlib.h>
+
+#include <cstring>
+#include <stdexcept>
+
+namespace zelctl::test {
+
+namespace {
+
+uint32_t nextRandom(uint32_t &state)
+{
+    state = state * 1664525u + 1013904223u;
+    return state >> 8;
+}
+
+void appendToBuffer(png_structp png, png_bytep data, png_size_t length)
+{
+    static_cast<QByteArray *>(png_get_io_ptr(png))->append(reinterpret_cast<const char *>(data), qsizetype(length));
+}
+
+struct ReadCursor
+{
+    const QByteArray *file;
+    qsizetype position = 0;
+};
+
+void readFromBuffer(png_structp png, png_bytep data, png_size_t length)
+{
+    auto *cursor = static_cast<ReadCursor *>(png_get_io_ptr(png));
+    if (cursor->file->size() - cursor->position < qsizetype(length))
+        png_error(png, "read past the end");
+    std::memcpy(data, cursor->file->constData() + cursor->position, length);
+    cursor->position += qsizetype(length);
+}
+
+int channels(int colorType)
+{
+    switch (colorType) {
+    case PNG_COLOR_TYPE_RGB:
+        return 3;
+    case PNG_COLOR_TYPE_GRAY_ALPHA:
+        return 2;
+    case PNG_COLOR_TYPE_RGB_ALPHA:
+        return 4;
+    default:
+        return 1;
+    }
+}
+
+} // namespace
+
+QByteArray writeWithLibpng(const ImageSpec &spec)
+{
+    QByteArray out;
+    png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
+    png_infop info = png_create_info_struct(png);
+    if (setjmp(png_jmpbuf(png))) {
+        png_destroy_write_struct(&png, &info);
+        throw std::runtime_error("libpng could not write the test image");
+    }
+    png_set_write_fn(png, &out, appendToBuffer, nullptr);
+    png_set_filter(png, PNG_FILTER_TYPE_BASE, PNG_ALL_FILTERS);
+    png_set_IHDR(png, info, png_uint_32(spec.width), png_uint_32(spec.height), spec.bitDepth, spec.colorType,
+        spec.interlaced ? PNG_INTERLACE_ADAM7 : PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_BASE, PNG_FILTER_TYPE_BASE);
+
+    uint32_t state = spec.seed;
+    const int maximum = (1 << spec.bitDepth) - 1;
+    const int entries = spec.colorType == PNG_COLOR_TYPE_PALETTE ? 1 << spec.bitDepth : 0;
+    std::vector<png_color> palette(static_cast<size_t>(entries));
+    for (png_color &c : palette)
+        c = { png_byte(nextRandom(state)), png_byte(nextRandom(state)), png_byte(nextRandom(state)) };
+    if (entries)
+        png_set_PLTE(png, info, palette.data(), entries);
+
+    const int samples = channels(spec.colorType);
+    std::vector<std::vector<int>> pixels(size_t(spec.height), std::vector<int>(size_t(spec.width * samples)));
+    for (auto &row : pixels) {
+        for (int &sample : row)
+            sample = int(nextRandom(state) % uint32_t(maximum + 1));
+    }
+    // Plenty of pixels repeat the first one, so colour keys match more than once.
+    for (int y = 0; y < spec.height; ++y) {
+        for (int x = 0; x < spec.width; ++x) {
+            if ((x + y) % 3 == 0)
+                std::copy_n(pixels[0].begin(), samples, pixels[size_t(y)].begin() + x * samples);
+        }
+    }
+
+    std::vector<png_byte> alphas;
+    png_color_16 key {};
+    if (spec.withTransparency) {
+        if (spec.colorType == PNG_COLOR_TYPE_PALETTE) {
+            alphas.resize(size_t(std::max(1, entries / 2 + 1)));
+            for (size_t i = 0; i < alphas.size(); ++i)
+                alphas[i] = png_byte(i % 3 == 0 ? 0 : nextRandom(state));
+            png_set_tRNS(png, info, alphas.data(), int(alphas.size()), nullptr);
+        } else if (spec.colorType == PNG_COLOR_TYPE_GRAY) {
+            key.gray = png_uint_16(pixels[0][0]);
+            png_set_tRNS(png, info, nullptr, 0, &key);
+        } else if (spec.colorType == PNG_COLOR_TYPE_RGB) {
+            key.red = png_uint_16(pixels[0][0]);
+            key.green = png_uint_16(pixels[0][1]);
+            key.blue = png_uint_16(pixels[0][2]);
+            png_set_tRNS(png, info, nullptr, 0, &key);
+        }
+    }
+    png_write_info(png, info);
+
+    const size_t rowBytes = png_get_rowbytes(png, info);
+    std::vector<std::vector<png_byte>> rows(size_t(spec.height), std::vector<png_byte>(rowBytes));
+    for (int y = 0; y < spec.height; ++y) {
+        png_byte *row = rows[size_t(y)].data();
+        for (int i = 0; i < spec.width * samples; ++i) {
+            const int value = pixels[size_t(y)][size_t(i)];
+            if (spec.bitDepth == 16) {
+                row[2 * i] = png_byte(value >> 8);
+                row[2 * i + 1] = png_byte(value);
+            } else if (spec.bitDepth == 8) {
+                row[i] = png_byte(value);
+            } else {
+                const int perByte = 8 / spec.bitDepth;
+                const int shift = 8 - spec.bitDepth * (i % perByte + 1);
+                row[i / perByte] = png_byte(row[i / perByte] | value << shift);
+            }
+        }
+    }
+    std::vector<png_bytep> pointers;
+    for (auto &row : rows)
+        pointers.push_back(row.data());
+    png_write_image(png, pointers.data());
+    png_write_end(png, nullptr);
+    png_destroy_write_struct(&png, &info);
+    return out;
+}
+
+std::vector<uint8_t> readWithLibpng(const QByteArray &file, int &width, int &height)
+{
+    ReadCursor cursor { &file };
+    png_structp png = png_create_read_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
+    png_infop info = png_create_info_struct(png);
+    if (setjmp(png_jmpbuf(png))) {
+        png_destroy_read_struct(&png, &info, nullptr);
+        throw std::runtime_error("libpng could not read the test image");
+    }
+    png_set_read_fn(png, &cursor, readFromBuffer);
+    png_read_info(png, info);
+    png_set_expand(png);
+    png_set_strip_16(png);
+    png_set_gray_to_rgb(png);
+    png_set_add_alpha(png, 0xFF, PNG_FILLER_AFTER);
+    png_set_interlace_handling(png);
+    png_read_update_info(png, info);
+    width = int(png_get_image_width(png, info));
+    height = int(png_get_image_height(png, info));
+    std::vector<uint8_t> pixels(size_t(width) * size_t(height) * 4);
+    std::vector<png_bytep> rows;
+    for (int y = 0; y < height; ++y)
+        rows.push_back(pixels.data() + size_t(y) * size_t(width) * 4);
+    png_read_image(png, rows.data());
+    png_read_end(png, nullptr);
+    png_destroy_read_struct(&png, &info, nullptr);
+    return pixels;
+}
+
+QByteArray be32(uint32_t value)
+{
+    const char bytes[4] = { char(value >> 24), char(value >> 16), char(value >> 8), char(value) };
+    return QByteArray(bytes, 4);
+}
+
+QByteArray chunkWithCrc(const char *type, const QByteArray &data, uint32_t crc)
+{
+    return be32(uint32_t(data.size())) + QByteArray(type, 4) + data + be32(crc);
+}
+
+QByteArray chunk(const char *type, const QByteArray &data)
+{
+    const QByteArray typeAndData = QByteArray(type, 4) + data;
+    const uLong crc = crc32(0, reinterpret_cast<const Bytef *>(typeAndData.constData()), uInt(typeAndData.size()));
+    return chunkWithCrc(type, data, uint32_t(crc));
+}
+
+QByteArray signature()
+{
+    return QByteArray("\x89PNG\r\n\x1a\n", 8);
+}
+
+QByteArray ihdr(int width, int height, int bitDepth, int colorType, int interlace, int compression, int filter)
+{
+    QByteArray data = be32(uint32_t(width)) + be32(uint32_t(height));
+    data.append(char(bitDepth)).append(char(colorType)).append(char(compression)).append(char(filter));
+    data.append(char(interlace));
+    return chunk("IHDR", data);
+}
+
+QByteArray deflate(const QByteArray &rows)
+{
+    uLongf length = compressBound(uLong(rows.size()));
+    QByteArray out(qsizetype(length), '\0');
+    compress(reinterpret_cast<Bytef *>(out.data()), &length, reinterpret_cast<const Bytef *>(rows.constData()),
+        uLong(rows.size()));
+    out.truncate(qsizetype(length));
+    return out;
+}
+
+QByteArray greyFile(int width, int height, const QByteArray &extraChunks, uint8_t filter)
+{
+    QByteArray rows;
+    for (int y = 0; y < height; ++y) {
+        rows.append(char(filter));
+        for (int x = 0; x < width; ++x)
+            rows.append(char(y + x));
+    }
+    return signature() + ihdr(width, height, 8, 0) + extraChunks + chunk("IDAT", deflate(rows))
+        + chunk("IEND", {});
+}
+
+} // namespace zelctl::test

@@ -1,0 +1,53 @@
+#pragma once
+
+#include <QByteArray>
+#include <QString>
+
+#include <cstdint>
+#include <ostream>
+#include <vector>
+
+inline void PrintTo(const QString &text, std::ostream *out)
+{
+    *out << '"' << text.toStdString() << '"';
+}
+
+// Builders of PNG files for the tests: with libpng (a second, independent writer and
+// reader), and chunk by chunk for the malformed files libpng refuses to write.
+namespace zelctl::test {
+
+struct ImageSpec
+{
+    int width = 1;
+    int height = 1;
+    int colorType = 2;
+    int bitDepth = 8;
+    bool interlaced = false;
+    bool withTransparency = false;
+    uint32_t seed = 1;
+};
+
+// A file written by libpng with deterministic pseudo-random samples (every filter allowed).
+// Keyed images use the first pixel as their key, so some pixels match it; palette images
+// get fewer tRNS entries than palette entries, some of them 0.
+QByteArray writeWithLibpng(const ImageSpec &spec);
+
+// Straight (not premultiplied) R, G, B, A per pixel as libpng reads the file, with 16-bit
+// samples cut to their first byte, low bit depths scaled to 8 bits and tRNS as alpha.
+std::vector<uint8_t> readWithLibpng(const QByteArray &file, int &width, int &height);
+
+// One chunk: length, type, data and a CRC over type and data.
+QByteArray chunk(const char *type, const QByteArray &data);
+QByteArray chunkWithCrc(const char *type, const QByteArray &data, uint32_t crc);
+QByteArray signature();
+QByteArray ihdr(int width, int height, int bitDepth, int colorType, int interlace = 0, int compression = 0,
+    int filter = 0);
+// IDAT data: the rows (each starting with its filter byte) deflated.
+QByteArray deflate(const QByteArray &rows);
+QByteArray be32(uint32_t value);
+
+// A complete grey 8-bit file of width × height pixels whose row y holds the value y + x,
+// every row with filter type `filter` (0 gives the stored values).
+QByteArray greyFile(int width, int height, const QByteArray &extraChunks = {}, uint8_t filter = 0);
+
+} // namespace zelctl::test
