@@ -12,5 +12,6 @@ struct Command
     int (*run)(const QStringList &args, QTextStream &out, QTextStream &err);
 };
 
+int runGifInfo(const QStringList &args, QTextStream &out, QTextStream &err);
 int runClasses(const QStringList &args, QTextStream &out, QTextStream &err);
 int runNib(const QStringList &args, QTextStream &out, QTextStream &err);

@@ -11,6 +11,7 @@ namespace {
 const std::array commands = {
     Command { "classes", "zelctl classes", runClasses },
     Command { "nib", "zelctl nib NUMBER", runNib },
+    Command { "gif-info", "zelctl gif-info [--hash] FILE", runGifInfo },
 };
 
 void printUsage(QTextStream &stream)
