@@ -1,0 +1,82 @@
+#include "Shapes.h"
+
+#include <algorithm>
+#include <cstdlib>
+
+namespace zelctl::gdi::detail {
+
+Coverage::Coverage(const QRect &bounds)
+    : m_bounds(bounds)
+{ }
+
+void Coverage::mark(int x, int y)
+{
+    if (m_bounds.contains(x, y))
+        m_points.emplace_back(y, x);
+}
+
+void Coverage::addPoint(int x, int y)
+{
+    mark(x, y);
+}
+
+void Coverage::addDot(int x, int y, int diameter)
+{
+    if (diameter <= 1) {
+        mark(x, y);
+        return;
+    }
+    // In half-pixel units: pixel centres are odd, the circle's centre is odd for an odd
+    // diameter (a pixel centre) and even for an even one (a pixel corner).
+    const qint64 odd = diameter & 1;
+    const qint64 cx = 2 * qint64(x) + odd, cy = 2 * qint64(y) + odd;
+    const qint64 limit = qint64(diameter) * diameter;
+    const int reach = diameter / 2 + 1;
+    const int top = std::max(y - reach, m_bounds.top()), bottom = std::min(y + reach, m_bounds.bottom());
+    const int left = std::max(x - reach, m_bounds.left()), right = std::min(x + reach, m_bounds.right());
+    for (int py = top; py <= bottom; ++py) {
+        const qint64 dy = 2 * qint64(py) + 1 - cy;
+        for (int px = left; px <= right; ++px) {
+            const qint64 dx = 2 * qint64(px) + 1 - cx;
+            if (dx * dx + dy * dy <= limit)
+                m_points.emplace_back(py, px);
+        }
+    }
+}
+
+void Coverage::addLine(int x0, int y0, int x1, int y1, int width)
+{
+    // Bresenham; the end point is left out so that joined lines meet without overlap.
+    const int dx = std::abs(x1 - x0), dy = -std::abs(y1 - y0);
+    const int sx = x0 < x1 ? 1 : -1, sy = y0 < y1 ? 1 : -1;
+    int error = dx + dy;
+    int x = x0, y = y0;
+    while (x != x1 || y != y1) {
+        addDot(x, y, width);
+        const int twice = 2 * error;
+        if (twice >= dy) {
+            error += dy;
+            x += sx;
+        }
+        if (twice <= dx) {
+            error += dx;
+            y += sy;
+        }
+    }
+}
+
+void Coverage::apply(const Surface &surface, quint32 value, PenMode mode) const
+{
+    std::vector<std::pair<int, int>> points = m_points;
+    std::sort(points.begin(), points.end());
+    points.erase(std::unique(points.begin(), points.end()), points.end());
+    // XOR leaves the alpha of a 32-bit pixel as it was.
+    const quint32 xorMask = surface.bpp == 32 ? value & 0xFFFFFFu : value;
+    for (const auto &[y, x] : points) {
+        uchar *row = surface.row(y);
+        const quint32 old = readPixel(row, x, surface.bpp);
+        writePixel(row, x, surface.bpp, mode == PenMode::Xor ? old ^ xorMask : value);
+    }
+}
+
+} // namespace zelctl::gdi::detail

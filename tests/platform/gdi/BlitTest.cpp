@@ -1,0 +1,322 @@
+#include "GdiTestSupport.h"
+
+#include <gtest/gtest.h>
+
+using namespace zelctl::gdi;
+using zelctl::gdi::test::TestBitmap;
+
+namespace {
+
+// A 24-bit row of pixel values, left to right.
+std::vector<quint32> rowOf(const TestBitmap &b, int y, int width)
+{
+    std::vector<quint32> values;
+    for (int x = 0; x < width; ++x)
+        values.push_back(b.rgb(x, y));
+    return values;
+}
+
+std::vector<quint32> columnOf(const TestBitmap &b, int x, int height)
+{
+    std::vector<quint32> values;
+    for (int y = 0; y < height; ++y)
+        values.push_back(b.rgb(x, y));
+    return values;
+}
+
+void setRow(TestBitmap &b, int y, std::initializer_list<quint32> values)
+{
+    int x = 0;
+    for (quint32 v : values)
+        b.setRgb(x++, y, v);
+}
+
+// Grey of one level, 0x00LLLLLL.
+constexpr quint32 grey(quint32 level)
+{
+    return level * 0x010101u;
+}
+
+using Values = std::vector<quint32>;
+
+} // namespace
+
+TEST(BitBlt, copiesAndCombinesPixelValues)
+{
+    TestBitmap src(3, 1, 24);
+    TestBitmap dst(3, 1, 24);
+    setRow(src, 0, { 0x3C3C3C, 0x3C3C3C, 0x0F0F0F });
+    setRow(dst, 0, { 0xF0F0F0, 0xF0F0F0, 0xF0F0F0 });
+    ASSERT_TRUE(BitBlt(dst.dc, 0, 0, 1, 1, src.dc, 0, 0, SRCAND));
+    ASSERT_TRUE(BitBlt(dst.dc, 1, 0, 1, 1, src.dc, 1, 0, SRCPAINT));
+    ASSERT_TRUE(BitBlt(dst.dc, 2, 0, 1, 1, src.dc, 2, 0, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 3), (Values { 0x303030, 0xFCFCFC, 0x0F0F0F }));
+
+    // 32 bits: the operations act on all four bytes, alpha included.
+    TestBitmap a(1, 1, 32);
+    TestBitmap b(1, 1, 32);
+    a.setArgb(0, 0, 0x80FFFF0F);
+    b.setArgb(0, 0, 0xFF00FFF0);
+    ASSERT_TRUE(BitBlt(b.dc, 0, 0, 1, 1, a.dc, 0, 0, SRCAND));
+    EXPECT_EQ(b.argb(0, 0), 0x8000FF00u);
+    ASSERT_TRUE(BitBlt(b.dc, 0, 0, 1, 1, a.dc, 0, 0, SRCPAINT));
+    EXPECT_EQ(b.argb(0, 0), 0x80FFFF0Fu);
+}
+
+TEST(BitBlt, convertsBetweenDepths)
+{
+    // 8 bits through the table into 24 and 32 bits (opaque).
+    TestBitmap indexed(3, 1, 8, false, { 0x000000, 0x102030, 0xFFFFFF });
+    indexed.row(0)[0] = 1, indexed.row(0)[1] = 2, indexed.row(0)[2] = 200; // 200: beyond the given entries
+    TestBitmap rgb(3, 1, 24);
+    TestBitmap argb(3, 1, 32);
+    ASSERT_TRUE(BitBlt(rgb.dc, 0, 0, 3, 1, indexed.dc, 0, 0, SRCCOPY));
+    ASSERT_TRUE(BitBlt(argb.dc, 0, 0, 3, 1, indexed.dc, 0, 0, SRCCOPY));
+    EXPECT_EQ(rowOf(rgb, 0, 3), (Values { 0x102030, 0xFFFFFF, 0x000000 }));
+    EXPECT_EQ(argb.argb(0, 0), 0xFF102030u);
+
+    // 32 to 24 drops alpha; 24 to 32 makes it opaque.
+    argb.setArgb(1, 0, 0x40ABCDEF);
+    ASSERT_TRUE(BitBlt(rgb.dc, 0, 0, 3, 1, argb.dc, 0, 0, SRCCOPY));
+    EXPECT_EQ(rgb.rgb(1, 0), 0xABCDEFu);
+    ASSERT_TRUE(BitBlt(argb.dc, 2, 0, 1, 1, rgb.dc, 1, 0, SRCCOPY));
+    EXPECT_EQ(argb.argb(2, 0), 0xFFABCDEFu);
+
+    // Colours into a table take the nearest entry.
+    TestBitmap palette(3, 1, 8, true, { 0x000000, 0xFF0000, 0x00FF00 });
+    setRow(rgb, 0, { 0xF01010, 0x10E010, 0x202020 });
+    ASSERT_TRUE(BitBlt(palette.dc, 0, 0, 3, 1, rgb.dc, 0, 0, SRCCOPY));
+    EXPECT_EQ(palette.row(0)[0], 1);
+    EXPECT_EQ(palette.row(0)[1], 2);
+    EXPECT_EQ(palette.row(0)[2], 0);
+
+    // 1-bit and 4-bit sources, packed from the high bits.
+    TestBitmap mono(3, 1, 1, true, { 0x000000, 0xFFFFFF });
+    mono.row(0)[0] = 0xA0; // 1 0 1
+    ASSERT_TRUE(BitBlt(rgb.dc, 0, 0, 3, 1, mono.dc, 0, 0, SRCCOPY));
+    EXPECT_EQ(rowOf(rgb, 0, 3), (Values { 0xFFFFFF, 0x000000, 0xFFFFFF }));
+    TestBitmap nibbles(3, 1, 4, true, { 0, 0x0000FF, 0x00FF00, 0xFF0000 });
+    nibbles.row(0)[0] = 0x32, nibbles.row(0)[1] = 0x10;
+    ASSERT_TRUE(BitBlt(rgb.dc, 0, 0, 3, 1, nibbles.dc, 0, 0, SRCCOPY));
+    EXPECT_EQ(rowOf(rgb, 0, 3), (Values { 0xFF0000, 0x00FF00, 0x0000FF }));
+
+    // Colours into a 1-bit mask: near black is 0, near white is 1.
+    setRow(rgb, 0, { 0x202020, 0xE0E0E0, 0x000000 });
+    ASSERT_TRUE(BitBlt(mono.dc, 0, 0, 3, 1, rgb.dc, 0, 0, SRCCOPY));
+    EXPECT_EQ(mono.row(0)[0] & 0xE0, 0x40);
+}
+
+TEST(BitBlt, tablesMapByColourUnlessTheyAreTheSame)
+{
+    TestBitmap src(2, 1, 4, true, { 0x000000, 0xFF0000 });
+    src.row(0)[0] = 0x10; // indices 1, 0
+    TestBitmap swapped(2, 1, 8, true, { 0xFF0000, 0x000000 });
+    ASSERT_TRUE(BitBlt(swapped.dc, 0, 0, 2, 1, src.dc, 0, 0, SRCCOPY));
+    EXPECT_EQ(swapped.row(0)[0], 0) << "red is entry 0 of the target";
+    EXPECT_EQ(swapped.row(0)[1], 1);
+
+    // Equal tables copy indices, even between duplicate entries.
+    TestBitmap twins(2, 1, 8, true, { 0x00FF00, 0x00FF00, 0x0000FF, 0x0000FF });
+    TestBitmap twinsToo(2, 1, 8, true, { 0x00FF00, 0x00FF00, 0x0000FF, 0x0000FF });
+    twins.row(0)[0] = 1, twins.row(0)[1] = 3;
+    ASSERT_TRUE(BitBlt(twinsToo.dc, 0, 0, 2, 1, twins.dc, 0, 0, SRCCOPY));
+    EXPECT_EQ(twinsToo.row(0)[0], 1);
+    EXPECT_EQ(twinsToo.row(0)[1], 3);
+
+    // Raster operations combine indices.
+    twinsToo.row(0)[0] = 0x0C;
+    twins.row(0)[0] = 0x03;
+    ASSERT_TRUE(BitBlt(twinsToo.dc, 0, 0, 1, 1, twins.dc, 0, 0, SRCPAINT));
+    EXPECT_EQ(twinsToo.row(0)[0], 0x0F);
+}
+
+TEST(BitBlt, drawsASpriteThroughAMaskWithAndThenOr)
+{
+    // The two-step transparent draw: the frame's indices with the transparent one white
+    // and the others black are ANDed (clearing where the frame is opaque), then the
+    // frame's own colours with the transparent entry black are ORed.
+    TestBitmap frame(3, 1, 8, true, { 0x000000, 0xFF0000, 0x0000FF });
+    frame.row(0)[0] = 0, frame.row(0)[1] = 1, frame.row(0)[2] = 2; // index 0 is transparent
+    TestBitmap canvas(3, 1, 24);
+    setRow(canvas, 0, { 0x00FF00, 0x00FF00, 0x00FF00 });
+
+    const RGBQUAD mask[3] = { rgbQuad(0xFFFFFF), rgbQuad(0), rgbQuad(0) };
+    RGBQUAD saved[3];
+    GetDIBColorTable(frame.dc, 0, 3, saved);
+    SetDIBColorTable(frame.dc, 0, 3, mask);
+    ASSERT_TRUE(BitBlt(canvas.dc, 0, 0, 3, 1, frame.dc, 0, 0, SRCAND));
+    SetDIBColorTable(frame.dc, 0, 3, saved);
+    ASSERT_TRUE(BitBlt(canvas.dc, 0, 0, 3, 1, frame.dc, 0, 0, SRCPAINT));
+    EXPECT_EQ(rowOf(canvas, 0, 3), (Values { 0x00FF00, 0xFF0000, 0x0000FF }));
+
+    // The same with a 1-bit mask bitmap, black and white.
+    TestBitmap maskBits(3, 1, 1, true, { 0x000000, 0xFFFFFF });
+    maskBits.row(0)[0] = 0x80; // white over the transparent pixel
+    setRow(canvas, 0, { 0x123456, 0x123456, 0x123456 });
+    ASSERT_TRUE(BitBlt(canvas.dc, 0, 0, 3, 1, maskBits.dc, 0, 0, SRCAND));
+    EXPECT_EQ(rowOf(canvas, 0, 3), (Values { 0x123456, 0, 0 }));
+}
+
+TEST(BitBlt, clipsAtEveryEdge)
+{
+    // src(x, y) = 10 * y + x + 1.
+    TestBitmap src(4, 4, 24);
+    for (int y = 0; y < 4; ++y)
+        for (int x = 0; x < 4; ++x)
+            src.setRgb(x, y, quint32(10 * y + x + 1));
+    TestBitmap dst(4, 4, 24, false);
+
+    // Target beyond the left and top edges.
+    ASSERT_TRUE(BitBlt(dst.dc, -1, -2, 4, 4, src.dc, 0, 0, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 4), (Values { 22, 23, 24, 0 }));
+    EXPECT_EQ(rowOf(dst, 1, 4), (Values { 32, 33, 34, 0 }));
+    EXPECT_EQ(rowOf(dst, 2, 4), (Values { 0, 0, 0, 0 }));
+
+    // Target beyond the right and bottom edges.
+    dst.fill(0, 4, 24);
+    ASSERT_TRUE(BitBlt(dst.dc, 2, 3, 4, 4, src.dc, 0, 0, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 3, 4), (Values { 0, 0, 1, 2 }));
+    EXPECT_EQ(rowOf(dst, 2, 4), (Values { 0, 0, 0, 0 }));
+
+    // Source beyond its left and top edges: only what exists is copied, in place.
+    dst.fill(0, 4, 24);
+    ASSERT_TRUE(BitBlt(dst.dc, 0, 0, 4, 4, src.dc, -2, -1, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 4), (Values { 0, 0, 0, 0 }));
+    EXPECT_EQ(rowOf(dst, 1, 4), (Values { 0, 0, 1, 2 }));
+    EXPECT_EQ(rowOf(dst, 3, 4), (Values { 0, 0, 21, 22 }));
+
+    // Source beyond its right and bottom edges.
+    dst.fill(0, 4, 24);
+    ASSERT_TRUE(BitBlt(dst.dc, 0, 0, 4, 4, src.dc, 3, 2, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 4), (Values { 24, 0, 0, 0 }));
+    EXPECT_EQ(rowOf(dst, 1, 4), (Values { 34, 0, 0, 0 }));
+    EXPECT_EQ(rowOf(dst, 2, 4), (Values { 0, 0, 0, 0 }));
+
+    // Entirely outside, and empty: nothing happens, which is not a failure.
+    dst.fill(7, 4, 24);
+    EXPECT_TRUE(BitBlt(dst.dc, 10, 0, 4, 4, src.dc, 0, 0, SRCCOPY));
+    EXPECT_TRUE(BitBlt(dst.dc, 0, 0, 4, 4, src.dc, -10, 0, SRCCOPY));
+    EXPECT_TRUE(BitBlt(dst.dc, 0, 0, 0, 4, src.dc, 0, 0, SRCCOPY));
+    EXPECT_TRUE(BitBlt(dst.dc, -2147483647, -2147483647, 2147483647, 2147483647, src.dc, 0, 0, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 4), (Values { 7, 7, 7, 7 }));
+    EXPECT_FALSE(StretchBlt(dst.dc, 0, 0, 2, 2, src.dc, 0, 0, 0, 2, SRCCOPY)) << "nothing to sample";
+}
+
+TEST(StretchBlt, negativeExtentsMirror)
+{
+    TestBitmap src(3, 2, 24);
+    setRow(src, 0, { 1, 2, 3 });
+    setRow(src, 1, { 4, 5, 6 });
+    TestBitmap dst(3, 2, 24);
+
+    // A negative width counts leftwards from its origin pixel.
+    ASSERT_TRUE(StretchBlt(dst.dc, 2, 0, -3, 2, src.dc, 0, 0, 3, 2, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 3), (Values { 3, 2, 1 }));
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 3, 2, src.dc, 2, 0, -3, 2, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 1, 3), (Values { 6, 5, 4 }));
+    ASSERT_TRUE(StretchBlt(dst.dc, 2, 0, -3, 2, src.dc, 2, 0, -3, 2, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 3), (Values { 1, 2, 3 })) << "two mirrors cancel";
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 1, 3, -2, src.dc, 0, 0, 3, 2, SRCCOPY));
+    EXPECT_EQ(columnOf(dst, 0, 2), (Values { 4, 1 }));
+
+    // In place, as frames are flipped within their own rectangle of a strip.
+    ASSERT_TRUE(StretchBlt(src.dc, 2, 0, -3, 1, src.dc, 0, 0, 3, 1, SRCCOPY));
+    EXPECT_EQ(rowOf(src, 0, 3), (Values { 3, 2, 1 }));
+    ASSERT_TRUE(StretchBlt(src.dc, 0, 1, 3, -2, src.dc, 0, 0, 3, 2, SRCCOPY));
+    EXPECT_EQ(rowOf(src, 0, 3), (Values { 4, 5, 6 }));
+    EXPECT_EQ(rowOf(src, 1, 3), (Values { 3, 2, 1 }));
+
+    // Packed pixels, in place, at an odd offset.
+    TestBitmap nibbles(5, 1, 4, true);
+    nibbles.row(0)[0] = 0x12, nibbles.row(0)[1] = 0x34, nibbles.row(0)[2] = 0x50;
+    ASSERT_TRUE(StretchBlt(nibbles.dc, 3, 0, -3, 1, nibbles.dc, 1, 0, 3, 1, SRCCOPY));
+    EXPECT_EQ(nibbles.row(0)[0], 0x14);
+    EXPECT_EQ(nibbles.row(0)[1], 0x32);
+    EXPECT_EQ(nibbles.row(0)[2], 0x50);
+}
+
+TEST(StretchBlt, nearestPixelScaling)
+{
+    TestBitmap src(3, 1, 24);
+    setRow(src, 0, { 10, 20, 30 });
+    TestBitmap dst(6, 2, 24);
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 6, 2, src.dc, 0, 0, 3, 1, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 6), (Values { 10, 10, 20, 20, 30, 30 }));
+    EXPECT_EQ(rowOf(dst, 1, 6), (Values { 10, 10, 20, 20, 30, 30 }));
+    // Shrinking takes the pixel under each target pixel's centre: 3 -> 2 samples 0 and 2.
+    dst.fill(0, 6, 24);
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 2, 1, src.dc, 0, 0, 3, 1, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 3), (Values { 10, 30, 0 }));
+    // Scaled and mirrored, with an OR.
+    setRow(dst, 0, { 1, 1, 1, 1, 1, 1 });
+    ASSERT_TRUE(StretchBlt(dst.dc, 5, 0, -6, 1, src.dc, 0, 0, 3, 1, SRCPAINT));
+    EXPECT_EQ(rowOf(dst, 0, 6), (Values { 31, 31, 21, 21, 11, 11 }));
+    // Stretched beyond the target: clipped after scaling.
+    ASSERT_TRUE(StretchBlt(dst.dc, -2, 0, 12, 1, src.dc, 0, 0, 3, 1, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 6), (Values { 10, 10, 20, 20, 20, 20 }));
+    // BLACKONWHITE is accepted and samples the same way.
+    SetStretchBltMode(dst.dc, BLACKONWHITE);
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 2, 1, src.dc, 0, 0, 3, 1, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 2), (Values { 10, 30 }));
+}
+
+TEST(StretchBlt, halftoneAveragesAreas)
+{
+    TestBitmap src(4, 2, 24);
+    setRow(src, 0, { grey(0), grey(100), grey(200), grey(50) });
+    setRow(src, 1, { grey(100), grey(100), grey(0), grey(0) });
+    TestBitmap dst(4, 2, 24);
+    ASSERT_EQ(SetStretchBltMode(dst.dc, HALFTONE), COLORONCOLOR);
+
+    // Halving: each target pixel is the mean of two (or, in both directions, four).
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 2, 1, src.dc, 0, 0, 4, 1, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 2), (Values { grey(50), grey(125) }));
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 1, 2, 1, src.dc, 0, 0, 4, 2, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 1, 2), (Values { grey(75), grey(63) })) << "(200+50+0+0)/4 = 62.5 rounds up";
+    // Mirrored while halving.
+    ASSERT_TRUE(StretchBlt(dst.dc, 1, 0, -2, 1, src.dc, 0, 0, 4, 1, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 2), (Values { grey(125), grey(50) }));
+
+    // Enlarging 2 -> 3: the middle pixel straddles both source pixels equally.
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 3, 1, src.dc, 1, 0, 2, 1, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 3), (Values { grey(100), grey(150), grey(200) }));
+
+    // Same size: an exact copy, mirrored or not.
+    ASSERT_TRUE(StretchBlt(dst.dc, 3, 0, -4, 1, src.dc, 0, 0, 4, 1, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 4), (Values { grey(50), grey(200), grey(100), grey(0) }));
+
+    // An indexed source is averaged in colour; an indexed target takes the nearest entry.
+    TestBitmap indexed(2, 1, 8, true, { 0x000000, 0xFFFFFF, 0x808080 });
+    indexed.row(0)[0] = 0, indexed.row(0)[1] = 1;
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 1, 1, indexed.dc, 0, 0, 2, 1, SRCCOPY));
+    EXPECT_EQ(dst.rgb(0, 0), grey(128));
+    TestBitmap target(1, 1, 8, true, { 0x000000, 0xFFFFFF, 0x808080 });
+    SetStretchBltMode(target.dc, HALFTONE);
+    ASSERT_TRUE(StretchBlt(target.dc, 0, 0, 1, 1, indexed.dc, 0, 0, 2, 1, SRCCOPY));
+    EXPECT_EQ(target.row(0)[0], 2);
+
+    // 32 bits: alpha is averaged too.
+    TestBitmap alpha(2, 1, 32);
+    alpha.setArgb(0, 0, 0xFF804020);
+    alpha.setArgb(1, 0, 0x01000000);
+    TestBitmap alphaTarget(1, 1, 32);
+    SetStretchBltMode(alphaTarget.dc, HALFTONE);
+    ASSERT_TRUE(StretchBlt(alphaTarget.dc, 0, 0, 1, 1, alpha.dc, 0, 0, 2, 1, SRCCOPY));
+    EXPECT_EQ(alphaTarget.argb(0, 0), 0x80402010u);
+}
+
+TEST(StretchBlt, halftoneClipsItsFootprintToTheSource)
+{
+    TestBitmap src(2, 1, 24);
+    setRow(src, 0, { grey(40), grey(80) });
+    TestBitmap dst(2, 1, 24);
+    SetStretchBltMode(dst.dc, HALFTONE);
+    // The second target pixel averages source pixels 2 and 3, which do not exist, so it
+    // is not drawn; the first averages 0 and 1.
+    dst.fill(grey(9), 2, 24);
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 2, 1, src.dc, 0, 0, 4, 1, SRCCOPY));
+    EXPECT_EQ(rowOf(dst, 0, 2), (Values { grey(60), grey(9) }));
+    // Half of the footprint outside: the part inside counts alone.
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 1, 1, src.dc, -1, 0, 2, 1, SRCCOPY));
+    EXPECT_EQ(dst.rgb(0, 0), grey(40));
+}

@@ -1,0 +1,134 @@
+#include "GdiTestSupport.h"
+
+#include "platform/WindowHandles.h"
+#include "platform/gdi/PersistentSurface.h"
+#include "platform/gdi/Pictures.h"
+
+#include <gtest/gtest.h>
+
+using namespace zelctl::gdi;
+using zelctl::gdi::test::TestBitmap;
+
+TEST(Pictures, becomeBitmapsAndBack)
+{
+    QImage withAlpha(2, 1, QImage::Format_ARGB32);
+    withAlpha.setPixel(0, 0, qRgba(255, 0, 0, 255));
+    withAlpha.setPixel(1, 0, qRgba(200, 100, 50, 128));
+    const HBITMAP alpha = createBitmapFromImage(withAlpha);
+    DIBSECTION section;
+    ASSERT_TRUE(GetObject(alpha, section));
+    EXPECT_EQ(section.dsBm.bmBitsPixel, 32);
+    EXPECT_LT(section.dsBmih.biHeight, 0);
+    const quint32 *bits = static_cast<const quint32 *>(section.dsBm.bmBits);
+    EXPECT_EQ(bits[0], 0xFFFF0000u);
+    EXPECT_EQ(bits[1], qPremultiply(qRgba(200, 100, 50, 128))) << "premultiplied";
+    EXPECT_EQ(imageFromBitmap(alpha).pixel(1, 0), qPremultiply(qRgba(200, 100, 50, 128)));
+    EXPECT_EQ(imageFromBitmap(alpha).format(), QImage::Format_ARGB32_Premultiplied);
+
+    QImage opaque(3, 2, QImage::Format_RGB32);
+    opaque.fill(qRgb(1, 2, 3));
+    opaque.setPixel(2, 1, qRgb(7, 8, 9));
+    const HBITMAP rgb = createBitmapFromImage(opaque);
+    ASSERT_TRUE(GetObject(rgb, section));
+    EXPECT_EQ(section.dsBm.bmBitsPixel, 24);
+    EXPECT_EQ(imageFromBitmap(rgb), opaque);
+
+    TestBitmap indexed(2, 1, 4, false, { 0x000000, 0x0A0B0C });
+    indexed.row(0)[0] = 0x10;
+    const QImage fromTable = imageFromBitmap(indexed.bitmap);
+    EXPECT_EQ(fromTable.pixel(0, 0), qRgb(0x0A, 0x0B, 0x0C));
+    EXPECT_EQ(fromTable.pixel(1, 0), qRgb(0, 0, 0));
+
+    EXPECT_EQ(createBitmapFromImage(QImage()), 0);
+    EXPECT_TRUE(imageFromBitmap(indexed.dc).isNull()) << "a DC is not a bitmap";
+    DeleteObject(alpha);
+    DeleteObject(rgb);
+}
+
+TEST(Pictures, drawStretchedLeavingTransparentPixelsAlone)
+{
+    QImage sprite(2, 1, QImage::Format_ARGB32);
+    sprite.setPixel(0, 0, qRgba(0x80, 0x80, 0x80, 255));
+    sprite.setPixel(1, 0, qRgba(0, 0, 0, 0));
+    TestBitmap b(4, 1, 24);
+    for (quint32 rop : { SRCCOPY, SRCAND, SRCPAINT }) {
+        b.fill(0x00F0F0, 4, 24);
+        ASSERT_TRUE(drawPicture(b.dc, sprite, 0, 0, 4, 1, rop));
+        const quint32 inked = rop == SRCCOPY ? 0x808080 : rop == SRCAND ? 0x008080 : 0x80F0F0;
+        EXPECT_EQ(b.rgb(0, 0), inked) << rop;
+        EXPECT_EQ(b.rgb(1, 0), inked) << rop;
+        EXPECT_EQ(b.rgb(2, 0), 0x00F0F0u) << rop;
+        EXPECT_EQ(b.rgb(3, 0), 0x00F0F0u) << rop;
+    }
+    EXPECT_FALSE(drawPicture(b.dc, sprite, 0, 0, 4, 1, 0x00660046));
+    EXPECT_FALSE(drawPicture(b.dc, QImage(), 0, 0, 4, 1));
+    EXPECT_FALSE(drawPicture(b.bitmap, sprite, 0, 0, 4, 1));
+}
+
+TEST(OpaqueRegion, coversEveryPixelThatDiffersFromTheKey)
+{
+    TestBitmap b(5, 4, 24, false);
+    b.fill(0xFFFFFF, 5, 24);
+    // A 2 × 2 block and, below it, a lone pixel.
+    b.setRgb(1, 0, 0), b.setRgb(2, 0, 0), b.setRgb(1, 1, 0), b.setRgb(2, 1, 0), b.setRgb(4, 3, 0x123456);
+    const QRegion region = opaqueRegion(b.dc, 0xFFFFFF);
+    EXPECT_EQ(region, QRegion(1, 0, 2, 2) + QRegion(4, 3, 1, 1));
+    EXPECT_EQ(region.rectCount(), 2) << "identical rows share one band";
+    EXPECT_TRUE(region.contains(QPoint(2, 1)));
+    EXPECT_FALSE(region.contains(QPoint(3, 1))) << "pointer hits pass through the key colour";
+
+    // System colours name their RGB value; an all-key surface is empty.
+    EXPECT_TRUE(
+        opaqueRegion(b.dc, zelctl::platform::systemColor(zelctl::platform::COLOR_WINDOW)).contains(QPoint(4, 3)));
+    b.fill(0x000000, 5, 24);
+    EXPECT_TRUE(opaqueRegion(b.dc, 0x000000).isEmpty());
+    EXPECT_TRUE(opaqueRegion(b.bitmap, 0).isEmpty());
+}
+
+TEST(PersistentSurface, showsWhatWasDrawnAndKeepsItAcrossResizes)
+{
+    SurfaceWidget widget;
+    widget.resize(20, 10);
+    PersistentSurface &surface = widget.surface();
+    EXPECT_EQ(surface.size(), QSize(20, 10));
+    const HDC dc = surface.hdc();
+    surface.clear(0x0000FF);
+    EXPECT_EQ(GetBkColor(dc), 0x0000FFu);
+    const HBRUSH blue = CreateSolidBrush(0xFF0000);
+    FillRect(dc, RECT { 1, 1, 3, 3 }, blue);
+    EXPECT_EQ(widget.grab().toImage().pixel(2, 2), qRgb(0, 0, 255));
+    EXPECT_EQ(widget.grab().toImage().pixel(5, 5), qRgb(255, 0, 0));
+
+    widget.resize(30, 12);
+    EXPECT_EQ(surface.hdc(), dc) << "the DC outlives resizes";
+    EXPECT_EQ(surface.size(), QSize(30, 12));
+    EXPECT_EQ(GetPixel(dc, 2, 2), 0xFF0000u) << "kept";
+    EXPECT_EQ(GetPixel(dc, 25, 11), 0x0000FFu) << "new area in the background colour";
+    EXPECT_EQ(surface.image().size(), QSize(30, 12));
+    EXPECT_EQ(surface.image().pixel(1, 1), qRgb(0, 0, 255));
+
+    // Masking by colour: only the blue square stays, for the eye and the pointer.
+    surface.setMaskColor(0x0000FF);
+    EXPECT_EQ(widget.mask(), QRegion(1, 1, 2, 2));
+    surface.clear(0x0000FF);
+    surface.setMaskColor(0x0000FF);
+    EXPECT_FALSE(widget.mask().isEmpty()) << "all transparent still hides everything";
+    EXPECT_FALSE(widget.mask().contains(QPoint(0, 0)));
+    surface.clearMask();
+    EXPECT_TRUE(widget.mask().isEmpty());
+    DeleteObject(blue);
+
+    widget.resize(0, 0);
+    EXPECT_EQ(surface.size(), QSize(1, 1));
+}
+
+TEST(RedrawWindow, reachesWidgetsByHandle)
+{
+    SurfaceWidget widget;
+    const HWND handle = zelctl::platform::handleOf(&widget);
+    EXPECT_TRUE(RedrawWindow(handle, nullptr, RDW_INVALIDATE | RDW_UPDATENOW));
+    const RECT part { 0, 0, 5, 5 };
+    EXPECT_TRUE(RedrawWindow(handle, &part, RDW_INVALIDATE));
+    EXPECT_FALSE(RedrawWindow(0, nullptr, RDW_INVALIDATE));
+    EXPECT_FALSE(RedrawWindow(handle + 1000, nullptr, RDW_INVALIDATE));
+}
