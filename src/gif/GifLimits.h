@@ -14,4 +14,7 @@ inline constexpr qint64 MaxStripPixels = qint64(256) << 20;
 // Pixels of the composed picture (canvas of 3 bytes and mask of 1 bit each).
 inline constexpr qint64 MaxCanvasPixels = qint64(32) << 20;
 
+// Width and height of one bitmap, as the raster layer allows them.
+inline constexpr int MaxBitmapSide = 1 << 16;
+
 } // namespace zelctl::gifLimits
