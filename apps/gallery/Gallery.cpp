@@ -40,6 +40,7 @@ Gallery::Gallery(QWidget *parent)
     resize(900, 700);
 
     addSection(QStringLiteral("NIB"), createNibSection());
+    addSection(QStringLiteral("GIF animado"), createGifSection());
     addSection(QStringLiteral("Classes da biblioteca"), classList());
 }
 

@@ -41,7 +41,7 @@ bool GifRemoteLoader::start(const QString &path)
     if (!reply)
         return false;
     m_reply = reply;
-    connect(reply, &QNetworkReply::downloadProgress, this, [this, reply](qint64 received, qint64 total) {
+    connect(reply, &QNetworkReply::downloadProgress, this, [reply](qint64 received, qint64 total) {
         if (received > gifLimits::MaxFileBytes || total > gifLimits::MaxFileBytes)
             reply->abort();
     });
