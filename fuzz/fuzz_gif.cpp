@@ -32,7 +32,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size)
     qint64 declared = qint64(layout.CanvasWidth) * layout.CanvasHeight;
     for (const zelctl::gifScanner::FrameRecord &frame : layout.Frames)
         declared += qint64(frame.Width) * frame.Height;
-    if (declared > (qint64(1) << 22))
+    if (declared > (qint64(1) << 18))
         return 0;
 
     zelctl::ucAniGIF gif;
@@ -45,7 +45,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t *data, size_t size)
     gif.setMirrored(int(size % 4));
     QImage target(gif.size(), QImage::Format_ARGB32);
     // Every frame once, then a jump back, which composes from the first frame again.
-    const int frames = std::min(gif.FrameCount(), 64);
+    const int frames = std::min(gif.FrameCount(), 24);
     for (int i = 0; i <= frames; ++i) {
         gif.render(&target);
         gif.setAction(zelctl::ucAniGIF::gfaForward);

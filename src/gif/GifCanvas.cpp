@@ -68,49 +68,63 @@ void GifCanvas::show(GifFrames &frames, int index)
 void GifCanvas::compose(GifFrames &frames, int index)
 {
     const gifScanner::FrameRecord &frame = frames.frame(index);
-    const QRect rect = frames.frameRect(index).intersected(QRect(0, 0, m_canvas.width(), m_canvas.height()));
-    if (rect.isEmpty())
+    const QRect rect = frames.frameRect(index);
+    if (rect.isEmpty() || !frames.frameRow(index, 0))
         return;
+    const auto [first, last] = maskBytes(rect);
+    const qsizetype maskSpan = last - first + 1;
     if (frame.Disposal == 3) {
         m_savedRect = rect;
         m_savedCanvas.resize(qsizetype(rect.width()) * 3 * rect.height());
-        const auto [first, last] = maskBytes(rect);
-        m_savedMask.resize(qsizetype(last - first + 1) * rect.height());
+        m_savedMask.resize(maskSpan * rect.height());
         for (int y = 0; y < rect.height(); ++y) {
             std::memcpy(m_savedCanvas.data() + qsizetype(y) * rect.width() * 3,
                         m_canvas.row(rect.top() + y) + qsizetype(rect.left()) * 3, size_t(rect.width()) * 3);
-            std::memcpy(m_savedMask.data() + qsizetype(y) * (last - first + 1), m_mask.row(rect.top() + y) + first,
-                        size_t(last - first + 1));
+            std::memcpy(m_savedMask.data() + y * maskSpan, m_mask.row(rect.top() + y) + first, size_t(maskSpan));
         }
     }
-    if (frame.HasTransparency) {
-        frames.draw(index, m_canvas.dc(), rect, GifFrames::Pass::MaskAnd);
-        frames.draw(index, m_canvas.dc(), rect, GifFrames::Pass::ColoursOr);
-        frames.draw(index, m_mask.dc(), rect, GifFrames::Pass::MaskAnd);
-    } else {
-        frames.draw(index, m_canvas.dc(), rect, GifFrames::Pass::Copy);
-        const gdi::RECT area { rect.left(), rect.top(), rect.right() + 1, rect.bottom() + 1 };
-        gdi::FillRect(m_mask.dc(), area, gdi::GetStockObject(gdi::BLACK_BRUSH));
+    // The frame's opaque pixels take their colour from its table and clear their mask bit;
+    // transparent ones leave the canvas as it was.
+    const std::array<quint32, 256> &colours = frames.table(frame.ColorTable).entries;
+    const int transparent = frame.HasTransparency ? frame.TransparentIndex : -1;
+    for (int y = 0; y < rect.height(); ++y) {
+        const uchar *source = frames.frameRow(index, y);
+        uchar *canvas = m_canvas.row(rect.top() + y) + qsizetype(rect.left()) * 3;
+        uchar *mask = m_mask.row(rect.top() + y);
+        for (int x = 0; x < rect.width(); ++x) {
+            const int value = source[x];
+            if (value == transparent)
+                continue;
+            const quint32 rgb = colours[size_t(value)];
+            canvas[3 * x] = uchar(rgb);
+            canvas[3 * x + 1] = uchar(rgb >> 8);
+            canvas[3 * x + 2] = uchar(rgb >> 16);
+            const int mx = rect.left() + x;
+            mask[mx >> 3] &= uchar(~(0x80u >> (mx & 7)));
+        }
     }
 }
 
 void GifCanvas::dispose(GifFrames &frames, int index)
 {
     const gifScanner::FrameRecord &frame = frames.frame(index);
-    const QRect rect = frames.frameRect(index).intersected(QRect(0, 0, m_canvas.width(), m_canvas.height()));
+    const QRect rect = frames.frameRect(index);
     if (rect.isEmpty())
         return;
+    const auto [first, last] = maskBytes(rect);
+    const qsizetype maskSpan = last - first + 1;
     if (frame.Disposal == 2) {
-        const gdi::RECT area { rect.left(), rect.top(), rect.right() + 1, rect.bottom() + 1 };
-        gdi::FillRect(m_canvas.dc(), area, gdi::GetStockObject(gdi::BLACK_BRUSH));
-        gdi::FillRect(m_mask.dc(), area, gdi::GetStockObject(gdi::WHITE_BRUSH));
+        for (int y = rect.top(); y <= rect.bottom(); ++y) {
+            std::memset(m_canvas.row(y) + qsizetype(rect.left()) * 3, 0, size_t(rect.width()) * 3);
+            uchar *mask = m_mask.row(y);
+            for (int x = rect.left(); x <= rect.right(); ++x)
+                mask[x >> 3] |= uchar(0x80u >> (x & 7));
+        }
     } else if (frame.Disposal == 3 && rect == m_savedRect) {
-        const auto [first, last] = maskBytes(rect);
         for (int y = 0; y < rect.height(); ++y) {
             std::memcpy(m_canvas.row(rect.top() + y) + qsizetype(rect.left()) * 3,
                         m_savedCanvas.constData() + qsizetype(y) * rect.width() * 3, size_t(rect.width()) * 3);
-            std::memcpy(m_mask.row(rect.top() + y) + first,
-                        m_savedMask.constData() + qsizetype(y) * (last - first + 1), size_t(last - first + 1));
+            std::memcpy(m_mask.row(rect.top() + y) + first, m_savedMask.constData() + y * maskSpan, size_t(maskSpan));
         }
     }
 }
@@ -120,13 +134,40 @@ void GifCanvas::paint(gdi::HDC dst, const QRect &to) const
     if (isNull() || to.isEmpty())
         return;
     const int w = m_canvas.width(), h = m_canvas.height();
-    if (to.width() == w && to.height() == h) {
-        gdi::BitBlt(dst, to.x(), to.y(), w, h, m_mask.dc(), 0, 0, gdi::SRCAND);
-        gdi::BitBlt(dst, to.x(), to.y(), w, h, m_canvas.dc(), 0, 0, gdi::SRCPAINT);
-    } else {
-        gdi::StretchBlt(dst, to.x(), to.y(), to.width(), to.height(), m_mask.dc(), 0, 0, w, h, gdi::SRCAND);
-        gdi::StretchBlt(dst, to.x(), to.y(), to.width(), to.height(), m_canvas.dc(), 0, 0, w, h, gdi::SRCPAINT);
+    if (to.size() == QSize(w, h) && paintDirect(dst, to.topLeft()))
+        return;
+    // Through the mask in two steps: AND clears where the picture is opaque, OR puts its
+    // colours there (the canvas is black wherever the mask is white).
+    gdi::StretchBlt(dst, to.x(), to.y(), to.width(), to.height(), m_mask.dc(), 0, 0, w, h, gdi::SRCAND);
+    gdi::StretchBlt(dst, to.x(), to.y(), to.width(), to.height(), m_canvas.dc(), 0, 0, w, h, gdi::SRCPAINT);
+}
+
+bool GifCanvas::paintDirect(gdi::HDC dst, const QPoint &at) const
+{
+    gdi::DIBSECTION target;
+    if (!gdi::GetObject(gdi::GetCurrentObject(dst, gdi::OBJ_BITMAP), target) || target.dsBm.bmBitsPixel != 32
+        || !target.dsBm.bmBits)
+        return false;
+    // The same pixels as the two blits give, without their per-pixel conversions: the
+    // unscaled picture is what every frame of an animation draws.
+    const QRect visible = QRect(at, QSize(m_canvas.width(), m_canvas.height()))
+                              .intersected(QRect(0, 0, target.dsBm.bmWidth, target.dsBm.bmHeight));
+    const bool topDown = target.dsBmih.biHeight < 0;
+    auto *bits = static_cast<uchar *>(target.dsBm.bmBits);
+    for (int ty = visible.top(); ty <= visible.bottom(); ++ty) {
+        const int row = topDown ? ty : target.dsBm.bmHeight - 1 - ty;
+        auto *out = reinterpret_cast<quint32 *>(bits + qsizetype(row) * target.dsBm.bmWidthBytes);
+        const uchar *canvas = m_canvas.row(ty - at.y());
+        const uchar *mask = m_mask.row(ty - at.y());
+        for (int tx = visible.left(); tx <= visible.right(); ++tx) {
+            const int x = tx - at.x();
+            if (mask[x >> 3] & (0x80u >> (x & 7)))
+                continue;
+            const uchar *p = canvas + 3 * qsizetype(x);
+            out[tx] = 0xFF000000u | quint32(p[2]) << 16 | quint32(p[1]) << 8 | p[0];
+        }
     }
+    return true;
 }
 
 } // namespace zelctl

@@ -40,6 +40,8 @@ private:
     void clear();
     void compose(GifFrames &frames, int index);
     void dispose(GifFrames &frames, int index);
+    // Draws unscaled straight into a 32-bit target; false for any other target.
+    bool paintDirect(gdi::HDC dst, const QPoint &at) const;
 
     MemoryBitmap m_canvas;
     MemoryBitmap m_mask;

@@ -11,19 +11,7 @@ namespace zelctl {
 struct GifFrames::Page
 {
     MemoryBitmap bitmap;
-    // What the page's colour table holds now; -1 when it must be set again.
-    qint64 applied = -1;
 };
-
-namespace {
-
-// Keys of what a page's colour table holds.
-qint64 tableKey(GifFrames::Pass pass, int table, int transparent)
-{
-    return qint64(pass) << 40 | qint64(table) << 8 | transparent;
-}
-
-} // namespace
 
 GifFrames::GifFrames() = default;
 GifFrames::~GifFrames() = default;
@@ -143,52 +131,12 @@ QRect GifFrames::frameRect(int index) const
     return rect;
 }
 
-void GifFrames::applyTable(Page &page, qint64 key, const std::array<quint32, 256> &entries)
+const uchar *GifFrames::frameRow(int index, int y) const
 {
-    if (page.applied == key)
-        return;
-    std::array<gdi::RGBQUAD, 256> quads;
-    for (size_t k = 0; k < quads.size(); ++k)
-        quads[k] = gdi::rgbQuad(entries[k]);
-    gdi::SetDIBColorTable(page.bitmap.dc(), 0, 256, quads.data());
-    page.applied = key;
-}
-
-void GifFrames::draw(int index, gdi::HDC dst, const QRect &to, Pass pass)
-{
-    if (index < 1 || index > count())
-        return;
     const Placement &place = m_place[size_t(index - 1)];
     if (place.page < 0)
-        return;
-    Page &page = *m_pages[size_t(place.page)];
-    const gifScanner::FrameRecord &f = frame(index);
-    const int t = f.ColorTable < tableCount() ? f.ColorTable : 0;
-
-    std::array<quint32, 256> entries {};
-    quint32 rop = gdi::SRCCOPY;
-    switch (pass) {
-    case Pass::Copy:
-        entries = table(t).entries;
-        applyTable(page, tableKey(pass, t, 0), entries);
-        break;
-    case Pass::MaskAnd:
-        entries[f.TransparentIndex] = 0xFFFFFF;
-        applyTable(page, tableKey(pass, 0, f.TransparentIndex), entries);
-        rop = gdi::SRCAND;
-        break;
-    case Pass::ColoursOr:
-        entries = table(t).entries;
-        entries[f.TransparentIndex] = 0;
-        applyTable(page, tableKey(pass, t, f.TransparentIndex), entries);
-        rop = gdi::SRCPAINT;
-        break;
-    }
-    if (to.width() == f.Width && to.height() == f.Height)
-        gdi::BitBlt(dst, to.x(), to.y(), f.Width, f.Height, page.bitmap.dc(), place.x, 0, rop);
-    else
-        gdi::StretchBlt(dst, to.x(), to.y(), to.width(), to.height(), page.bitmap.dc(), place.x, 0, f.Width, f.Height,
-                        rop);
+        return nullptr;
+    return m_pages[size_t(place.page)]->bitmap.row(y) + place.x;
 }
 
 void GifFrames::flip(int index, int mirror)
@@ -228,10 +176,6 @@ void GifFrames::setTableEntries(int t, const QList<qint32> &entries)
     const int n = std::min<int>(target.count, int(entries.size()));
     for (int k = 0; k < n; ++k)
         target.entries[size_t(k)] = quint32(entries[k]) & 0xFFFFFF;
-    for (const std::unique_ptr<Page> &page : m_pages) {
-        if (page)
-            page->applied = -1;
-    }
 }
 
 bool GifFrames::cacheTables()
@@ -248,10 +192,6 @@ bool GifFrames::restoreTables(bool releaseCache)
     if (!m_hasCache)
         return false;
     m_layout.ColorTables = m_cachedTables;
-    for (const std::unique_ptr<Page> &page : m_pages) {
-        if (page)
-            page->applied = -1;
-    }
     if (releaseCache) {
         m_hasCache = false;
         m_cachedTables.clear();

@@ -14,9 +14,9 @@
 namespace zelctl {
 
 // A loaded GIF as the control keeps it: the frame list and colour tables of the scan, and
-// every frame's palette indices side by side in the frame strip, an 8-bit bitmap whose
-// colour table is set to a frame's table when that frame is drawn. The strip is cut into
-// pages where the frames would outgrow one bitmap.
+// every frame's palette indices side by side in the frame strip, an 8-bit bitmap; the
+// colours come from the tables only when a frame is drawn, so palette changes are cheap.
+// The strip is cut into pages where the frames would outgrow one bitmap.
 class ZELCTL_EXPORT GifFrames
 {
 public:
@@ -46,11 +46,9 @@ public:
     // Where a frame lies on the canvas, mirrored with the picture.
     QRect frameRect(int index) const;
 
-    // Draws a frame into dst at `to` (its size, or scaled to it). Copy draws its colours;
-    // MaskAnd draws white where it is transparent and black elsewhere, combined with AND;
-    // ColoursOr draws its colours with the transparent ones black, combined with OR.
-    enum class Pass { Copy, MaskAnd, ColoursOr };
-    void draw(int index, gdi::HDC dst, const QRect &to, Pass pass);
+    // Row y (0 = top) of a frame's palette indices in the strip, as shown (mirrored);
+    // nullptr for a frame without pixels.
+    const uchar *frameRow(int index, int y) const;
 
     // Turns the strip's frames over, each within its own rectangle (bit 1 left to right,
     // bit 2 top to bottom).
@@ -60,8 +58,7 @@ public:
     // Colour table t (0 global, n the n-th local one).
     int tableCount() const { return int(m_layout.ColorTables.size()); }
     const gifScanner::ColorTable &table(int t) const { return m_layout.ColorTables[t]; }
-    // Replaces entries from the first on, up to the table's own count; tables are put into
-    // the strip again on the next draw.
+    // Replaces entries from the first on, up to the table's own count.
     void setTableEntries(int t, const QList<qint32> &entries);
     bool cacheTables();
     bool restoreTables(bool releaseCache);
@@ -79,7 +76,6 @@ private:
 
     bool decodeFrame(int index);
     void flip(int index, int mirror);
-    void applyTable(Page &page, qint64 key, const std::array<quint32, 256> &entries);
 
     QByteArray m_bytes;
     gifScanner::GifLayout m_layout;

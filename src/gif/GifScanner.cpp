@@ -216,18 +216,20 @@ Scanner::Image Scanner::imageBlock(qsizetype separator)
         frame.Position = qint32(separator);
     m_hasPending = false;
 
-    const std::optional<quint16> left = m_in.word(), top = m_in.word(), width = m_in.word(), height = m_in.word();
-    const std::optional<quint8> packed = height ? m_in.byte() : std::nullopt;
-    if (!left || !top || !width || !height || !packed)
+    for (qint32 *field : { &frame.Left, &frame.Top, &frame.Width, &frame.Height }) {
+        const std::optional<quint16> value = m_in.word();
+        if (!value)
+            return Image::Truncated;
+        *field = *value;
+    }
+    const std::optional<quint8> packedByte = m_in.byte();
+    if (!packedByte)
         return Image::Truncated;
-    frame.Left = *left;
-    frame.Top = *top;
-    frame.Width = *width;
-    frame.Height = *height;
-    if (*packed & 0x80) {
+    const quint8 packed = *packedByte;
+    if (packed & 0x80) {
         layout.ColorTables.append(ColorTable {});
         frame.ColorTable = qint32(layout.ColorTables.size() - 1);
-        if (!m_in.colorTable((*packed & 7) + 1, layout.ColorTables.last()))
+        if (!m_in.colorTable((packed & 7) + 1, layout.ColorTables.last()))
             return Image::Truncated;
     } else if (!layout.hasGlobalTable()) {
         return Image::Refused;

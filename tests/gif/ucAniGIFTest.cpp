@@ -1,5 +1,7 @@
 #include "GifFiles.h"
 
+#include "gif/GifCanvas.h"
+#include "gif/GifFrames.h"
 #include "gif/ucAniGIF.h"
 #include "platform/Twips.h"
 
@@ -417,4 +419,31 @@ TEST_F(AniGif, badInputLoadsNothing)
     EXPECT_TRUE(gif.LoadAnimatedGIF_Array(huge));
     EXPECT_EQ(gif.FrameCount(), 1);
     EXPECT_FALSE(gif.LoadAnimatedGIF_Array(huge.left(13 + 12) + huge.mid(13 + 12 + 22)));
+}
+
+TEST(GifCanvasPaint, directDrawingMatchesTheMaskBlits)
+{
+    GifFrames frames;
+    GifCanvas canvas;
+    ASSERT_TRUE(frames.load(layeredGif()));
+    ASSERT_TRUE(canvas.create(frames.canvasWidth(), frames.canvasHeight()));
+    frames.setMirror(ucAniGIF::gfmHorizontal);
+    // A 32-bit target is drawn directly, a 24-bit one through the AND and OR blits.
+    MemoryBitmap direct, blitted;
+    ASSERT_TRUE(direct.create(9, 7, 32));
+    ASSERT_TRUE(blitted.create(9, 7, 24));
+    const gdi::HBRUSH yellow = gdi::CreateSolidBrush(0x0000FFFF);
+    for (int index = 1; index <= frames.count(); ++index) {
+        canvas.show(frames, index);
+        for (const MemoryBitmap *target : { &direct, &blitted }) {
+            gdi::FillRect(target->dc(), gdi::RECT { 0, 0, 9, 7 }, yellow);
+            canvas.paint(target->dc(), QRect(QPoint(index - 2, 1), QSize(6, 4)));
+        }
+        for (int y = 0; y < 7; ++y) {
+            for (int x = 0; x < 9; ++x)
+                ASSERT_EQ(gdi::GetPixel(direct.dc(), x, y), gdi::GetPixel(blitted.dc(), x, y))
+                    << "frame " << index << " at " << x << "," << y;
+        }
+    }
+    gdi::DeleteObject(yellow);
 }
