@@ -24,12 +24,11 @@ QWidget *createGifSection()
     if (!gif->LoadAnimatedGIF_File(file))
         state->setText("Não foi possível ler " + file);
     QObject::connect(gif, &ucAniGIF::FrameChanged, state,
-                     [state](qint32 frame) { state->setText(QStringLiteral("Imagem %1").arg(frame)); });
+        [state](qint32 frame) { state->setText(QStringLiteral("Imagem %1").arg(frame)); });
 
     auto *pause = new QPushButton("Pausa / continuar");
-    QObject::connect(pause, &QPushButton::clicked, gif, [gif] {
-        gif->setAction(gif->Action() == ucAniGIF::gfaPlay ? ucAniGIF::gfaPause : ucAniGIF::gfaPlay);
-    });
+    QObject::connect(pause, &QPushButton::clicked, gif,
+        [gif] { gif->setAction(gif->Action() == ucAniGIF::gfaPlay ? ucAniGIF::gfaPause : ucAniGIF::gfaPlay); });
     auto *forward = new QPushButton("Avançar");
     QObject::connect(forward, &QPushButton::clicked, gif, [gif] { gif->setAction(ucAniGIF::gfaForward); });
     auto *mirror = new QComboBox;

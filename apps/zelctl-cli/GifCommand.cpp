@@ -58,8 +58,8 @@ int runGifInfo(const QStringList &args, QTextStream &out, QTextStream &err)
             << localSize;
         if (withHash) {
             QByteArray indices(qsizetype(frame.Width) * frame.Height, '\0');
-            if (!zelctl::gifFrameDecoder::decode(bytes, layout.BlockList[i], frame,
-                                                 reinterpret_cast<uchar *>(indices.data()), frame.Width))
+            if (!zelctl::gifFrameDecoder::decode(
+                    bytes, layout.BlockList[i], frame, reinterpret_cast<uchar *>(indices.data()), frame.Width))
                 out << " damaged";
             out << " hash " << QStringLiteral("%1").arg(fnv1a(indices), 8, 16, QLatin1Char('0'));
         }

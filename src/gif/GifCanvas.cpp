@@ -79,7 +79,7 @@ void GifCanvas::compose(GifFrames &frames, int index)
         m_savedMask.resize(maskSpan * rect.height());
         for (int y = 0; y < rect.height(); ++y) {
             std::memcpy(m_savedCanvas.data() + qsizetype(y) * rect.width() * 3,
-                        m_canvas.row(rect.top() + y) + qsizetype(rect.left()) * 3, size_t(rect.width()) * 3);
+                m_canvas.row(rect.top() + y) + qsizetype(rect.left()) * 3, size_t(rect.width()) * 3);
             std::memcpy(m_savedMask.data() + y * maskSpan, m_mask.row(rect.top() + y) + first, size_t(maskSpan));
         }
     }
@@ -123,7 +123,7 @@ void GifCanvas::dispose(GifFrames &frames, int index)
     } else if (frame.Disposal == 3 && rect == m_savedRect) {
         for (int y = 0; y < rect.height(); ++y) {
             std::memcpy(m_canvas.row(rect.top() + y) + qsizetype(rect.left()) * 3,
-                        m_savedCanvas.constData() + qsizetype(y) * rect.width() * 3, size_t(rect.width()) * 3);
+                m_savedCanvas.constData() + qsizetype(y) * rect.width() * 3, size_t(rect.width()) * 3);
             std::memcpy(m_mask.row(rect.top() + y) + first, m_savedMask.constData() + y * maskSpan, size_t(maskSpan));
         }
     }
@@ -159,12 +159,18 @@ bool GifCanvas::paintDirect(gdi::HDC dst, const QPoint &at) const
         auto *out = reinterpret_cast<quint32 *>(bits + qsizetype(row) * target.dsBm.bmWidthBytes);
         const uchar *canvas = m_canvas.row(ty - at.y());
         const uchar *mask = m_mask.row(ty - at.y());
-        for (int tx = visible.left(); tx <= visible.right(); ++tx) {
+        for (int tx = visible.left(); tx <= visible.right();) {
             const int x = tx - at.x();
-            if (mask[x >> 3] & (0x80u >> (x & 7)))
+            // Whole mask bytes of transparent pixels are skipped at once.
+            if ((x & 7) == 0 && mask[x >> 3] == 0xFF && tx + 7 <= visible.right()) {
+                tx += 8;
                 continue;
-            const uchar *p = canvas + 3 * qsizetype(x);
-            out[tx] = 0xFF000000u | quint32(p[2]) << 16 | quint32(p[1]) << 8 | p[0];
+            }
+            if (!(mask[x >> 3] & (0x80u >> (x & 7)))) {
+                const uchar *p = canvas + 3 * qsizetype(x);
+                out[tx] = 0xFF000000u | quint32(p[2]) << 16 | quint32(p[1]) << 8 | p[0];
+            }
+            ++tx;
         }
     }
     return true;

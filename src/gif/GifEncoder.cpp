@@ -191,8 +191,9 @@ QByteArray encode(const Animation &animation)
         if (local)
             putTable(out, table, tableBits);
 
-        const int highest = indices.isEmpty() ? 0 : quint8(*std::max_element(indices.begin(), indices.end(),
-                                                                  [](char a, char b) { return quint8(a) < quint8(b); }));
+        const int highest = indices.isEmpty() ? 0
+                                              : quint8(*std::max_element(indices.begin(), indices.end(),
+                                                  [](char a, char b) { return quint8(a) < quint8(b); }));
         out.append(compress(indices, std::max({ 2, tableBits, bitsFor(highest + 1) })));
     }
     out.append(char(0x3B));

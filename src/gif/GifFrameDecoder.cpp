@@ -58,7 +58,7 @@ struct CloseGif
 } // namespace
 
 bool decode(QByteArrayView gif, const gifScanner::BlockEntry &block, const gifScanner::FrameRecord &frame,
-            uchar *target, qsizetype stride)
+    uchar *target, qsizetype stride)
 {
     if (block.Start < 0 || block.Length < 10 || block.Start > gif.size() - block.Length)
         return false;
@@ -85,9 +85,8 @@ bool decode(QByteArrayView gif, const gifScanner::BlockEntry &block, const gifSc
     if (file->Image.Width != frame.Width || file->Image.Height != frame.Height)
         return false;
 
-    auto put = [&](int row) {
-        return DGifGetLine(file.get(), target + qsizetype(row) * stride, frame.Width) == GIF_OK;
-    };
+    auto put
+        = [&](int row) { return DGifGetLine(file.get(), target + qsizetype(row) * stride, frame.Width) == GIF_OK; };
     if (file->Image.Interlace) {
         static constexpr int start[] = { 0, 4, 2, 1 };
         static constexpr int step[] = { 8, 8, 4, 2 };

@@ -13,7 +13,7 @@ namespace zelctl::gifFrameDecoder {
 // The image block is taken from the GIF as the scanner found it and handed to giflib as a
 // stream of its own. Rows the data does not reach are left as they were. False when the
 // frame's data is damaged.
-ZELCTL_EXPORT bool decode(QByteArrayView gif, const gifScanner::BlockEntry &block,
-                          const gifScanner::FrameRecord &frame, uchar *target, qsizetype stride);
+ZELCTL_EXPORT bool decode(QByteArrayView gif, const gifScanner::BlockEntry &block, const gifScanner::FrameRecord &frame,
+    uchar *target, qsizetype stride);
 
 } // namespace zelctl::gifFrameDecoder

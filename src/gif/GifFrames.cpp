@@ -113,8 +113,8 @@ bool GifFrames::decodeFrame(int index)
         return true;
     MemoryBitmap &bitmap = m_pages[size_t(place.page)]->bitmap;
     // A frame that fails to decode keeps what it got; the rest stays index 0.
-    const bool decoded = gifFrameDecoder::decode(m_bytes, m_layout.BlockList[index - 1], frame(index),
-                                                 bitmap.bits() + place.x, bitmap.stride());
+    const bool decoded = gifFrameDecoder::decode(
+        m_bytes, m_layout.BlockList[index - 1], frame(index), bitmap.bits() + place.x, bitmap.stride());
     if (m_mirror)
         flip(index, m_mirror);
     return decoded;
@@ -154,8 +154,8 @@ void GifFrames::flip(int index, int mirror)
     }
     if (mirror & 2) {
         for (int y = 0; y < f.Height / 2; ++y)
-            std::swap_ranges(bitmap.row(y) + place.x, bitmap.row(y) + place.x + f.Width,
-                             bitmap.row(f.Height - 1 - y) + place.x);
+            std::swap_ranges(
+                bitmap.row(y) + place.x, bitmap.row(y) + place.x + f.Width, bitmap.row(f.Height - 1 - y) + place.x);
     }
 }
 

@@ -64,13 +64,13 @@ Qt::CursorShape cursorShape(qint32 pointer)
 qint16 buttonsOf(Qt::MouseButtons buttons)
 {
     return qint16((buttons & Qt::LeftButton ? 1 : 0) | (buttons & Qt::RightButton ? 2 : 0)
-                  | (buttons & Qt::MiddleButton ? 4 : 0));
+        | (buttons & Qt::MiddleButton ? 4 : 0));
 }
 
 qint16 shiftOf(Qt::KeyboardModifiers modifiers)
 {
     return qint16((modifiers & Qt::ShiftModifier ? 1 : 0) | (modifiers & Qt::ControlModifier ? 2 : 0)
-                  | (modifiers & Qt::AltModifier ? 4 : 0));
+        | (modifiers & Qt::AltModifier ? 4 : 0));
 }
 
 bool hasGifSignature(const QByteArray &bytes)
@@ -380,8 +380,8 @@ qint32 ucAniGIF::Loops() const
 
 void ucAniGIF::setLoops(qint32 loops)
 {
-    d->animator.setLoopCount(loops == std::numeric_limits<qint32>::min() ? std::numeric_limits<qint32>::max()
-                                                                         : std::abs(loops));
+    d->animator.setLoopCount(
+        loops == std::numeric_limits<qint32>::min() ? std::numeric_limits<qint32>::max() : std::abs(loops));
     PropertyChanged(QStringLiteral("Loops"));
 }
 
@@ -634,7 +634,7 @@ void ucAniGIF::paintEvent(QPaintEvent *event)
         gdi::SetBrushOrgEx(dc, 0, 0);
         d->canvas.show(d->frames, current);
         const QRect to(d->offsetX, d->offsetY, int(std::lround(d->frames.canvasWidth() * d->scaleX)),
-                       int(std::lround(d->frames.canvasHeight() * d->scaleY)));
+            int(std::lround(d->frames.canvasHeight() * d->scaleY)));
         d->canvas.paint(dc, to);
     }
     if (designMode()) {
@@ -672,14 +672,14 @@ void ucAniGIF::mousePressEvent(QMouseEvent *event)
     d->pressed = event->button() == Qt::LeftButton;
     const QPointF at = event->position();
     Q_EMIT MouseDown(buttonsOf(event->button()), shiftOf(event->modifiers()), float(twipsFromPixels(1) * at.x()),
-                     float(twipsFromPixels(1) * at.y()));
+        float(twipsFromPixels(1) * at.y()));
 }
 
 void ucAniGIF::mouseReleaseEvent(QMouseEvent *event)
 {
     const QPointF at = event->position();
     Q_EMIT MouseUp(buttonsOf(event->button()), shiftOf(event->modifiers()), float(twipsFromPixels(1) * at.x()),
-                   float(twipsFromPixels(1) * at.y()));
+        float(twipsFromPixels(1) * at.y()));
     if (d->pressed && event->button() == Qt::LeftButton && rect().contains(at.toPoint()))
         Q_EMIT Click();
     d->pressed = false;
@@ -689,7 +689,7 @@ void ucAniGIF::mouseMoveEvent(QMouseEvent *event)
 {
     const QPointF at = event->position();
     Q_EMIT MouseMove(buttonsOf(event->buttons()), shiftOf(event->modifiers()), float(twipsFromPixels(1) * at.x()),
-                     float(twipsFromPixels(1) * at.y()));
+        float(twipsFromPixels(1) * at.y()));
 }
 
 ZELCTL_REGISTER_CLASS(ucAniGIF)

@@ -49,8 +49,8 @@ Decoded decodeWithGiflib(const QByteArray &gif)
         result.height = file->SHeight;
         for (int i = 0; i < file->ImageCount; ++i) {
             const SavedImage &image = file->SavedImages[i];
-            result.frames.append(QByteArray(reinterpret_cast<const char *>(image.RasterBits),
-                                            image.ImageDesc.Width * image.ImageDesc.Height));
+            result.frames.append(QByteArray(
+                reinterpret_cast<const char *>(image.RasterBits), image.ImageDesc.Width * image.ImageDesc.Height));
             GraphicsControlBlock gcb {};
             DGifSavedExtensionToGCB(file, i, &gcb);
             result.controls.append(gcb);
@@ -58,7 +58,8 @@ Decoded decodeWithGiflib(const QByteArray &gif)
             const ColorMapObject *map = image.ImageDesc.ColorMap ? image.ImageDesc.ColorMap : file->SColorMap;
             QList<quint32> table;
             for (int k = 0; map && k < map->ColorCount; ++k)
-                table.append(quint32(map->Colors[k].Red) << 16 | quint32(map->Colors[k].Green) << 8 | map->Colors[k].Blue);
+                table.append(
+                    quint32(map->Colors[k].Red) << 16 | quint32(map->Colors[k].Green) << 8 | map->Colors[k].Blue);
             result.tables.append(table);
         }
     }
@@ -95,8 +96,8 @@ TEST(GifEncoder, giflibDecodesTheSameIndices)
     {
         int width, height, colours, runLength;
     };
-    for (const Case &c : { Case { 1, 1, 2, 1 }, Case { 7, 3, 2, 1 }, Case { 300, 200, 256, 1 }, Case { 300, 200, 256, 40 },
-                           Case { 64, 64, 16, 3 }, Case { 500, 100, 1, 1 }, Case { 2000, 1, 5, 7 } }) {
+    for (const Case &c : { Case { 1, 1, 2, 1 }, Case { 7, 3, 2, 1 }, Case { 300, 200, 256, 1 },
+             Case { 300, 200, 256, 40 }, Case { 64, 64, 16, 3 }, Case { 500, 100, 1, 1 }, Case { 2000, 1, 5, 7 } }) {
         SCOPED_TRACE(testing::Message() << c.width << "x" << c.height << " colours " << c.colours);
         gifEncoder::Animation animation;
         animation.width = c.width;

@@ -47,8 +47,8 @@ public:
     }
 
     // Image descriptor, optional local table and LZW data of the indices (row by row).
-    GifBuilder &image(int left, int top, int width, int height, const QByteArray &indices,
-                      const QList<quint32> &local = {})
+    GifBuilder &image(
+        int left, int top, int width, int height, const QByteArray &indices, const QList<quint32> &local = {})
     {
         m_bytes.append(char(0x2C));
         word(left);
@@ -81,10 +81,7 @@ private:
             ++bits;
         return bits;
     }
-    void word(int value)
-    {
-        m_bytes.append(char(value & 0xFF)).append(char(value >> 8 & 0xFF));
-    }
+    void word(int value) { m_bytes.append(char(value & 0xFF)).append(char(value >> 8 & 0xFF)); }
     void table(const QList<quint32> &colors)
     {
         for (quint32 c : colors)

@@ -71,7 +71,7 @@ TEST(GifScanner, toleratesOddButHarmlessBytes)
                                .raw(QByteArray(3, '\0')) // stray zero bytes between blocks
                                .raw(QByteArray("\x21\xFE\x03"
                                                "abc\x00",
-                                               7)) // a comment
+                                   7)) // a comment
                                .solid(0, 0, 4, 4, 1)
                                .raw(QByteArray(2, '\0'))
                                .netscape(7, "netscape2.0")
@@ -87,11 +87,15 @@ TEST(GifScanner, refusesWhatIsNotAGifOrHasNoColours)
 {
     EXPECT_TRUE(gifScanner::scan(QByteArray()).Frames.isEmpty());
     EXPECT_TRUE(gifScanner::scan(QByteArray("GIF88a")).Frames.isEmpty());
-    EXPECT_TRUE(gifScanner::scan(GifBuilder(4, 4, fourColours, "GIF90a").solid(0, 0, 4, 4, 1).bytes()).Frames.isEmpty());
+    EXPECT_TRUE(
+        gifScanner::scan(GifBuilder(4, 4, fourColours, "GIF90a").solid(0, 0, 4, 4, 1).bytes()).Frames.isEmpty());
 
     // The second frame has no table of its own and there is no global one: nothing loads.
-    const QByteArray noTable
-        = GifBuilder(4, 4).solid(0, 0, 4, 4, 1, { 0, 0xFFFFFF }).solid(0, 0, 4, 4, 1).solid(0, 0, 4, 4, 1, { 0, 1 }).bytes();
+    const QByteArray noTable = GifBuilder(4, 4)
+                                   .solid(0, 0, 4, 4, 1, { 0, 0xFFFFFF })
+                                   .solid(0, 0, 4, 4, 1)
+                                   .solid(0, 0, 4, 4, 1, { 0, 1 })
+                                   .bytes();
     const gifScanner::GifLayout layout = gifScanner::scan(noTable);
     EXPECT_TRUE(layout.Frames.isEmpty());
     EXPECT_EQ(layout.CanvasWidth, 0);
@@ -99,7 +103,8 @@ TEST(GifScanner, refusesWhatIsNotAGifOrHasNoColours)
 
 TEST(GifScanner, truncatedFileKeepsItsCompleteFrames)
 {
-    const GifBuilder builder = GifBuilder(8, 8, fourColours).control(0, 2).solid(0, 0, 8, 8, 1).control(0, 2).solid(0, 0, 8, 8, 2);
+    const GifBuilder builder
+        = GifBuilder(8, 8, fourColours).control(0, 2).solid(0, 0, 8, 8, 1).control(0, 2).solid(0, 0, 8, 8, 2);
     const QByteArray whole = builder.withoutTrailer();
     ASSERT_EQ(gifScanner::scan(whole).Frames.size(), 2) << "a missing trailer loses nothing";
     const gifScanner::GifLayout full = gifScanner::scan(whole);
@@ -125,8 +130,8 @@ TEST(GifFrameDecoder, putsIndicesInTheirRowsAndInterlacedOrder)
 
     constexpr int stride = 9;
     QByteArray target(stride * 11, '\x7F');
-    ASSERT_TRUE(gifFrameDecoder::decode(gif, layout.BlockList[0], layout.Frames[0],
-                                        reinterpret_cast<uchar *>(target.data()), stride));
+    ASSERT_TRUE(gifFrameDecoder::decode(
+        gif, layout.BlockList[0], layout.Frames[0], reinterpret_cast<uchar *>(target.data()), stride));
     for (int y = 0; y < 11; ++y) {
         EXPECT_EQ(target.mid(y * stride, 6), indices.mid(y * 6, 6)) << "row " << y;
         EXPECT_EQ(target.mid(y * stride + 6, 3), QByteArray(3, '\x7F')) << "past the row is untouched";
@@ -142,7 +147,7 @@ TEST(GifFrameDecoder, putsIndicesInTheirRowsAndInterlacedOrder)
     ASSERT_EQ(interlacedLayout.Frames.size(), 1);
     target.fill('\0');
     ASSERT_TRUE(gifFrameDecoder::decode(gif, interlacedLayout.BlockList[0], interlacedLayout.Frames[0],
-                                        reinterpret_cast<uchar *>(target.data()), stride));
+        reinterpret_cast<uchar *>(target.data()), stride));
     for (int y = 0; y < 11; ++y)
         EXPECT_EQ(target.mid(y * stride, 6), indices.mid(y * 6, 6)) << "row " << y;
 }

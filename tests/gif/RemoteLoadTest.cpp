@@ -70,7 +70,8 @@ const QByteArray twoFrames = GifBuilder(7, 5, { 0xFF0000, 0x00FF00 }).solid(0, 0
 
 TEST(RemoteLoad, readsAGifOverHttpWithoutBlocking)
 {
-    TinyHttpServer server({ { "/anim.gif", twoFrames }, { "/short.gif", "GIF89a\7\0\5\0" }, { "/text", "no GIF here at all" } });
+    TinyHttpServer server(
+        { { "/anim.gif", twoFrames }, { "/short.gif", "GIF89a\7\0\5\0" }, { "/text", "no GIF here at all" } });
     ASSERT_TRUE(server.listen());
     ucAniGIF gif;
     gif.setStretch(ucAniGIF::gfsClip);

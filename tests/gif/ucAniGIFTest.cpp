@@ -39,20 +39,23 @@ QByteArray layeredGif()
 {
     return GifBuilder(6, 4, palette)
         .control(1, 1, 3)
-        .image(0, 0, 6, 4, QByteArray("\0\0\0\3\3\3"
-                                      "\0\0\0\3\3\3"
-                                      "\0\0\0\3\3\3"
-                                      "\0\0\0\3\3\3",
-                                      24))
+        .image(0, 0, 6, 4,
+            QByteArray("\0\0\0\3\3\3"
+                       "\0\0\0\3\3\3"
+                       "\0\0\0\3\3\3"
+                       "\0\0\0\3\3\3",
+                24))
         .control(2, 1, 3)
-        .image(1, 1, 3, 2, QByteArray("\1\3\1"
-                                      "\1\1\3",
-                                      6))
+        .image(1, 1, 3, 2,
+            QByteArray("\1\3\1"
+                       "\1\1\3",
+                6))
         .control(3, 1, 3)
-        .image(2, 0, 3, 3, QByteArray("\2\3\2"
-                                      "\3\2\3"
-                                      "\2\2\3",
-                                      9))
+        .image(2, 0, 3, 3,
+            QByteArray("\2\3\2"
+                       "\3\2\3"
+                       "\2\2\3",
+                9))
         .control(0, 1)
         .image(5, 3, 1, 1, QByteArray("\1", 1))
         .bytes();
@@ -132,7 +135,8 @@ TEST_F(AniGif, composesFramesWithDisposalAndTransparency)
     gif.setAction(ucAniGIF::gfaForward);
     EXPECT_EQ(picture(), QStringList({ "RRB.B.", "R..B..", "R.BB..", "RRR..." })) << "disposal 2 cleared frame 2";
     gif.setAction(ucAniGIF::gfaForward);
-    EXPECT_EQ(picture(), QStringList({ "RRR...", "R.....", "R.....", "RRR..G" })) << "disposal 3 put frame 2's clearing back";
+    EXPECT_EQ(picture(), QStringList({ "RRR...", "R.....", "R.....", "RRR..G" }))
+        << "disposal 3 put frame 2's clearing back";
     gif.setAction(ucAniGIF::gfaForward);
     EXPECT_EQ(picture(), first) << "after the last frame the picture starts again";
     EXPECT_EQ(gif.Action(), ucAniGIF::gfaPause);
@@ -327,19 +331,22 @@ TEST_F(AniGif, animatedGifPictureHoldsTheSameIndices)
             qsizetype pos;
         } in { &bytes, 0 };
         int error = 0;
-        GifFileType *file = DGifOpen(&in, [](GifFileType *f, GifByteType *out, int n) {
-            auto *s = static_cast<Source *>(f->UserData);
-            const int count = int(std::min<qsizetype>(n, s->bytes->size() - s->pos));
-            std::memcpy(out, s->bytes->constData() + s->pos, size_t(count));
-            s->pos += count;
-            return count;
-        }, &error);
+        GifFileType *file = DGifOpen(
+            &in,
+            [](GifFileType *f, GifByteType *out, int n) {
+                auto *s = static_cast<Source *>(f->UserData);
+                const int count = int(std::min<qsizetype>(n, s->bytes->size() - s->pos));
+                std::memcpy(out, s->bytes->constData() + s->pos, size_t(count));
+                s->pos += count;
+                return count;
+            },
+            &error);
         QList<QByteArray> frames;
         if (file && DGifSlurp(file) == GIF_OK) {
             for (int i = 0; i < file->ImageCount; ++i) {
                 const GifImageDesc &desc = file->SavedImages[i].ImageDesc;
-                frames.append(QByteArray(reinterpret_cast<const char *>(file->SavedImages[i].RasterBits),
-                                         desc.Width * desc.Height));
+                frames.append(QByteArray(
+                    reinterpret_cast<const char *>(file->SavedImages[i].RasterBits), desc.Width * desc.Height));
             }
         }
         DGifCloseFile(file, &error);
