@@ -20,7 +20,7 @@ QWidget *createGifSection()
     gif->InitNew();
     gif->setStretch(ucAniGIF::gfsActualSize);
     const QString file = zelctl::modFuncs::GetDataPath() + "gif/aguarde.gif";
-    auto *state = new QLabel;
+    auto *state = new QLabel("Imagem 1");
     if (!gif->LoadAnimatedGIF_File(file))
         state->setText("Não foi possível ler " + file);
     QObject::connect(gif, &ucAniGIF::FrameChanged, state,

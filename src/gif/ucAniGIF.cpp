@@ -246,6 +246,7 @@ void ucAniGIF::Private::resizeStep()
     }
     if (size != q->size())
         q->resize(size);
+    q->updateGeometry();
     inResize = false;
 }
 
@@ -552,6 +553,14 @@ void ucAniGIF::setAnimatedGIF(const Picture &picture)
     d->load(gif);
     repaint();
     PropertyChanged(QStringLiteral("AnimatedGIF"));
+}
+
+QSize ucAniGIF::sizeHint() const
+{
+    if (!d->loaded())
+        return SurfaceHost<UserControl>::sizeHint();
+    return { int(std::lround(d->frames.canvasWidth() * d->scaleX)),
+             int(std::lround(d->frames.canvasHeight() * d->scaleY)) };
 }
 
 void ucAniGIF::InitProperties()

@@ -128,6 +128,9 @@ public:
     Picture AnimatedGIF() const;
     void setAnimatedGIF(const Picture &picture);
 
+    // The picture's size as drawn, so layouts give the control room for it.
+    QSize sizeHint() const override;
+
 Q_SIGNALS:
     void Click();
     // Button: 1 left, 2 right, 4 middle; Shift: 1 Shift, 2 Ctrl, 4 Alt.
