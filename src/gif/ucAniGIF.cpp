@@ -14,6 +14,7 @@
 #include <QTimer>
 
 #include <cmath>
+#include <limits>
 
 namespace zelctl {
 
@@ -560,7 +561,7 @@ QSize ucAniGIF::sizeHint() const
     if (!d->loaded())
         return SurfaceHost<UserControl>::sizeHint();
     return { int(std::lround(d->frames.canvasWidth() * d->scaleX)),
-             int(std::lround(d->frames.canvasHeight() * d->scaleY)) };
+        int(std::lround(d->frames.canvasHeight() * d->scaleY)) };
 }
 
 void ucAniGIF::InitProperties()
@@ -584,7 +585,8 @@ void ucAniGIF::ReadProperties(const PropertyBag &bag)
     d->offsetY = bag.ReadProperty("OffsetY", 0).toInt();
     d->load(bag.ReadProperty("GIF").toByteArray());
     // Read after the GIF, so that a saved count overrides the file's own.
-    setLoops(bag.ReadProperty("Loops", d->frames.loopCount()).toInt());
+    const qint64 loops = std::abs(bag.ReadProperty("Loops", d->frames.loopCount()).toLongLong());
+    d->animator.setLoopCount(int(std::min<qint64>(loops, std::numeric_limits<qint32>::max())));
 }
 
 void ucAniGIF::WriteProperties(PropertyBag &bag)

@@ -454,3 +454,20 @@ TEST(GifCanvasPaint, directDrawingMatchesTheMaskBlits)
     }
     gdi::DeleteObject(yellow);
 }
+
+TEST_F(AniGif, forwardsMouseEventsInTwips)
+{
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(layeredGif()));
+    QList<QList<float>> downs;
+    QObject::connect(&gif, &ucAniGIF::MouseDown, [&](qint16 button, qint16 shift, float x, float y) {
+        downs.append({ float(button), float(shift), x, y });
+    });
+    QSignalSpy clicks(&gif, &ucAniGIF::Click);
+    QTest::mouseClick(&gif, Qt::LeftButton, Qt::ShiftModifier, QPoint(2, 3));
+    ASSERT_EQ(downs.size(), 1);
+    EXPECT_EQ(downs[0], QList<float>({ 1, 1, 30, 45 }));
+    EXPECT_EQ(clicks.count(), 1);
+    QTest::mouseClick(&gif, Qt::RightButton, Qt::NoModifier, QPoint(1, 1));
+    EXPECT_EQ(downs.last().first(), 2.0f);
+    EXPECT_EQ(clicks.count(), 1) << "only the left button clicks";
+}
