@@ -27,14 +27,10 @@ public:
     void show(GifFrames &frames, int index);
     // The frames changed (colours, mirroring): the next show composes again.
     void invalidate() { m_shown = 0; }
-    int shown() const { return m_shown; }
 
     // Draws the picture onto dst at `to` (scaled with dst's stretch mode when the sizes
     // differ): transparent parts leave dst as it was.
     void paint(gdi::HDC dst, const QRect &to) const;
-
-    gdi::HDC canvasDc() const { return m_canvas.dc(); }
-    gdi::HDC maskDc() const { return m_mask.dc(); }
 
 private:
     void clear();

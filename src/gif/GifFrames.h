@@ -41,7 +41,6 @@ public:
 
     // Decodes frames up to and including `last` (1-based) that are not decoded yet.
     void decodeUpTo(int last);
-    int decodedCount() const { return m_decoded; }
 
     // Where a frame lies on the canvas, mirrored with the picture.
     QRect frameRect(int index) const;
@@ -53,10 +52,8 @@ public:
     // Turns the strip's frames over, each within its own rectangle (bit 1 left to right,
     // bit 2 top to bottom).
     void setMirror(int mirror);
-    int mirror() const { return m_mirror; }
 
     // Colour table t (0 global, n the n-th local one).
-    int tableCount() const { return int(m_layout.ColorTables.size()); }
     const gifScanner::ColorTable &table(int t) const { return m_layout.ColorTables[t]; }
     // Replaces entries from the first on, up to the table's own count.
     void setTableEntries(int t, const QList<qint32> &entries);
