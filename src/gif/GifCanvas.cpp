@@ -90,17 +90,22 @@ void GifCanvas::compose(GifFrames &frames, int index)
     for (int y = 0; y < rect.height(); ++y) {
         const uchar *source = frames.frameRow(index, y);
         uchar *canvas = m_canvas.row(rect.top() + y) + qsizetype(rect.left()) * 3;
-        uchar *mask = m_mask.row(rect.top() + y);
-        for (int x = 0; x < rect.width(); ++x) {
+        uchar *mask = m_mask.row(rect.top() + y) + (rect.left() >> 3);
+        uchar bit = uchar(0x80u >> (rect.left() & 7));
+        for (int x = 0; x < rect.width(); ++x, canvas += 3) {
             const int value = source[x];
-            if (value == transparent)
-                continue;
-            const quint32 rgb = colours[size_t(value)];
-            canvas[3 * x] = uchar(rgb);
-            canvas[3 * x + 1] = uchar(rgb >> 8);
-            canvas[3 * x + 2] = uchar(rgb >> 16);
-            const int mx = rect.left() + x;
-            mask[mx >> 3] &= uchar(~(0x80u >> (mx & 7)));
+            if (value != transparent) {
+                const quint32 rgb = colours[size_t(value)];
+                canvas[0] = uchar(rgb);
+                canvas[1] = uchar(rgb >> 8);
+                canvas[2] = uchar(rgb >> 16);
+                *mask &= uchar(~bit);
+            }
+            bit >>= 1;
+            if (!bit) {
+                bit = 0x80;
+                ++mask;
+            }
         }
     }
 }
@@ -159,18 +164,18 @@ bool GifCanvas::paintDirect(gdi::HDC dst, const QPoint &at) const
         auto *out = reinterpret_cast<quint32 *>(bits + qsizetype(row) * target.dsBm.bmWidthBytes);
         const uchar *canvas = m_canvas.row(ty - at.y());
         const uchar *mask = m_mask.row(ty - at.y());
-        for (int tx = visible.left(); tx <= visible.right();) {
-            const int x = tx - at.x();
+        int x = visible.left() - at.x();
+        const uchar *source = canvas + 3 * qsizetype(x);
+        for (int tx = visible.left(); tx <= visible.right(); ++tx, ++x, source += 3) {
             // Whole mask bytes of transparent pixels are skipped at once.
             if ((x & 7) == 0 && mask[x >> 3] == 0xFF && tx + 7 <= visible.right()) {
-                tx += 8;
+                tx += 7;
+                x += 7;
+                source += 21;
                 continue;
             }
-            if (!(mask[x >> 3] & (0x80u >> (x & 7)))) {
-                const uchar *p = canvas + 3 * qsizetype(x);
-                out[tx] = 0xFF000000u | quint32(p[2]) << 16 | quint32(p[1]) << 8 | p[0];
-            }
-            ++tx;
+            if (!(mask[x >> 3] & (0x80u >> (x & 7))))
+                out[tx] = 0xFF000000u | quint32(source[2]) << 16 | quint32(source[1]) << 8 | source[0];
         }
     }
     return true;
