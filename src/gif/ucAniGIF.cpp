@@ -276,13 +276,15 @@ ucAniGIF::~ucAniGIF() = default;
 
 bool ucAniGIF::LoadAnimatedGIF_File(const QString &FileName)
 {
+    // A file that cannot be read leaves the GIF shown as it is; one that reads but holds no
+    // frame empties the control, as any load does.
     QFile file(FileName);
-    if (!file.open(QIODevice::ReadOnly) || file.size() <= 0 || file.size() > gifLimits::MaxFileBytes) {
-        d->load(QByteArray());
+    if (!file.open(QIODevice::ReadOnly) || file.size() <= 0 || file.size() > gifLimits::MaxFileBytes)
         return false;
-    }
     const QByteArray bytes = file.readAll();
-    return d->load(bytes.size() == file.size() ? bytes : QByteArray());
+    if (bytes.size() != file.size())
+        return false;
+    return d->load(bytes);
 }
 
 bool ucAniGIF::LoadAnimatedGIF_Array(const QByteArray &Bytes)
