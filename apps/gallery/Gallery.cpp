@@ -53,6 +53,7 @@ Gallery::Gallery(QWidget *parent)
     addSection(QStringLiteral("Seleção"), createSelectionSection());
     addSection(QStringLiteral("Dicas e botões de informação"), createTipsSection());
     addSection(QStringLiteral("Controlos com skin"), createSkinsSection());
+    addSection(QStringLiteral("GIF animado"), createGifSection());
     // Last: which classes this build serves.
     addSection(QStringLiteral("Classes da biblioteca"), classList());
 }
