@@ -46,13 +46,14 @@ Gallery::Gallery(QWidget *parent)
     resize(900, 700);
     addFileMenu();
 
-    addSection(QStringLiteral("NIB"), createNibSection());
-    addSection(QStringLiteral("Escolha do país"), createCountrySection());
-    addSection(QStringLiteral("Dicas e botões de informação"), createTipsSection());
-    addSection(QStringLiteral("Sujeito da declaração"), createSubjectSection());
     addSection(QStringLiteral("NIF"), createNifSection());
-    addSection(QStringLiteral("Controlos com skin"), createSkinsSection());
+    addSection(QStringLiteral("NIB"), createNibSection());
+    addSection(QStringLiteral("Sujeito da declaração"), createSubjectSection());
+    addSection(QStringLiteral("Escolha do país"), createCountrySection());
     addSection(QStringLiteral("Seleção"), createSelectionSection());
+    addSection(QStringLiteral("Dicas e botões de informação"), createTipsSection());
+    addSection(QStringLiteral("Controlos com skin"), createSkinsSection());
+    addSection(QStringLiteral("GIF animado"), createGifSection());
     // Last: which classes this build serves.
     addSection(QStringLiteral("Classes da biblioteca"), classList());
 }
@@ -107,4 +108,11 @@ void Gallery::addFileMenu()
     });
     file->addSeparator();
     file->addAction(QStringLiteral("&Sair"), this, &QWidget::close);
+}
+
+void Gallery::fitToContents()
+{
+    auto *scroll = static_cast<QScrollArea *>(centralWidget());
+    const int frame = 2 * scroll->frameWidth();
+    resize(width() + 8, menuBar()->sizeHint().height() + scroll->widget()->sizeHint().height() + frame + 8);
 }

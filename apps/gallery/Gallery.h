@@ -27,6 +27,9 @@ public:
     bool saveForm(const QString &path, QString *error) const;
     bool openForm(const QString &path, QString *error);
 
+    // Grows the window to show the whole form without scrolling, for a screenshot.
+    void fitToContents();
+
 private:
     void addFileMenu();
 

@@ -18,3 +18,4 @@ QWidget *createNifSection();
 QWidget *createSkinsSection();
 // A selection of a few items with images, and the selection of an EU country.
 QWidget *createSelectionSection();
+QWidget *createGifSection();

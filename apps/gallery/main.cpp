@@ -46,6 +46,7 @@ int main(int argc, char **argv)
     gallery.show();
     if (!parser.isSet(screenshot))
         return app.exec();
+    gallery.fitToContents();
 
     // Let the form lay out and paint once, then grab it.
     int status = 1;

@@ -12,6 +12,7 @@ struct Command
     int (*run)(const QStringList &args, QTextStream &out, QTextStream &err);
 };
 
+int runGifInfo(const QStringList &args, QTextStream &out, QTextStream &err);
 int runClasses(const QStringList &args, QTextStream &out, QTextStream &err);
 int runNib(const QStringList &args, QTextStream &out, QTextStream &err);
 int runNif(const QStringList &args, QTextStream &out, QTextStream &err);

@@ -12,6 +12,7 @@ const std::array commands = {
     Command { "classes", "zelctl classes", runClasses },
     Command { "nib", "zelctl nib NUMBER", runNib },
     Command { "nif", "zelctl nif CC NUMBER | zelctl nif --batch", runNif },
+    Command { "gif-info", "zelctl gif-info [--hash] FILE", runGifInfo },
 };
 
 void printUsage(QTextStream &stream)

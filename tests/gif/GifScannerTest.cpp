@@ -1,0 +1,173 @@
+#include "GifFiles.h"
+
+#include "gif/GifFrameDecoder.h"
+#include "gif/GifScanner.h"
+
+#include <gtest/gtest.h>
+
+using namespace zelctl;
+using zelctl::test::GifBuilder;
+
+namespace {
+
+const QList<quint32> fourColours = { 0x000000, 0xFF0000, 0x00FF00, 0x0000FF };
+
+} // namespace
+
+TEST(GifScanner, readsFramesTablesAndCanvas)
+{
+    const QByteArray gif = GifBuilder(16, 8, fourColours)
+                               .netscape(3)
+                               .control(1, 5)
+                               .solid(0, 0, 4, 4, 1)
+                               .control(2, 0, 3)
+                               .solid(10, 2, 20, 6, 2, { 0x112233, 0x445566 }) // a 2-entry local table
+                               .bytes();
+    const gifScanner::GifLayout layout = gifScanner::scan(gif);
+    ASSERT_EQ(layout.Frames.size(), 2);
+    EXPECT_EQ(layout.LoopCount, 3);
+    EXPECT_EQ(layout.ColorTables.size(), 2);
+    EXPECT_EQ(layout.ColorTables[0].count, 4);
+    EXPECT_EQ(layout.ColorTables[0].entries[3], 0x0000FFu);
+    EXPECT_EQ(layout.ColorTables[1].count, 2) << "size field 1 is two entries";
+    EXPECT_EQ(layout.ColorTables[1].entries[1], 0x445566u);
+
+    const gifScanner::FrameRecord &first = layout.Frames[0];
+    EXPECT_EQ(first.Delay, 50) << "hundredths become milliseconds";
+    EXPECT_EQ(first.Disposal, 1);
+    EXPECT_EQ(first.HasTransparency, 0);
+    EXPECT_EQ(first.ColorTable, 0);
+    const gifScanner::FrameRecord &second = layout.Frames[1];
+    EXPECT_EQ(second.Left, 10);
+    EXPECT_EQ(second.Width, 20);
+    EXPECT_EQ(second.Delay, 0);
+    EXPECT_EQ(second.Disposal, 2);
+    EXPECT_EQ(second.HasTransparency, 1);
+    EXPECT_EQ(second.TransparentIndex, 3);
+    EXPECT_EQ(second.ColorTable, 1);
+
+    EXPECT_EQ(layout.CanvasWidth, 30) << "the frame reaches past the logical screen";
+    EXPECT_EQ(layout.CanvasHeight, 8);
+    ASSERT_EQ(layout.BlockList.size(), 2);
+    EXPECT_EQ(gif[layout.BlockList[0].Start], '\x2C');
+    EXPECT_EQ(gif[layout.BlockList[1].Start + layout.BlockList[1].Length - 1], '\0') << "ends with the terminator";
+    EXPECT_EQ(gif[layout.BlockList[1].Start + layout.BlockList[1].Length], '\x3B');
+}
+
+TEST(GifScanner, disposalThreeOnTheFirstFrameOnly)
+{
+    const QByteArray gif
+        = GifBuilder(4, 4, fourColours).control(3, 1).solid(0, 0, 4, 4, 1).control(3, 1).solid(0, 0, 2, 2, 2).bytes();
+    const gifScanner::GifLayout layout = gifScanner::scan(gif);
+    ASSERT_EQ(layout.Frames.size(), 2);
+    EXPECT_EQ(layout.Frames[0].Disposal, 0);
+    EXPECT_EQ(layout.Frames[1].Disposal, 3);
+}
+
+TEST(GifScanner, toleratesOddButHarmlessBytes)
+{
+    const QByteArray gif = GifBuilder(4, 4, fourColours, "gIf87A")
+                               .netscape(0, "netscape2.0")
+                               .raw(QByteArray(3, '\0')) // stray zero bytes between blocks
+                               .raw(QByteArray("\x21\xFE\x03"
+                                               "abc\x00",
+                                   7)) // a comment
+                               .solid(0, 0, 4, 4, 1)
+                               .raw(QByteArray(2, '\0'))
+                               .netscape(7, "netscape2.0")
+                               .solid(0, 0, 4, 4, 2)
+                               .bytes();
+    const gifScanner::GifLayout layout = gifScanner::scan(gif);
+    EXPECT_EQ(layout.Frames.size(), 2);
+    EXPECT_EQ(layout.LoopCount, 7) << "the extension is recognised in lower case";
+    EXPECT_EQ(gifScanner::scan(GifBuilder(4, 4, fourColours).netscape(0).solid(0, 0, 4, 4, 1).bytes()).LoopCount, 0);
+}
+
+TEST(GifScanner, refusesWhatIsNotAGifOrHasNoColours)
+{
+    EXPECT_TRUE(gifScanner::scan(QByteArray()).Frames.isEmpty());
+    EXPECT_TRUE(gifScanner::scan(QByteArray("GIF88a")).Frames.isEmpty());
+    EXPECT_TRUE(
+        gifScanner::scan(GifBuilder(4, 4, fourColours, "GIF90a").solid(0, 0, 4, 4, 1).bytes()).Frames.isEmpty());
+
+    // The second frame has no table of its own and there is no global one: nothing loads.
+    const QByteArray noTable = GifBuilder(4, 4)
+                                   .solid(0, 0, 4, 4, 1, { 0, 0xFFFFFF })
+                                   .solid(0, 0, 4, 4, 1)
+                                   .solid(0, 0, 4, 4, 1, { 0, 1 })
+                                   .bytes();
+    const gifScanner::GifLayout layout = gifScanner::scan(noTable);
+    EXPECT_TRUE(layout.Frames.isEmpty());
+    EXPECT_EQ(layout.CanvasWidth, 0);
+}
+
+TEST(GifScanner, truncatedFileKeepsItsCompleteFrames)
+{
+    const GifBuilder builder
+        = GifBuilder(8, 8, fourColours).control(0, 2).solid(0, 0, 8, 8, 1).control(0, 2).solid(0, 0, 8, 8, 2);
+    const QByteArray whole = builder.withoutTrailer();
+    ASSERT_EQ(gifScanner::scan(whole).Frames.size(), 2) << "a missing trailer loses nothing";
+    const gifScanner::GifLayout full = gifScanner::scan(whole);
+    const int secondEnd = full.BlockList[1].Start + full.BlockList[1].Length;
+    for (int cut = 0; cut < whole.size(); ++cut) {
+        const gifScanner::GifLayout layout = gifScanner::scan(whole.left(cut));
+        const int expected = cut >= secondEnd ? 2 : cut >= full.BlockList[0].Start + full.BlockList[0].Length ? 1 : 0;
+        ASSERT_EQ(layout.Frames.size(), expected) << "cut at " << cut;
+        EXPECT_EQ(layout.BlockList.size(), layout.Frames.size());
+    }
+    // A colour table cut short ends the scan too.
+    EXPECT_TRUE(gifScanner::scan(GifBuilder(4, 4, fourColours).bytes().left(20)).Frames.isEmpty());
+}
+
+TEST(GifFrameDecoder, putsIndicesInTheirRowsAndInterlacedOrder)
+{
+    QByteArray indices;
+    for (int i = 0; i < 6 * 11; ++i)
+        indices.append(char((i * 7 + i / 6) % 4));
+    QByteArray gif = GifBuilder(6, 11, fourColours).image(0, 0, 6, 11, indices).bytes();
+    const gifScanner::GifLayout layout = gifScanner::scan(gif);
+    ASSERT_EQ(layout.Frames.size(), 1);
+
+    constexpr int stride = 9;
+    QByteArray target(stride * 11, '\x7F');
+    ASSERT_TRUE(gifFrameDecoder::decode(
+        gif, layout.BlockList[0], layout.Frames[0], reinterpret_cast<uchar *>(target.data()), stride));
+    for (int y = 0; y < 11; ++y) {
+        EXPECT_EQ(target.mid(y * stride, 6), indices.mid(y * 6, 6)) << "row " << y;
+        EXPECT_EQ(target.mid(y * stride + 6, 3), QByteArray(3, '\x7F')) << "past the row is untouched";
+    }
+
+    // The same rows stored interlaced (0, 8, 4, 2, 6, 10, 1, 3, 5, 7, 9) come back in order.
+    QByteArray interlaced;
+    for (int row : { 0, 8, 4, 2, 6, 10, 1, 3, 5, 7, 9 })
+        interlaced.append(indices.mid(row * 6, 6));
+    gif = GifBuilder(6, 11, fourColours).image(0, 0, 6, 11, interlaced).bytes();
+    gif[13 + 12 + 9] = char(0x40); // the descriptor's interlace flag
+    const gifScanner::GifLayout interlacedLayout = gifScanner::scan(gif);
+    ASSERT_EQ(interlacedLayout.Frames.size(), 1);
+    target.fill('\0');
+    ASSERT_TRUE(gifFrameDecoder::decode(gif, interlacedLayout.BlockList[0], interlacedLayout.Frames[0],
+        reinterpret_cast<uchar *>(target.data()), stride));
+    for (int y = 0; y < 11; ++y)
+        EXPECT_EQ(target.mid(y * stride, 6), indices.mid(y * 6, 6)) << "row " << y;
+}
+
+TEST(GifFrameDecoder, damagedDataFailsWithoutWritingOutside)
+{
+    QByteArray gif = GifBuilder(8, 8, fourColours).solid(0, 0, 8, 8, 3).bytes();
+    const gifScanner::GifLayout layout = gifScanner::scan(gif);
+    ASSERT_EQ(layout.Frames.size(), 1);
+    gifScanner::FrameRecord wrongSize = layout.Frames[0];
+    wrongSize.Width = 9;
+    QByteArray target(9 * 9, '\0');
+    auto *bits = reinterpret_cast<uchar *>(target.data());
+    EXPECT_FALSE(gifFrameDecoder::decode(gif, layout.BlockList[0], wrongSize, bits, 9));
+    gifScanner::BlockEntry outside = layout.BlockList[0];
+    outside.Length = int(gif.size());
+    EXPECT_FALSE(gifFrameDecoder::decode(gif, outside, layout.Frames[0], bits, 8));
+
+    // LZW data cut to its first sub-block of one byte: the rows it reaches stand.
+    const int data = layout.BlockList[0].Start + 11;
+    gif[data] = '\x01';
+    EXPECT_FALSE(gifFrameDecoder::decode(gif, layout.BlockList[0], layout.Frames[0], bits, 8));
+}

@@ -1,0 +1,472 @@
+#include "GifFiles.h"
+
+#include "gif/GifCanvas.h"
+#include "gif/GifFrames.h"
+#include "gif/ucAniGIF.h"
+#include "platform/Twips.h"
+
+#include <QSignalSpy>
+#include <QTemporaryDir>
+#include <QTest>
+
+#include <gif_lib.h>
+
+#include <gtest/gtest.h>
+
+#include <cstring>
+
+using namespace zelctl;
+using zelctl::test::GifBuilder;
+
+QT_BEGIN_NAMESPACE
+// Readable failures for the expected pictures.
+inline void PrintTo(const QString &text, std::ostream *out)
+{
+    *out << '"' << text.toStdString() << '"';
+}
+QT_END_NAMESPACE
+
+namespace {
+
+constexpr quint32 Red = 0xFF0000, Green = 0x00FF00, Blue = 0x0000FF, Grey = 0x808080;
+constexpr quint32 Yellow = 0xFFFF00; // the control's background in these tests
+const QList<quint32> palette = { Red, Green, Blue, Grey };
+
+// Frames over a 6 × 4 canvas with index 3 transparent:
+//   1 (0,0) 6×4, left half red, disposal 1     3 (2,0) 3×3 blue, disposal 3
+//   2 (1,1) 3×2 green, disposal 2              4 (5,3) 1×1 green, opaque, disposal 0
+QByteArray layeredGif()
+{
+    return GifBuilder(6, 4, palette)
+        .control(1, 1, 3)
+        .image(0, 0, 6, 4,
+            QByteArray("\0\0\0\3\3\3"
+                       "\0\0\0\3\3\3"
+                       "\0\0\0\3\3\3"
+                       "\0\0\0\3\3\3",
+                24))
+        .control(2, 1, 3)
+        .image(1, 1, 3, 2,
+            QByteArray("\1\3\1"
+                       "\1\1\3",
+                6))
+        .control(3, 1, 3)
+        .image(2, 0, 3, 3,
+            QByteArray("\2\3\2"
+                       "\3\2\3"
+                       "\2\2\3",
+                9))
+        .control(0, 1)
+        .image(5, 3, 1, 1, QByteArray("\1", 1))
+        .bytes();
+}
+
+QStringList shownPixels(const QImage &image)
+{
+    QStringList rows;
+    for (int y = 0; y < image.height(); ++y) {
+        QString row;
+        for (int x = 0; x < image.width(); ++x) {
+            switch (image.pixel(x, y) & 0xFFFFFF) {
+            case Red:
+                row += 'R';
+                break;
+            case Green:
+                row += 'G';
+                break;
+            case Blue:
+                row += 'B';
+                break;
+            case Yellow:
+                row += '.';
+                break;
+            case 0x222222:
+                row += 'd';
+                break;
+            default:
+                row += QStringLiteral("<%1>").arg(image.pixel(x, y), 8, 16, QLatin1Char('0'));
+                break;
+            }
+        }
+        rows << row;
+    }
+    return rows;
+}
+
+class AniGif : public ::testing::Test
+{
+protected:
+    void SetUp() override
+    {
+        Ambient ambient;
+        ambient.BackColor = 0x0000FFFF; // yellow as OLE_COLOR
+        gif.setAmbient(ambient);
+        gif.InitNew();
+        gif.setDelayAnimation(ucAniGIF::gfdDoNotAnimate);
+        gif.setStretch(ucAniGIF::gfsActualSize);
+        gif.show();
+        ASSERT_TRUE(QTest::qWaitForWindowExposed(&gif));
+    }
+
+    QStringList picture()
+    {
+        gif.repaint();
+        return shownPixels(gif.surface().image());
+    }
+
+    ucAniGIF gif;
+};
+
+} // namespace
+
+TEST_F(AniGif, composesFramesWithDisposalAndTransparency)
+{
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(layeredGif()));
+    EXPECT_EQ(gif.FrameCount(), 4);
+    EXPECT_EQ(gif.size(), QSize(6, 4));
+    QSignalSpy changed(&gif, &ucAniGIF::FrameChanged);
+
+    const QStringList first = { "RRR...", "RRR...", "RRR...", "RRR..." };
+    EXPECT_EQ(picture(), first);
+    gif.setAction(ucAniGIF::gfaForward);
+    const QStringList second = { "RRR...", "RGRG..", "RGG...", "RRR..." };
+    EXPECT_EQ(picture(), second);
+    EXPECT_EQ(picture(), second) << "painting the same frame again changes nothing";
+    gif.setAction(ucAniGIF::gfaForward);
+    EXPECT_EQ(picture(), QStringList({ "RRB.B.", "R..B..", "R.BB..", "RRR..." })) << "disposal 2 cleared frame 2";
+    gif.setAction(ucAniGIF::gfaForward);
+    EXPECT_EQ(picture(), QStringList({ "RRR...", "R.....", "R.....", "RRR..G" }))
+        << "disposal 3 put frame 2's clearing back";
+    gif.setAction(ucAniGIF::gfaForward);
+    EXPECT_EQ(picture(), first) << "after the last frame the picture starts again";
+    EXPECT_EQ(gif.Action(), ucAniGIF::gfaPause);
+    ASSERT_FALSE(changed.isEmpty());
+    EXPECT_EQ(changed.last().first().toInt(), 1);
+
+    gif.setAction(ucAniGIF::gfaForward);
+    gif.setAction(ucAniGIF::gfaStop);
+    EXPECT_EQ(picture(), first);
+    EXPECT_EQ(gif.Action(), ucAniGIF::gfaStop);
+}
+
+TEST_F(AniGif, mirrorsThePictureAndTheFramePositions)
+{
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(layeredGif()));
+    gif.setAction(ucAniGIF::gfaForward);
+    gif.setAction(ucAniGIF::gfaForward);
+    gif.setMirrored(ucAniGIF::gfmHorizontal);
+    EXPECT_EQ(picture(), QStringList({ ".B.BRR", "..B..R", "..BB.R", "...RRR" }));
+    gif.setMirrored(ucAniGIF::gfmHorAndVer);
+    EXPECT_EQ(picture(), QStringList({ "...RRR", "..BB.R", "..B..R", ".B.BRR" }));
+    gif.setMirrored(ucAniGIF::gfmVertical);
+    EXPECT_EQ(picture(), QStringList({ "RRR...", "R.BB..", "R..B..", "RRB.B." }));
+    gif.setMirrored(7);
+    EXPECT_EQ(gif.Mirrored(), ucAniGIF::gfmVertical) << "values above 3 are refused";
+    gif.setMirrored(ucAniGIF::gfmNone);
+    EXPECT_EQ(picture(), QStringList({ "RRB.B.", "R..B..", "R.BB..", "RRR..." }));
+}
+
+TEST_F(AniGif, stretchModesSizeAndScaleThePicture)
+{
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(layeredGif()));
+    EXPECT_EQ(gif.ActualWidth(), platform::twipsFromPixels(6));
+    EXPECT_EQ(gif.ActualHeight(), platform::twipsFromPixels(4));
+
+    gif.setStretch(ucAniGIF::gfsStretch);
+    gif.resize(12, 12);
+    EXPECT_EQ(gif.size(), QSize(12, 12)) << "stretch keeps the control's size";
+    QStringList stretched;
+    for (const QString &row : QStringList { "RRR...", "RRR...", "RRR...", "RRR..." }) {
+        QString wide;
+        for (QChar c : row)
+            wide += QString(2, c);
+        stretched << wide << wide << wide;
+    }
+    EXPECT_EQ(picture(), stretched);
+
+    gif.setStretch(ucAniGIF::gfsScaleAlways);
+    EXPECT_EQ(gif.size(), QSize(12, 8)) << "the smaller ratio, 2, for both sides";
+    gif.setStretch(ucAniGIF::gfsShrinkScaleToFit);
+    EXPECT_EQ(gif.size(), QSize(6, 4)) << "a picture that fits is not enlarged";
+    gif.setStretch(ucAniGIF::gfsStretch);
+    gif.resize(3, 8);
+    gif.setStretch(ucAniGIF::gfsShrinkScaleToFit);
+    EXPECT_EQ(gif.size(), QSize(3, 2)) << "one ratio below 1 scales down";
+    gif.setStretch(ucAniGIF::gfsClip);
+    gif.resize(20, 3);
+    EXPECT_EQ(gif.size(), QSize(6, 3)) << "clip is never larger than the picture";
+    EXPECT_EQ(picture(), QStringList({ "RRR...", "RRR...", "RRR..." }));
+    gif.setStretch(9);
+    EXPECT_EQ(gif.Stretch(), ucAniGIF::gfsClip);
+
+    gif.setStretch(ucAniGIF::gfsActualSize);
+    gif.setOffsetX(2);
+    gif.setOffsetY(-1);
+    EXPECT_EQ(picture(), QStringList({ "..RRR.", "..RRR.", "..RRR.", "......" }));
+}
+
+TEST_F(AniGif, timerRules)
+{
+    gif.setMinFrameDelay(5);
+    EXPECT_EQ(gif.MinFrameDelay(), 10);
+    gif.setMinFrameDelay(32767);
+    EXPECT_EQ(gif.MinFrameDelay(), 32700);
+    gif.setMinFrameDelay(10);
+
+    const QByteArray three = GifBuilder(2, 2, palette)
+                                 .netscape(0)
+                                 .control(0, 1)
+                                 .solid(0, 0, 2, 2, 0)
+                                 .control(0, 1)
+                                 .solid(0, 0, 2, 2, 1)
+                                 .control(0, 1)
+                                 .solid(0, 0, 2, 2, 2)
+                                 .bytes();
+    EXPECT_EQ(gif.LoopsRemaining(), -1) << "no GIF";
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(three));
+    EXPECT_EQ(gif.LoopsRemaining(), 0) << "endless";
+    gif.setLoops(-2);
+    EXPECT_EQ(gif.Loops(), 2);
+    EXPECT_EQ(gif.LoopsRemaining(), 2);
+
+    QList<int> frames;
+    QObject::connect(&gif, &ucAniGIF::FrameChanged, [&](qint32 index) { frames.append(index); });
+    QSignalSpy ended(&gif, &ucAniGIF::LoopsEnded);
+    gif.setAction(ucAniGIF::gfaPlay);
+    EXPECT_EQ(gif.Action(), ucAniGIF::gfaPlay);
+    QTRY_COMPARE_WITH_TIMEOUT(ended.count(), 1, 5000);
+    EXPECT_EQ(frames, QList<int>({ 2, 3, 1, 2, 3, 1 }));
+    EXPECT_EQ(gif.LoopsRemaining(), 2) << "the count was reset";
+    EXPECT_EQ(gif.Action(), ucAniGIF::gfaStop);
+
+    gif.setAction(ucAniGIF::gfaForward);
+    gif.setAction(ucAniGIF::gfaForward);
+    gif.setAction(ucAniGIF::gfaForward);
+    EXPECT_EQ(frames.last(), 1) << "forward on the last frame shows the first";
+    EXPECT_EQ(gif.Action(), ucAniGIF::gfaPause);
+    gif.setAction(ucAniGIF::gfaReset);
+    EXPECT_EQ(gif.Action(), ucAniGIF::gfaPlay);
+    gif.hide();
+    EXPECT_EQ(gif.Action(), ucAniGIF::gfaPause) << "a hidden control does not animate";
+    gif.show();
+    EXPECT_EQ(gif.Action(), ucAniGIF::gfaPlay);
+    gif.setAction(42);
+    EXPECT_EQ(gif.Action(), ucAniGIF::gfaPlay);
+}
+
+TEST_F(AniGif, startsByItselfAfterTheFirstFrameUnlessAskedNotTo)
+{
+    const QByteArray two
+        = GifBuilder(2, 2, palette).control(0, 1).solid(0, 0, 2, 2, 0).control(0, 1).solid(0, 0, 2, 2, 1).bytes();
+    gif.setDelayAnimation(ucAniGIF::gfdDelayStartup);
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(two));
+    EXPECT_EQ(picture(), QStringList({ "RR", "RR" })) << "the first frame shows at once";
+    EXPECT_EQ(gif.Action(), ucAniGIF::gfaStop);
+    QTRY_COMPARE(gif.Action(), ucAniGIF::gfaPlay);
+
+    gif.setDelayAnimation(ucAniGIF::gfdDoNotAnimate);
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(two));
+    QTest::qWait(60);
+    EXPECT_EQ(gif.Action(), ucAniGIF::gfaStop);
+
+    Ambient design = gif.ambient();
+    design.UserMode = false;
+    gif.setAmbient(design);
+    gif.setDelayAnimation(ucAniGIF::gfdNone);
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(two));
+    gif.setAction(ucAniGIF::gfaPlay);
+    EXPECT_EQ(gif.Action(), ucAniGIF::gfaStop) << "nothing moves at design time";
+    EXPECT_EQ(gif.surface().image().pixel(0, 0) & 0xFFFFFF, 0u) << "a frame is drawn round the control";
+}
+
+TEST_F(AniGif, paletteOperations)
+{
+    QList<qint32> entries;
+    EXPECT_FALSE(gif.GetPalette(0, entries)) << "no GIF";
+    const QByteArray gifBytes = GifBuilder(2, 1, palette)
+                                    .solid(0, 0, 1, 1, 0)
+                                    .image(1, 0, 1, 1, QByteArray(1, '\1'), { 0x111111, 0x222222 })
+                                    .bytes();
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(gifBytes));
+    ASSERT_TRUE(gif.GetPalette(0, entries));
+    EXPECT_EQ(entries, QList<qint32>({ qint32(Red), qint32(Green), qint32(Blue), qint32(Grey) }));
+    EXPECT_FALSE(gif.GetPalette(1, entries)) << "frame 1 uses the global table";
+    ASSERT_TRUE(gif.GetPalette(2, entries));
+    EXPECT_EQ(entries, QList<qint32>({ 0x111111, 0x222222 }));
+    EXPECT_FALSE(gif.GetPalette(3, entries));
+    EXPECT_FALSE(gif.GetPalette(-1, entries));
+
+    gif.setAction(ucAniGIF::gfaForward); // both frames on the canvas
+    EXPECT_EQ(picture(), QStringList({ "Rd" }));
+    ASSERT_TRUE(gif.CacheColorTables());
+    EXPECT_FALSE(gif.CacheColorTables()) << "a copy is already kept";
+    ASSERT_TRUE(gif.SetPalette(0, { qint32(Blue) }));
+    ASSERT_TRUE(gif.SetPalette(2, { 0x111111, qint32(Green), 0x333333 }));
+    EXPECT_EQ(picture(), QStringList({ "BG" })) << "new colours show at once";
+    ASSERT_TRUE(gif.GetPalette(2, entries));
+    EXPECT_EQ(entries.size(), 2) << "entries past the table's size are ignored";
+    EXPECT_FALSE(gif.SetPalette(1, { 0 }));
+
+    ASSERT_TRUE(gif.RestoreColorTables(false));
+    EXPECT_EQ(picture(), QStringList({ "Rd" }));
+    ASSERT_TRUE(gif.RestoreColorTables(true));
+    EXPECT_FALSE(gif.RestoreColorTables(true)) << "the copy was released";
+}
+
+TEST_F(AniGif, animatedGifPictureHoldsTheSameIndices)
+{
+    EXPECT_TRUE(gif.AnimatedGIF().isNull());
+    const QByteArray source = layeredGif();
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(source));
+    gif.setMirrored(ucAniGIF::gfmHorAndVer);
+    const Picture picture = gif.AnimatedGIF();
+    ASSERT_FALSE(picture.isNull());
+    EXPECT_EQ(picture.width(), 6);
+    const QByteArray written = QByteArray::fromBase64(picture.image().text("GIF").toLatin1());
+
+    auto slurp = [](const QByteArray &bytes) {
+        struct Source
+        {
+            const QByteArray *bytes;
+            qsizetype pos;
+        } in { &bytes, 0 };
+        int error = 0;
+        GifFileType *file = DGifOpen(
+            &in,
+            [](GifFileType *f, GifByteType *out, int n) {
+                auto *s = static_cast<Source *>(f->UserData);
+                const int count = int(std::min<qsizetype>(n, s->bytes->size() - s->pos));
+                std::memcpy(out, s->bytes->constData() + s->pos, size_t(count));
+                s->pos += count;
+                return count;
+            },
+            &error);
+        QList<QByteArray> frames;
+        if (file && DGifSlurp(file) == GIF_OK) {
+            for (int i = 0; i < file->ImageCount; ++i) {
+                const GifImageDesc &desc = file->SavedImages[i].ImageDesc;
+                frames.append(QByteArray(
+                    reinterpret_cast<const char *>(file->SavedImages[i].RasterBits), desc.Width * desc.Height));
+            }
+        }
+        DGifCloseFile(file, &error);
+        return frames;
+    };
+    const QList<QByteArray> expected = slurp(source);
+    ASSERT_EQ(expected.size(), 4);
+    EXPECT_EQ(slurp(written), expected) << "written as the file had it, not mirrored";
+
+    // At design time the picture loads back with all its frames; while running it is ignored.
+    ucAniGIF other;
+    Ambient design;
+    design.UserMode = false;
+    other.setAmbient(design);
+    other.setAnimatedGIF(picture);
+    EXPECT_EQ(other.FrameCount(), 4);
+    other.setAnimatedGIF(Picture());
+    EXPECT_EQ(other.FrameCount(), 0);
+    gif.setAnimatedGIF(Picture());
+    EXPECT_EQ(gif.FrameCount(), 4);
+}
+
+TEST_F(AniGif, persistsItsPropertiesAndTheGif)
+{
+    const QByteArray looping = GifBuilder(2, 2, palette).netscape(3).solid(0, 0, 2, 2, 0).solid(0, 0, 2, 2, 1).bytes();
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(looping));
+    EXPECT_EQ(gif.Loops(), 3);
+    gif.setLoops(0);
+    gif.setMinFrameDelay(120);
+    gif.setMirrored(ucAniGIF::gfmHorizontal);
+    gif.setOffsetX(4);
+    const PropertyBag bag = gif.Save();
+    EXPECT_EQ(bag.names(), QStringList({ "GIF", "Delay", "Stretch", "Loops", "DelayLoad", "Mirror", "OffsetX" }));
+
+    ucAniGIF loaded;
+    loaded.Load(bag);
+    EXPECT_EQ(loaded.FrameCount(), 2);
+    EXPECT_EQ(loaded.Loops(), 0) << "an endless count survives the file's own count";
+    EXPECT_EQ(loaded.MinFrameDelay(), 120);
+    EXPECT_EQ(loaded.Mirrored(), ucAniGIF::gfmHorizontal);
+    EXPECT_EQ(loaded.OffsetX(), 4);
+    EXPECT_EQ(loaded.DelayAnimation(), ucAniGIF::gfdDoNotAnimate);
+
+    PropertyBag old;
+    old.WriteProperty("GIF", looping);
+    old.WriteProperty("DelayLoad", -1);
+    ucAniGIF fromOld;
+    fromOld.Load(old);
+    EXPECT_EQ(fromOld.Loops(), 3) << "without a saved count, the file's";
+    EXPECT_EQ(fromOld.DelayAnimation(), ucAniGIF::gfdDelayStartup);
+    EXPECT_EQ(fromOld.MinFrameDelay(), 50);
+}
+
+TEST_F(AniGif, badInputLoadsNothing)
+{
+    QTemporaryDir dir;
+    const QByteArray good = layeredGif();
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(good));
+    EXPECT_FALSE(gif.LoadAnimatedGIF_File(dir.filePath("missing.gif")));
+    EXPECT_EQ(gif.FrameCount(), 4) << "a file that cannot be read loses nothing";
+    EXPECT_FALSE(gif.LoadAnimatedGIF_Array(QByteArray("GIF89a")));
+    EXPECT_EQ(gif.FrameCount(), 0) << "bytes without a frame empty the control";
+    EXPECT_EQ(gif.LoopsRemaining(), -1);
+    EXPECT_EQ(picture(), QStringList({ "......", "......", "......", "......" }));
+
+    QFile file(dir.filePath("cut.gif"));
+    ASSERT_TRUE(file.open(QIODevice::WriteOnly));
+    file.write(good.left(good.size() - 20));
+    file.close();
+    EXPECT_TRUE(gif.LoadAnimatedGIF_File(file.fileName()));
+    EXPECT_EQ(gif.FrameCount(), 3) << "the last frame was cut";
+
+    // Frames that would need more memory than allowed are left out.
+    // A 65535 × 65535 frame with two bytes of data:
+    const QByteArray hugeFrame("\x2C\0\0\0\0\xFF\xFF\xFF\xFF\0\x02\x02\x4C\x01\0", 15);
+    EXPECT_TRUE(gif.LoadAnimatedGIF_Array(GifBuilder(10, 10, palette).solid(0, 0, 10, 10, 1).raw(hugeFrame).bytes()));
+    EXPECT_EQ(gif.FrameCount(), 1);
+    EXPECT_FALSE(gif.LoadAnimatedGIF_Array(GifBuilder(10, 10, palette).raw(hugeFrame).bytes()));
+}
+
+TEST(GifCanvasPaint, directDrawingMatchesTheMaskBlits)
+{
+    GifFrames frames;
+    GifCanvas canvas;
+    ASSERT_TRUE(frames.load(layeredGif()));
+    ASSERT_TRUE(canvas.create(frames.canvasWidth(), frames.canvasHeight()));
+    frames.setMirror(ucAniGIF::gfmHorizontal);
+    // A 32-bit target is drawn directly, a 24-bit one through the AND and OR blits.
+    MemoryBitmap direct, blitted;
+    ASSERT_TRUE(direct.create(9, 7, 32));
+    ASSERT_TRUE(blitted.create(9, 7, 24));
+    const gdi::HBRUSH yellow = gdi::CreateSolidBrush(0x0000FFFF);
+    for (int index = 1; index <= frames.count(); ++index) {
+        canvas.show(frames, index);
+        for (const MemoryBitmap *target : { &direct, &blitted }) {
+            gdi::FillRect(target->dc(), gdi::RECT { 0, 0, 9, 7 }, yellow);
+            canvas.paint(target->dc(), QRect(QPoint(index - 2, 1), QSize(6, 4)));
+        }
+        for (int y = 0; y < 7; ++y) {
+            for (int x = 0; x < 9; ++x)
+                ASSERT_EQ(gdi::GetPixel(direct.dc(), x, y), gdi::GetPixel(blitted.dc(), x, y))
+                    << "frame " << index << " at " << x << "," << y;
+        }
+    }
+    gdi::DeleteObject(yellow);
+}
+
+TEST_F(AniGif, forwardsMouseEventsInTwips)
+{
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(layeredGif()));
+    QList<QList<float>> downs;
+    QObject::connect(&gif, &ucAniGIF::MouseDown, [&](qint16 button, qint16 shift, float x, float y) {
+        downs.append({ float(button), float(shift), x, y });
+    });
+    QSignalSpy clicks(&gif, &ucAniGIF::Click);
+    QTest::mouseClick(&gif, Qt::LeftButton, Qt::ShiftModifier, QPoint(2, 3));
+    ASSERT_EQ(downs.size(), 1);
+    EXPECT_EQ(downs[0], QList<float>({ 1, 1, 30, 45 }));
+    EXPECT_EQ(clicks.count(), 1);
+    QTest::mouseClick(&gif, Qt::RightButton, Qt::NoModifier, QPoint(1, 1));
+    EXPECT_EQ(downs.last().first(), 2.0f);
+    EXPECT_EQ(clicks.count(), 1) << "only the left button clicks";
+}
