@@ -14,3 +14,5 @@ struct Command
 
 int runClasses(const QStringList &args, QTextStream &out, QTextStream &err);
 int runNib(const QStringList &args, QTextStream &out, QTextStream &err);
+int runPngInfo(const QStringList &args, QTextStream &out, QTextStream &err);
+int runPngDecode(const QStringList &args, QTextStream &out, QTextStream &err);
