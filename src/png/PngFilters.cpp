@@ -61,17 +61,38 @@ void unfilterAverage(uint8_t *row, const uint8_t *previous, qsizetype length, in
 #if defined(__SSE2__)
 // Pixels of 3, 4, 6 or 8 bytes are restored one whole pixel at a time in 16-bit lanes: each
 // pixel depends on the one before it, but its bytes do not depend on each other.
+// Loads go through integer registers: assembling odd sizes in memory would stall on every pixel.
 template <int Distance> __m128i loadPixel(const uint8_t *p)
 {
-    uint64_t value = 0;
-    std::memcpy(&value, p, Distance);
-    return _mm_unpacklo_epi8(_mm_cvtsi64_si128(int64_t(value)), _mm_setzero_si128());
+    __m128i bytes;
+    if constexpr (Distance == 3) {
+        bytes = _mm_cvtsi32_si128(int(p[0] | p[1] << 8 | p[2] << 16));
+    } else if constexpr (Distance == 4) {
+        uint32_t value;
+        std::memcpy(&value, p, 4);
+        bytes = _mm_cvtsi32_si128(int(value));
+    } else if constexpr (Distance == 6) {
+        uint32_t low;
+        uint16_t high;
+        std::memcpy(&low, p, 4);
+        std::memcpy(&high, p + 4, 2);
+        bytes = _mm_cvtsi64_si128(int64_t(low | uint64_t(high) << 32));
+    } else {
+        bytes = _mm_loadl_epi64(reinterpret_cast<const __m128i *>(p));
+    }
+    return _mm_unpacklo_epi8(bytes, _mm_setzero_si128());
 }
 
 template <int Distance> void storePixel(uint8_t *p, __m128i wide)
 {
-    const uint64_t value = uint64_t(_mm_cvtsi128_si64(_mm_packus_epi16(wide, wide)));
-    std::memcpy(p, &value, Distance);
+    const __m128i bytes = _mm_packus_epi16(wide, wide);
+    if constexpr (Distance <= 4) {
+        const uint32_t value = uint32_t(_mm_cvtsi128_si32(bytes));
+        std::memcpy(p, &value, Distance);
+    } else {
+        const uint64_t value = uint64_t(_mm_cvtsi128_si64(bytes));
+        std::memcpy(p, &value, Distance);
+    }
 }
 
 inline __m128i absolute16(__m128i x)

@@ -2,6 +2,7 @@
 
 #include "PngChunkReader.h"
 #include "PngDecoder.h"
+#include "PngImageStream.h"
 #include "PngProgressiveDisplay.h"
 #include "PngText.h"
 #include "platform/OleColor.h"
@@ -13,7 +14,6 @@
 #include <QPointer>
 #include <QScreen>
 
-#include <zlib.h>
 
 #include <new>
 #include <optional>
@@ -39,7 +39,7 @@ enum StateFlag : qint32 {
 
 constexpr qint32 white = 0xFFFFFF;
 // A deflate stream cannot expand its input by more than this, so a header that asks for
-// more than the IDAT data can hold is refused before anything is allocated.
+// more than the IDAT data can hold is refused before the bitmap is made.
 constexpr qint64 maximumInflateRatio = 1032;
 
 bool isAlphaImage(const png::Header &header, const png::FileInfo &info)
@@ -59,7 +59,7 @@ public:
     bool load(const QByteArray &file, bool validateAllData, bool make32, quint8 alphaBlendValue);
     void reset();
     bool fail(const char *reason);
-    bool inflate(std::unique_ptr<uint8_t[]> &stream, qsizetype &length);
+    bool promisesMoreThanItHolds() const;
     void chooseDisplay(qint32 destinationDC, qint32 destinationHwnd);
     void chooseBackground();
     bool hidden() const { return stateFlags & PropertiesHidden; }
@@ -92,23 +92,9 @@ bool StdPNG::Private::fail(const char *reason)
     return false;
 }
 
-bool StdPNG::Private::inflate(std::unique_ptr<uint8_t[]> &stream, qsizetype &length)
+bool StdPNG::Private::promisesMoreThanItHolds() const
 {
-    const qint64 needed = png::inflatedSize(header);
-    const QByteArray &compressed = info.imageData;
-    if (needed < 1 || needed > (compressed.size() + 1) * maximumInflateRatio)
-        return false;
-    stream.reset(new (std::nothrow) uint8_t[size_t(needed)]);
-    if (!stream)
-        return false;
-    uLongf inflated = uLongf(needed);
-    if (uncompress(stream.get(), &inflated, reinterpret_cast<const Bytef *>(compressed.constData()),
-            uLong(compressed.size()))
-        != Z_OK)
-        return false;
-    // Rows past the end of a short stream would be read from memory nothing wrote.
-    length = qsizetype(inflated);
-    return qint64(inflated) == needed;
+    return png::inflatedSize(header) > (info.imageData.size() + 1) * maximumInflateRatio;
 }
 
 void StdPNG::Private::chooseDisplay(qint32 destinationDC, qint32 destinationHwnd)
@@ -177,9 +163,7 @@ bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool ma
     Q_EMIT q->Progress(0);
     if (!alive)
         return false;
-    std::unique_ptr<uint8_t[]> stream;
-    qsizetype streamLength = 0;
-    if (!inflate(stream, streamLength))
+    if (promisesMoreThanItHolds())
         return fail(png::reason::Inflate);
 
     if (make32 || alphaBlendValue < 255)
@@ -230,8 +214,9 @@ bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool ma
         const bool fade = stateFlags & FadeInDisplay;
         observer.passConverted = [&, fade](int pass) { display->showPass(imageData, pass, fade); };
     }
-    if (!png::decodeImage(header, info, options, stream.get(), streamLength, imageData.Bits(), observer))
-        return fail(png::reason::Unfilter);
+    png::ImageStream stream(info.imageData);
+    if (!png::decodeImage(header, info, options, stream, imageData.Bits(), observer))
+        return fail(stream.failed() ? png::reason::Inflate : png::reason::Unfilter);
     if (!alive)
         return false;
     display.reset();

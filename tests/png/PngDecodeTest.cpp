@@ -254,20 +254,32 @@ TEST(PngDecode, failsOnAnUnknownFilterType)
 {
     StdPNG image;
     EXPECT_FALSE(image.LoadData(greyFile(4, 4, {}, 5)));
+    EXPECT_EQ(image.FailureReason(), "Invalid filter type in image data.");
     EXPECT_EQ(image.handle(), 0);
     EXPECT_EQ(image.BitCount_BMP(), 0);
     EXPECT_TRUE(image.LoadData(greyFile(4, 4, {}, 4)));
 }
 
-TEST(PngDecode, refusesAStreamShorterThanTheHeaderPromises)
+TEST(PngDecode, acceptsOnlyAWholeStreamOfTheHeadersLength)
 {
     QByteArray rows;
-    for (int y = 0; y < 3; ++y)
+    for (int y = 0; y < 4; ++y)
         rows += QByteArray(1, '\0') + QByteArray(4, char(y));
-    const QByteArray file = signature() + ihdr(4, 4, 8, 0) + chunk("IDAT", deflate(rows)) + chunk("IEND", {});
-    StdPNG image;
-    EXPECT_FALSE(image.LoadData(file));
-    EXPECT_EQ(image.ImageData().HasBitmap(), false);
+    const auto load = [](const QByteArray &stream) {
+        StdPNG image;
+        const bool loaded = image.LoadData(signature() + ihdr(4, 4, 8, 0) + chunk("IDAT", stream) + chunk("IEND", {}));
+        EXPECT_EQ(image.ImageData().HasBitmap(), loaded);
+        return loaded ? QStringLiteral("loaded") : image.FailureReason();
+    };
+    const QString broken = QStringLiteral("Failed to decompress image data.");
+    EXPECT_EQ(load(deflate(rows)), "loaded");
+    EXPECT_EQ(load(deflate(rows.left(15))), broken); // short
+    EXPECT_EQ(load(deflate(rows + QByteArray(5, '\0'))), broken); // a row too many
+    QByteArray badChecksum = deflate(rows);
+    badChecksum[badChecksum.size() - 1] = char(badChecksum.back() ^ 1);
+    EXPECT_EQ(load(badChecksum), broken);
+    EXPECT_EQ(load(deflate(rows).chopped(3)), broken); // cut before the checksum
+    EXPECT_EQ(load("not deflate"), broken);
 }
 
 TEST(PngDecode, refusesColorTypesWithBitDepthsPngDoesNotHave)
