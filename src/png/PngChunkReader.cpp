@@ -231,6 +231,8 @@ ReadResult readChunks(QByteArrayView file, bool validateAllData, Header &header,
 
     const char *failure = nullptr;
     qsizetype position = 8;
+    // The image data is at most the whole file: one allocation instead of one per chunk.
+    info.imageData.reserve(size);
     bool ended = false;
     while (!ended && !failure) {
         if (size - position < 12)

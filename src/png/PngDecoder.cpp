@@ -152,12 +152,10 @@ public:
     {
         if (m_outBits <= 8)
             return convertIndexed(src, count, dst, x0, step);
-        if (m_background == -1 && step == 1 && !m_keyed && m_depth == 8) {
-            if (m_colorType == Rgb && m_outBits == 24)
-                return rgbToBgr(src, count, dst + 3 * x0);
-            if (m_colorType == Rgba && m_outBits == 32)
-                return rgbaToPremultiplied(src, count, dst + 4 * x0);
-        }
+        if (m_background == -1 && step == 1 && !m_keyed && m_colorType == Rgb && m_outBits == 24)
+            return m_depth == 8 ? rgbToBgr(src, count, dst + 3 * x0) : rgb16ToBgr(src, count, dst + 3 * x0);
+        if (m_background == -1 && step == 1 && m_depth == 8 && m_colorType == Rgba && m_outBits == 32)
+            return rgbaToPremultiplied(src, count, dst + 4 * x0);
         switch (m_colorType) {
         case Rgb:
             return convertDirect(dst, count, x0, step, [&](int64_t i) { return rgbPixel(src, i); });
@@ -254,6 +252,15 @@ private:
         for (int64_t i = 0; i < count; ++i, src += 3, dst += 3) {
             dst[0] = src[2];
             dst[1] = src[1];
+            dst[2] = src[0];
+        }
+    }
+
+    static void rgb16ToBgr(const uint8_t *src, int64_t count, uint8_t *dst)
+    {
+        for (int64_t i = 0; i < count; ++i, src += 6, dst += 3) {
+            dst[0] = src[4];
+            dst[1] = src[2];
             dst[2] = src[0];
         }
     }
