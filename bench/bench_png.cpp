@@ -151,9 +151,10 @@ QByteArray imageDataOf(const QByteArray &file)
 
 size_t inflatedSize(const Sample &sample)
 {
-    const size_t bpp = size_t(sample.bitDepth / 8) * (sample.colorType == PNG_COLOR_TYPE_RGB_ALPHA ? 4
-            : sample.colorType == PNG_COLOR_TYPE_RGB                                               ? 3
-                                                                                                   : 1);
+    const size_t bpp = size_t(sample.bitDepth / 8)
+        * (sample.colorType == PNG_COLOR_TYPE_RGB_ALPHA  ? 4
+                : sample.colorType == PNG_COLOR_TYPE_RGB ? 3
+                                                         : 1);
     if (!sample.interlaced)
         return size_t(imageHeight) * (imageWidth * bpp + 1);
     const int rs[] = { 0, 0, 4, 0, 2, 0, 1 }, cs[] = { 0, 4, 0, 2, 0, 1, 0 };
@@ -177,8 +178,8 @@ void stdPngDecode(benchmark::State &state, const Sample &sample)
             state.SkipWithError(image.FailureReason().toUtf8().constData());
         benchmark::DoNotOptimize(image.handle());
     }
-    state.counters["MB/s"] = benchmark::Counter(double(imageWidth) * imageHeight * state.iterations() / 1e6,
-        benchmark::Counter::kIsRate);
+    state.counters["MB/s"]
+        = benchmark::Counter(double(imageWidth) * imageHeight * state.iterations() / 1e6, benchmark::Counter::kIsRate);
 }
 
 struct ReadCursor
@@ -242,8 +243,8 @@ void libpngDecode(benchmark::State &state, const Sample &sample)
         png_destroy_read_struct(&png, &info, nullptr);
         benchmark::DoNotOptimize(bitmap.get());
     }
-    state.counters["MB/s"] = benchmark::Counter(double(imageWidth) * imageHeight * state.iterations() / 1e6,
-        benchmark::Counter::kIsRate);
+    state.counters["MB/s"]
+        = benchmark::Counter(double(imageWidth) * imageHeight * state.iterations() / 1e6, benchmark::Counter::kIsRate);
 }
 
 void uncompressOnly(benchmark::State &state, const Sample &sample)
@@ -259,8 +260,8 @@ void uncompressOnly(benchmark::State &state, const Sample &sample)
             state.SkipWithError("uncompress failed");
         benchmark::DoNotOptimize(out.get());
     }
-    state.counters["MB/s"] = benchmark::Counter(double(imageWidth) * imageHeight * state.iterations() / 1e6,
-        benchmark::Counter::kIsRate);
+    state.counters["MB/s"]
+        = benchmark::Counter(double(imageWidth) * imageHeight * state.iterations() / 1e6, benchmark::Counter::kIsRate);
 }
 
 const bool registered = [] {

@@ -127,10 +127,11 @@ int runPngDecode(const QStringList &args, QTextStream &, QTextStream &err)
         return 1;
     }
     QFile pam(files[1]);
-    const QByteArray header = QStringLiteral("P7\nWIDTH %1\nHEIGHT %2\nDEPTH 4\nMAXVAL 255\nTUPLTYPE RGB_ALPHA\nENDHDR\n")
-                                  .arg(image.Width())
-                                  .arg(image.Height())
-                                  .toLatin1();
+    const QByteArray header
+        = QStringLiteral("P7\nWIDTH %1\nHEIGHT %2\nDEPTH 4\nMAXVAL 255\nTUPLTYPE RGB_ALPHA\nENDHDR\n")
+              .arg(image.Width())
+              .arg(image.Height())
+              .toLatin1();
     if (!pam.open(QIODevice::WriteOnly) || pam.write(header) != header.size() || !pam.write(rgbaPixels(image))
         || !pam.flush()) {
         err << "zelctl png-decode: cannot write " << files[1] << '\n';

@@ -12,8 +12,8 @@ const std::array commands = {
     Command { "classes", "zelctl classes", runClasses },
     Command { "nib", "zelctl nib NUMBER", runNib },
     Command { "png-info", "zelctl png-info FILE", runPngInfo },
-    Command { "png-decode", "zelctl png-decode [--transparent-style N] [--make32] [--alpha A] FILE OUT.pam",
-        runPngDecode },
+    Command {
+        "png-decode", "zelctl png-decode [--transparent-style N] [--make32] [--alpha A] FILE OUT.pam", runPngDecode },
 };
 
 void printUsage(QTextStream &stream)

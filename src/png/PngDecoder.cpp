@@ -373,8 +373,8 @@ bool decodeProgressive(const Header &header, const Converter &converter, const D
                     fillBlocks(bitmap, pass, y, width);
             }
         }
-        if (observer.progress)
-            observer.progress((pass + 1) * 100 / 7);
+        if (observer.progress && !observer.progress((pass + 1) * 100 / 7))
+            return false;
         if (observer.passConverted)
             observer.passConverted(pass + 1);
     }
@@ -392,8 +392,9 @@ bool decodeSequential(const Header &header, const Converter &converter, RowBlock
         const int count = std::min(rowsPerBlock, height - first);
         if (!blocks.restore(first, count, stride))
             return false;
-        if (observer.progress)
-            observer.progress(first + rowsPerBlock < height ? int(int64_t(first + rowsPerBlock) * 100 / height) : 100);
+        const int percentage = first + rowsPerBlock < height ? int(int64_t(first + rowsPerBlock) * 100 / height) : 100;
+        if (observer.progress && !observer.progress(percentage))
+            return false;
         for (int k = 0; k < count; ++k)
             converter.convert(blocks.row(k), header.width, bitmap.row(first + k), 0, 1);
         if (observer.rowsConverted)

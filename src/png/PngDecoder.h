@@ -53,7 +53,8 @@ std::vector<uint32_t> colorTable(const Header &header, FileInfo &info, int bitCo
 // What the decoder tells its caller while it works.
 struct DecodeObserver
 {
-    std::function<void(int percentage)> progress;
+    // False stops the decoding (the receiver is gone).
+    std::function<bool(int percentage)> progress;
     // Rows [first, first + count) of a non-interlaced image are in the bitmap.
     std::function<void(int32_t first, int32_t count)> rowsConverted;
     // An Adam7 pass (1-7) is in the bitmap.

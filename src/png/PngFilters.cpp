@@ -57,7 +57,6 @@ void unfilterAverage(uint8_t *row, const uint8_t *previous, qsizetype length, in
         row[i] = uint8_t(row[i] + ((row[i - distance] + previous[i]) >> 1));
 }
 
-
 #if defined(__SSE2__)
 // Pixels of 3, 4, 6 or 8 bytes are restored one whole pixel at a time in 16-bit lanes: each
 // pixel depends on the one before it, but its bytes do not depend on each other.
@@ -184,7 +183,8 @@ template <int Distance> void unfilterPaethFixed(uint8_t *row, const uint8_t *pre
         row[i] = uint8_t(row[i] + previous[i]);
     for (qsizetype i = Distance; i + Distance <= length; i += Distance) {
         for (int k = 0; k < Distance; ++k)
-            row[i + k] = uint8_t(row[i + k] + paethPredictor(row[i + k - Distance], previous[i + k], previous[i + k - Distance]));
+            row[i + k] = uint8_t(
+                row[i + k] + paethPredictor(row[i + k - Distance], previous[i + k], previous[i + k - Distance]));
     }
 }
 

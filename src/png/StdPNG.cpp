@@ -14,7 +14,6 @@
 #include <QPointer>
 #include <QScreen>
 
-
 #include <new>
 #include <optional>
 
@@ -178,8 +177,8 @@ bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool ma
         const bool useProgression = header.interlaced()
             || (header.height / 100) * (header.width / 100)
                 > (screenSize.height() / 100) * (screenSize.width() / 100) / 3;
-        Q_EMIT q->ProgessiveDisplay(header.width, header.height, destinationDC, destinationHwnd,
-            info.backgroundColor, isAlphaImage(header, info), x, y, header.interlaced(), useProgression);
+        Q_EMIT q->ProgessiveDisplay(header.width, header.height, destinationDC, destinationHwnd, info.backgroundColor,
+            isAlphaImage(header, info), x, y, header.interlaced(), useProgression);
         if (!alive)
             return false;
     }
@@ -207,7 +206,10 @@ bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool ma
         }
     }
     png::DecodeObserver observer;
-    observer.progress = [&](int percentage) { Q_EMIT q->Progress(percentage); };
+    observer.progress = [&](int percentage) {
+        Q_EMIT q->Progress(percentage);
+        return !alive.isNull();
+    };
     if (display && (stateFlags & ScannerDisplay)) {
         observer.rowsConverted = [&](qint32 first, qint32 count) { display->showRows(imageData, first, count); };
     } else if (display) {
@@ -215,10 +217,12 @@ bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool ma
         observer.passConverted = [&, fade](int pass) { display->showPass(imageData, pass, fade); };
     }
     png::ImageStream stream(info.imageData);
-    if (!png::decodeImage(header, info, options, stream, imageData.Bits(), observer))
-        return fail(stream.failed() ? png::reason::Inflate : png::reason::Unfilter);
+    const bool decoded = png::decodeImage(header, info, options, stream, imageData.Bits(), observer);
+    // A Progress handler may have deleted this object.
     if (!alive)
         return false;
+    if (!decoded)
+        return fail(stream.failed() ? png::reason::Inflate : png::reason::Unfilter);
     display.reset();
     if (displayBackground != -1)
         png::applyConstantOpacity(imageData.Bits(), alphaBlendValue);

@@ -19,8 +19,21 @@ struct Format
 };
 
 const Format formats[] = {
-    { 0, 1 }, { 0, 2 }, { 0, 4 }, { 0, 8 }, { 0, 16 }, { 2, 8 }, { 2, 16 }, { 3, 1 }, { 3, 2 }, { 3, 4 },
-    { 3, 8 }, { 4, 8 }, { 4, 16 }, { 6, 8 }, { 6, 16 },
+    { 0, 1 },
+    { 0, 2 },
+    { 0, 4 },
+    { 0, 8 },
+    { 0, 16 },
+    { 2, 8 },
+    { 2, 16 },
+    { 3, 1 },
+    { 3, 2 },
+    { 3, 4 },
+    { 3, 8 },
+    { 4, 8 },
+    { 4, 16 },
+    { 6, 8 },
+    { 6, 16 },
 };
 
 const std::pair<int, int> sizes[] = { { 1, 1 }, { 1, 9 }, { 9, 1 }, { 7, 17 }, { 13, 5 }, { 33, 17 }, { 20, 40 } };
@@ -162,7 +175,11 @@ TEST(PngDecode, showsTwoBitGreyThroughFourLevels)
 TEST(PngDecode, premultipliesSixteenBitRgbaFromTheFirstBytes)
 {
     // One pixel R 0xFFFF, G 0x0000, B 0x8000, A 0x8000.
-    const QByteArray rows = QByteArray::fromHex("00" "ffff" "0000" "8000" "8000");
+    const QByteArray rows = QByteArray::fromHex("00"
+                                                "ffff"
+                                                "0000"
+                                                "8000"
+                                                "8000");
     const QByteArray file = signature() + ihdr(1, 1, 16, 6) + chunk("IDAT", deflate(rows)) + chunk("IEND", {});
     StdPNG image;
     image.setTransparentStyle(StdPNG::alphaTransparent);
@@ -176,7 +193,8 @@ TEST(PngDecode, leavesPaletteEntriesWithAlphaZeroAllZero)
     for (int i = 0; i < 8; ++i)
         palette += QByteArray::fromHex("ff8040");
     const QByteArray trns = QByteArray::fromHex("ffffffffff00");
-    const QByteArray rows = QByteArray::fromHex("00" "0501");
+    const QByteArray rows = QByteArray::fromHex("00"
+                                                "0501");
     const QByteArray file = signature() + ihdr(2, 1, 8, 3) + chunk("PLTE", palette) + chunk("tRNS", trns)
         + chunk("IDAT", deflate(rows)) + chunk("IEND", {});
     StdPNG image;
@@ -225,8 +243,8 @@ TEST(PngDecode, restoresEveryFilterType)
         return rows;
     };
     for (int type = 0; type <= 4; ++type) {
-        const QByteArray file = signature() + ihdr(2, 2, 8, 2) + chunk("IDAT", deflate(filtered(type)))
-            + chunk("IEND", {});
+        const QByteArray file
+            = signature() + ihdr(2, 2, 8, 2) + chunk("IDAT", deflate(filtered(type))) + chunk("IEND", {});
         StdPNG image;
         ASSERT_TRUE(image.LoadData(file)) << "filter " << type;
         EXPECT_EQ(bitmapPixel(image, 1, 0), (std::array<uint8_t, 4> { 0x60, 0x50, 0x40, 255 })) << "filter " << type;
@@ -306,8 +324,8 @@ TEST(PngDecode, acceptsOnlyAWholeStreamOfTheHeadersLength)
 TEST(PngDecode, refusesColorTypesWithBitDepthsPngDoesNotHave)
 {
     // The header check lets RGB at 1 bit through; the decoder must still refuse it.
-    const QByteArray file = signature() + ihdr(8, 1, 1, 2) + chunk("IDAT", deflate(QByteArray(4, '\0')))
-        + chunk("IEND", {});
+    const QByteArray file
+        = signature() + ihdr(8, 1, 1, 2) + chunk("IDAT", deflate(QByteArray(4, '\0'))) + chunk("IEND", {});
     StdPNG image;
     EXPECT_FALSE(image.LoadData(file));
     EXPECT_EQ(image.FailureReason(), "Invalid combination of color type and bit depth.");

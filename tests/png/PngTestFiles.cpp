@@ -214,8 +214,7 @@ QByteArray greyFile(int width, int height, const QByteArray &extraChunks, uint8_
         for (int x = 0; x < width; ++x)
             rows.append(char(y + x));
     }
-    return signature() + ihdr(width, height, 8, 0) + extraChunks + chunk("IDAT", deflate(rows))
-        + chunk("IEND", {});
+    return signature() + ihdr(width, height, 8, 0) + extraChunks + chunk("IDAT", deflate(rows)) + chunk("IEND", {});
 }
 
 } // namespace zelctl::test

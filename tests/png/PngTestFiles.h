@@ -48,8 +48,8 @@ std::vector<uint8_t> readWithLibpng(const QByteArray &file, int &width, int &hei
 QByteArray chunk(const char *type, const QByteArray &data);
 QByteArray chunkWithCrc(const char *type, const QByteArray &data, uint32_t crc);
 QByteArray signature();
-QByteArray ihdr(int width, int height, int bitDepth, int colorType, int interlace = 0, int compression = 0,
-    int filter = 0);
+QByteArray ihdr(
+    int width, int height, int bitDepth, int colorType, int interlace = 0, int compression = 0, int filter = 0);
 // IDAT data: the rows (each starting with its filter byte) deflated.
 QByteArray deflate(const QByteArray &rows);
 QByteArray be32(uint32_t value);
