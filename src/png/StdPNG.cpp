@@ -381,7 +381,9 @@ void StdPNG::setPalette(const QByteArray &palette)
 {
     png::Header &header = d->header;
     png::FileInfo &info = d->info;
-    if (d->hidden() || !header.validBitDepth() || (header.colorType != png::Indexed && header.colorType != png::Grey))
+    // A running load decodes with the header it read; the palette changes only between loads.
+    if (d->stateFlags >= LoadInProgress || !header.validBitDepth()
+        || (header.colorType != png::Indexed && header.colorType != png::Grey))
         return;
     if (palette.isEmpty()) {
         if (header.colorType == png::Indexed && info.transparentColor == -1) {
