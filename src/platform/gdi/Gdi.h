@@ -243,7 +243,8 @@ ZELCTL_EXPORT bool GetObject(HGDIOBJ object, DIBSECTION &section);
 // between bit depths: a table-based source goes through its colour table, a colour into a
 // table-based target takes the nearest entry; combinations act on the target's pixel
 // values. A 32-bit target fed from a source without alpha gets alpha 255. Both rectangles
-// are clipped to their bitmaps. Unknown raster operations fail.
+// are clipped to their bitmaps. Unknown raster operations and coordinates or extents
+// beyond ±2^27 fail.
 ZELCTL_EXPORT bool BitBlt(HDC dst, int x, int y, int width, int height, HDC src, int srcX, int srcY, quint32 rop);
 // As BitBlt, scaling with the stretch mode of dst (HALFTONE averages areas, the others take
 // the nearest pixel). A negative extent counts leftwards or upwards from its origin pixel;
@@ -251,9 +252,11 @@ ZELCTL_EXPORT bool BitBlt(HDC dst, int x, int y, int width, int height, HDC src,
 ZELCTL_EXPORT bool StretchBlt(HDC dst, int x, int y, int width, int height, HDC src, int srcX, int srcY, int srcWidth,
     int srcHeight, quint32 rop);
 // Source-over: dst = src·k + dst·(1 − srcA·k), k = SourceConstantAlpha / 255, with srcA the
-// pixel's alpha for a 32-bit source with AC_SRC_ALPHA (premultiplied pixels) and 1
-// otherwise. Scales by the nearest pixel. Fails for negative extents and for a source
-// rectangle outside the source bitmap; the target is clipped.
+// pixel's alpha for a 32-bit source with AC_SRC_ALPHA and 1 otherwise, each channel within
+// 1 of the exact value. With AC_SRC_ALPHA the pixels are premultiplied (no colour channel
+// above alpha); a channel that would pass 255 stays at 255. Scales by the nearest pixel,
+// whatever the stretch mode. Fails for negative extents and for a source rectangle outside
+// the source bitmap; the target is clipped.
 ZELCTL_EXPORT bool AlphaBlend(HDC dst, int x, int y, int width, int height, HDC src, int srcX, int srcY, int srcWidth,
     int srcHeight, BLENDFUNCTION blend);
 

@@ -29,7 +29,7 @@ std::shared_ptr<Bitmap> makeBitmap(const BITMAPINFOHEADER &header, const RGBQUAD
         return nullptr;
 
     auto bitmap = std::make_shared<Bitmap>();
-    bitmap->storage.reset(new (std::nothrow) quint32[size_t(stride / 4 * height)]());
+    bitmap->storage.reset(new (PixelAlignment, std::nothrow) quint32[size_t(stride / 4 * height)]());
     if (!bitmap->storage)
         return nullptr;
     bitmap->header = header;
@@ -56,8 +56,9 @@ std::shared_ptr<Bitmap> makeBitmap(const BITMAPINFOHEADER &header, const RGBQUAD
 
 HandleTable &HandleTable::instance()
 {
-    static HandleTable table;
-    return table;
+    // Never destroyed: objects held in other statics may still be deleted during exit.
+    static HandleTable *const table = new HandleTable;
+    return *table;
 }
 
 HandleTable::HandleTable()

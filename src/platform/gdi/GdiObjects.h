@@ -8,6 +8,7 @@
 #include <atomic>
 #include <memory>
 #include <mutex>
+#include <new>
 #include <unordered_map>
 
 // The objects behind the handles and the table that maps handles to them.
@@ -28,12 +29,21 @@ struct Object
     std::atomic<int> selections = 0;
 };
 
+// Pixel memory aligned to a cache line, so that vector loops over rows whose width is a
+// multiple of 16 pixels never split a line.
+inline constexpr std::align_val_t PixelAlignment { 64 };
+
+struct AlignedDelete
+{
+    void operator()(quint32 *p) const { ::operator delete[](p, PixelAlignment); }
+};
+
 struct Bitmap : Object
 {
     Bitmap()
         : Object(OBJ_BITMAP)
     { }
-    std::unique_ptr<quint32[]> storage;
+    std::unique_ptr<quint32[], AlignedDelete> storage;
     BITMAPINFOHEADER header;
     ColorTable table {};
     Surface surface;

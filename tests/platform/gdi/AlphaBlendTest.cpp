@@ -91,6 +91,23 @@ TEST(AlphaBlend, followsTheSourceOverFormulaWithinOne)
     }
 }
 
+TEST(AlphaBlend, stopsChannelsOfBadlyPremultipliedPixelsAt255)
+{
+    // Red 255 under alpha 16 is not premultiplied; over white it must not wrap round.
+    // Nine pixels: eight go through the vector path, the last through the scalar one.
+    TestBitmap src(9, 1, 32);
+    TestBitmap dst(9, 1, 32);
+    src.fill(0x10FF0000, 9, 32);
+    dst.fill(0xFFFFFFFF, 9, 32);
+    ASSERT_TRUE(AlphaBlend(dst.dc, 0, 0, 9, 1, src.dc, 0, 0, 9, 1, blend(255, true)));
+    for (int x = 0; x < 9; ++x)
+        EXPECT_EQ(dst.argb(x, 0), 0xFFFFEFEFu) << x;
+    dst.fill(0xFFFFFFFF, 9, 32);
+    ASSERT_TRUE(AlphaBlend(dst.dc, 0, 0, 9, 1, src.dc, 0, 0, 9, 1, blend(254, true)));
+    for (int x = 0; x < 9; ++x)
+        EXPECT_EQ(dst.argb(x, 0) >> 16 & 0xFF, 0xFFu) << x;
+}
+
 TEST(AlphaBlend, blendsIntoOtherDepthsAndFromOpaqueSources)
 {
     // 24-bit target with a premultiplied half-transparent white: 128 + 0.5 · 0.

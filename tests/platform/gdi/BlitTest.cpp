@@ -2,6 +2,11 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <cmath>
+#include <iterator>
+#include <memory>
+
 using namespace zelctl::gdi;
 using zelctl::gdi::test::TestBitmap;
 
@@ -197,9 +202,10 @@ TEST(BitBlt, clipsAtEveryEdge)
     EXPECT_TRUE(BitBlt(dst.dc, 10, 0, 4, 4, src.dc, 0, 0, SRCCOPY));
     EXPECT_TRUE(BitBlt(dst.dc, 0, 0, 4, 4, src.dc, -10, 0, SRCCOPY));
     EXPECT_TRUE(BitBlt(dst.dc, 0, 0, 0, 4, src.dc, 0, 0, SRCCOPY));
-    EXPECT_TRUE(BitBlt(dst.dc, -2147483647, -2147483647, 2147483647, 2147483647, src.dc, 0, 0, SRCCOPY));
     EXPECT_EQ(rowOf(dst, 0, 4), (Values { 7, 7, 7, 7 }));
     EXPECT_FALSE(StretchBlt(dst.dc, 0, 0, 2, 2, src.dc, 0, 0, 0, 2, SRCCOPY)) << "nothing to sample";
+    EXPECT_FALSE(BitBlt(dst.dc, -2147483647, 0, 2147483647, 4, src.dc, 0, 0, SRCCOPY)) << "absurd coordinates";
+    EXPECT_EQ(rowOf(dst, 0, 4), (Values { 7, 7, 7, 7 }));
 }
 
 TEST(StretchBlt, negativeExtentsMirror)
@@ -277,6 +283,16 @@ TEST(StretchBlt, halftoneAveragesAreas)
     ASSERT_TRUE(StretchBlt(dst.dc, 1, 0, -2, 1, src.dc, 0, 0, 4, 1, SRCCOPY));
     EXPECT_EQ(rowOf(dst, 0, 2), (Values { grey(125), grey(50) }));
 
+    // Thirds, across and down: (30 + 60 + 120) / 3.
+    TestBitmap thirds(3, 3, 24);
+    setRow(thirds, 0, { grey(30), grey(60), grey(120) });
+    for (int y = 1; y < 3; ++y)
+        thirds.setRgb(0, y, grey(y == 1 ? 60 : 120));
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 1, 1, thirds.dc, 0, 0, 3, 1, SRCCOPY));
+    EXPECT_EQ(dst.rgb(0, 0), grey(70));
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 1, 1, thirds.dc, 0, 0, 1, 3, SRCCOPY));
+    EXPECT_EQ(dst.rgb(0, 0), grey(70));
+
     // Enlarging 2 -> 3: the middle pixel straddles both source pixels equally.
     ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 3, 1, src.dc, 1, 0, 2, 1, SRCCOPY));
     EXPECT_EQ(rowOf(dst, 0, 3), (Values { grey(100), grey(150), grey(200) }));
@@ -319,4 +335,133 @@ TEST(StretchBlt, halftoneClipsItsFootprintToTheSource)
     // Half of the footprint outside: the part inside counts alone.
     ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, 1, 1, src.dc, -1, 0, 2, 1, SRCCOPY));
     EXPECT_EQ(dst.rgb(0, 0), grey(40));
+}
+
+TEST(StretchBlt, matchesTheSamplingRulesAtManyScales)
+{
+    // A 19 × 11 source of varied colours, scaled to several sizes, mirrored or not; each
+    // target pixel is checked against the rule worked out here in floating point.
+    constexpr int sw = 19, sh = 11;
+    TestBitmap src(sw, sh, 32);
+    for (int y = 0; y < sh; ++y)
+        for (int x = 0; x < sw; ++x)
+            src.setArgb(x, y, 0xFF000000u | quint32(x * 13) << 16 | quint32(y * 23) << 8 | quint32((x * y * 7) & 0xFF));
+    struct Scale
+    {
+        int width;
+        int height;
+    };
+    for (const Scale &scale :
+        { Scale { 7, 4 }, Scale { 40, 23 }, Scale { 57, 5 }, Scale { 6, 33 }, Scale { 19, 11 } }) {
+        for (bool mirrored : { false, true }) {
+            for (int mode : { COLORONCOLOR, HALFTONE }) {
+                TestBitmap dst(scale.width, scale.height, 32);
+                SetStretchBltMode(dst.dc, mode);
+                const int x = mirrored ? scale.width - 1 : 0;
+                const int w = mirrored ? -scale.width : scale.width;
+                ASSERT_TRUE(StretchBlt(dst.dc, x, 0, w, scale.height, src.dc, 0, 0, sw, sh, SRCCOPY));
+                for (int ty = 0; ty < scale.height; ++ty) {
+                    for (int tx = 0; tx < scale.width; ++tx) {
+                        const int lx = mirrored ? scale.width - 1 - tx : tx;
+                        const quint32 got = dst.argb(tx, ty);
+                        for (int shift : { 0, 8, 16 }) {
+                            double want;
+                            if (mode == COLORONCOLOR) {
+                                const int sx = (2 * lx + 1) * sw / (2 * scale.width);
+                                const int sy = (2 * ty + 1) * sh / (2 * scale.height);
+                                want = (src.argb(sx, sy) >> shift) & 0xFF;
+                            } else {
+                                // Coverage-weighted mean over the footprint.
+                                const double x0 = double(lx) * sw / scale.width, x1 = double(lx + 1) * sw / scale.width;
+                                const double y0 = double(ty) * sh / scale.height,
+                                             y1 = double(ty + 1) * sh / scale.height;
+                                double sum = 0;
+                                for (int sy = int(y0); sy < sh && sy < y1; ++sy)
+                                    for (int sx = int(x0); sx < sw && sx < x1; ++sx) {
+                                        const double cover = (std::min<double>(sx + 1, x1) - std::max<double>(sx, x0))
+                                            * (std::min<double>(sy + 1, y1) - std::max<double>(sy, y0));
+                                        sum += cover * ((src.argb(sx, sy) >> shift) & 0xFF);
+                                    }
+                                want = sum / ((x1 - x0) * (y1 - y0));
+                            }
+                            ASSERT_LE(std::abs(double((got >> shift) & 0xFF) - want), mode == HALFTONE ? 1.0 : 0.0)
+                                << scale.width << "x" << scale.height << (mirrored ? " mirrored" : "") << " mode "
+                                << mode << " at " << tx << "," << ty;
+                        }
+                        ASSERT_EQ(got >> 24, 0xFFu);
+                    }
+                }
+            }
+        }
+    }
+}
+
+TEST(StretchBlt, largeBlitsSplitIntoBandsGiveTheSamePixels)
+{
+    // Big enough to be shared among threads; every row is checked against the sampling
+    // rule, so a band that started or ended on the wrong row would show.
+    constexpr int sw = 300, sh = 200, tw = 900, th = 600;
+    TestBitmap src(sw, sh, 32);
+    for (int y = 0; y < sh; ++y)
+        for (int x = 0; x < sw; ++x)
+            src.setArgb(x, y, 0xFF000000u | quint32(x & 0xFF) << 16 | quint32(y & 0xFF) << 8 | quint32((x + y) & 0xFF));
+    TestBitmap dst(tw, th, 32);
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, tw, th, src.dc, 0, 0, sw, sh, SRCCOPY));
+    for (int y = 0; y < th; ++y)
+        for (int x = 0; x < tw; x += 37)
+            ASSERT_EQ(dst.argb(x, y), src.argb(x / 3, y / 3)) << x << "," << y;
+
+    TestBitmap blended(tw, th, 32);
+    blended.fill(0xFF000000u, tw, 32);
+    BLENDFUNCTION half;
+    half.SourceConstantAlpha = 128;
+    ASSERT_TRUE(AlphaBlend(blended.dc, 0, 0, tw, th, dst.dc, 0, 0, tw, th, half));
+    for (int y = 0; y < th; ++y)
+        for (int x = 0; x < tw; x += 41) {
+            const quint32 s = dst.argb(x, y), d = blended.argb(x, y);
+            for (int shift : { 0, 8, 16 })
+                ASSERT_NEAR(double(d >> shift & 0xFF), (s >> shift & 0xFF) * 128 / 255.0, 1.0) << x << "," << y;
+        }
+
+    SetStretchBltMode(dst.dc, HALFTONE);
+    TestBitmap flat(sw, sh, 24);
+    flat.fill(0x405060, sw, 24);
+    ASSERT_TRUE(StretchBlt(dst.dc, 0, 0, tw, th, flat.dc, 0, 0, sw, sh, SRCCOPY));
+    for (int y = 0; y < th; ++y)
+        ASSERT_EQ(dst.argb((y * 7) % tw, y), 0xFF405060u) << y;
+}
+
+TEST(StretchBlt, survivesArbitraryArguments)
+{
+    // Awkward coordinates and extents on every depth: no call may touch memory outside its
+    // bitmaps (the sanitizers watch) or the padding at the end of each row.
+    const int values[] = { -2147483647 - 1, -134217728, -65536, -7, -1, 0, 1, 3, 9, 65536, 134217728, 2147483647 };
+    std::vector<std::unique_ptr<TestBitmap>> bitmaps;
+    for (int bpp : { 1, 4, 8, 24, 32 })
+        bitmaps.push_back(
+            std::make_unique<TestBitmap>(5, 3, bpp, bpp % 8 == 0, std::initializer_list<quint32> { 0, 0xFFFFFF }));
+    SetStretchBltMode(bitmaps[3]->dc, HALFTONE);
+    const int usedBytes[] = { 1, 3, 5, 15, 20 };
+    for (size_t b = 0; b < bitmaps.size(); ++b)
+        for (int y = 0; y < 3; ++y)
+            std::fill(bitmaps[b]->row(y) + usedBytes[b], bitmaps[b]->row(y) + bitmaps[b]->stride, uchar(0xA5));
+    unsigned seed = 1;
+    auto pick = [&] {
+        seed = seed * 1103515245u + 12345u;
+        return values[(seed >> 16) % std::size(values)];
+    };
+    BLENDFUNCTION over;
+    over.AlphaFormat = AC_SRC_ALPHA;
+    for (int i = 0; i < 4000; ++i) {
+        const TestBitmap &dst = *bitmaps[size_t(i) % bitmaps.size()];
+        const TestBitmap &src = *bitmaps[size_t(i / 5) % bitmaps.size()];
+        const int a = pick(), b = pick(), c = pick(), d = pick(), e = pick(), f = pick(), g = pick(), h = pick();
+        StretchBlt(dst.dc, a % 8, b % 8, c, d, src.dc, e % 8, f % 8, g, h, i % 3 == 0 ? SRCAND : SRCCOPY);
+        StretchBlt(dst.dc, a, b, c % 16, d % 16, src.dc, e, f, g % 16, h % 16, SRCPAINT);
+        AlphaBlend(dst.dc, a % 8, b % 8, c % 16, d % 16, src.dc, e % 4, f % 4, g % 6, h % 4, over);
+    }
+    for (size_t b = 0; b < bitmaps.size(); ++b)
+        for (int y = 0; y < 3; ++y)
+            for (int i = usedBytes[b]; i < bitmaps[b]->stride; ++i)
+                ASSERT_EQ(bitmaps[b]->row(y)[i], 0xA5) << "row padding of the " << b << "th bitmap";
 }
