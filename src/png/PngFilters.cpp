@@ -25,6 +25,12 @@ inline uint8_t paethPredictor(int a, int b, int c)
 
 void unfilterSub(uint8_t *row, qsizetype length, int distance)
 {
+    if (distance == 1 && length > 0) {
+        uint8_t a = row[0];
+        for (qsizetype i = 1; i < length; ++i)
+            row[i] = a = uint8_t(row[i] + a);
+        return;
+    }
     for (qsizetype i = distance; i < length; ++i)
         row[i] = uint8_t(row[i] + row[i - distance]);
 }
@@ -48,6 +54,13 @@ void unfilterAverage(uint8_t *row, const uint8_t *previous, qsizetype length, in
     if (!previous) {
         for (qsizetype i = distance; i < length; ++i)
             row[i] = uint8_t(row[i] + (row[i - distance] >> 1));
+        return;
+    }
+    if (distance == 1 && length > 0) {
+        uint8_t a = uint8_t(row[0] + (previous[0] >> 1));
+        row[0] = a;
+        for (qsizetype i = 1; i < length; ++i)
+            row[i] = a = uint8_t(row[i] + ((a + previous[i]) >> 1));
         return;
     }
     const qsizetype head = std::min<qsizetype>(distance, length);
@@ -175,16 +188,20 @@ bool unfilterPixels(uint8_t filterType, uint8_t *row, const uint8_t *previous, q
 }
 #endif
 
-// With one byte a pixel, a known distance lets the compiler keep the neighbours in registers.
-template <int Distance> void unfilterPaethFixed(uint8_t *row, const uint8_t *previous, qsizetype length)
+// With one byte a pixel, the left and upper-left neighbours travel in registers: reading
+// them back from the row just written would wait on every byte.
+void unfilterPaethBytes(uint8_t *row, const uint8_t *previous, qsizetype length)
 {
-    const qsizetype head = std::min<qsizetype>(Distance, length);
-    for (qsizetype i = 0; i < head; ++i)
-        row[i] = uint8_t(row[i] + previous[i]);
-    for (qsizetype i = Distance; i + Distance <= length; i += Distance) {
-        for (int k = 0; k < Distance; ++k)
-            row[i + k] = uint8_t(
-                row[i + k] + paethPredictor(row[i + k - Distance], previous[i + k], previous[i + k - Distance]));
+    if (length < 1)
+        return;
+    uint8_t a = uint8_t(row[0] + previous[0]);
+    row[0] = a;
+    uint8_t c = previous[0];
+    for (qsizetype i = 1; i < length; ++i) {
+        const uint8_t b = previous[i];
+        a = uint8_t(row[i] + paethPredictor(a, b, c));
+        row[i] = a;
+        c = b;
     }
 }
 
@@ -195,7 +212,7 @@ void unfilterPaeth(uint8_t *row, const uint8_t *previous, qsizetype length, int 
         return;
     }
     if (distance == 1)
-        return unfilterPaethFixed<1>(row, previous, length);
+        return unfilterPaethBytes(row, previous, length);
     const qsizetype head = std::min<qsizetype>(distance, length);
     for (qsizetype i = 0; i < head; ++i)
         row[i] = uint8_t(row[i] + previous[i]);
