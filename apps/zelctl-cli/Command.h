@@ -16,3 +16,5 @@ int runGifInfo(const QStringList &args, QTextStream &out, QTextStream &err);
 int runClasses(const QStringList &args, QTextStream &out, QTextStream &err);
 int runNib(const QStringList &args, QTextStream &out, QTextStream &err);
 int runNif(const QStringList &args, QTextStream &out, QTextStream &err);
+int runPngInfo(const QStringList &args, QTextStream &out, QTextStream &err);
+int runPngDecode(const QStringList &args, QTextStream &out, QTextStream &err);

@@ -13,6 +13,9 @@ const std::array commands = {
     Command { "nib", "zelctl nib NUMBER", runNib },
     Command { "nif", "zelctl nif CC NUMBER | zelctl nif --batch", runNif },
     Command { "gif-info", "zelctl gif-info [--hash] FILE", runGifInfo },
+    Command { "png-info", "zelctl png-info FILE", runPngInfo },
+    Command {
+        "png-decode", "zelctl png-decode [--transparent-style N] [--make32] [--alpha A] FILE OUT.pam", runPngDecode },
 };
 
 void printUsage(QTextStream &stream)

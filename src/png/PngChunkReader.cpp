@@ -149,8 +149,8 @@ void parseAncillary(const Chunk &chunk, const Header &header, FileInfo &info)
     case typeCode("tIME"):
         if (chunk.length > 6) {
             const int year = d[0] << 8 | d[1];
-            info.timeBytes = std::array<uint8_t, 8> { uint8_t(year), uint8_t(year >> 8), d[2], d[3], d[4], d[5], d[6],
-                0 };
+            info.timeBytes
+                = std::array<uint8_t, 8> { uint8_t(year), uint8_t(year >> 8), d[2], d[3], d[4], d[5], d[6], 0 };
         }
         break;
     case typeCode("gAMA"):
@@ -231,6 +231,8 @@ ReadResult readChunks(QByteArrayView file, bool validateAllData, Header &header,
 
     const char *failure = nullptr;
     qsizetype position = 8;
+    // The image data is at most the whole file: one allocation instead of one per chunk.
+    info.imageData.reserve(size);
     bool ended = false;
     while (!ended && !failure) {
         if (size - position < 12)

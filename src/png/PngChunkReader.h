@@ -28,7 +28,7 @@ inline constexpr const char *NotPng = "Not a PNG file.";
 inline constexpr const char *Truncated = "Truncated file: a chunk runs past the end or IEND is missing.";
 inline constexpr const char *Unreadable = "The file cannot be read.";
 inline constexpr const char *Inflate = "Failed to decompress image data.";
-inline constexpr const char *Unfilter = "Invalid filter type or incomplete image data.";
+inline constexpr const char *Unfilter = "Invalid filter type in image data.";
 inline constexpr const char *Format = "Invalid combination of color type and bit depth.";
 inline constexpr const char *Bitmap = "Failed to create the bitmap.";
 } // namespace reason

@@ -1,9 +1,12 @@
 #include "PngDecoder.h"
 
 #include "PngFilters.h"
+#include "PngImageStream.h"
 
 #include <algorithm>
 #include <cstring>
+#include <memory>
+#include <new>
 
 namespace zelctl::png {
 
@@ -149,12 +152,10 @@ public:
     {
         if (m_outBits <= 8)
             return convertIndexed(src, count, dst, x0, step);
-        if (m_background == -1 && step == 1 && !m_keyed && m_depth == 8) {
-            if (m_colorType == Rgb && m_outBits == 24)
-                return rgbToBgr(src, count, dst + 3 * x0);
-            if (m_colorType == Rgba && m_outBits == 32)
-                return rgbaToPremultiplied(src, count, dst + 4 * x0);
-        }
+        if (m_background == -1 && step == 1 && !m_keyed && m_colorType == Rgb && m_outBits == 24)
+            return m_depth == 8 ? rgbToBgr(src, count, dst + 3 * x0) : rgb16ToBgr(src, count, dst + 3 * x0);
+        if (m_background == -1 && step == 1 && m_depth == 8 && m_colorType == Rgba && m_outBits == 32)
+            return rgbaToPremultiplied(src, count, dst + 4 * x0);
         switch (m_colorType) {
         case Rgb:
             return convertDirect(dst, count, x0, step, [&](int64_t i) { return rgbPixel(src, i); });
@@ -255,6 +256,15 @@ private:
         }
     }
 
+    static void rgb16ToBgr(const uint8_t *src, int64_t count, uint8_t *dst)
+    {
+        for (int64_t i = 0; i < count; ++i, src += 6, dst += 3) {
+            dst[0] = src[4];
+            dst[1] = src[2];
+            dst[2] = src[0];
+        }
+    }
+
     static void rgbaToPremultiplied(const uint8_t *src, int64_t count, uint8_t *dst)
     {
         for (int64_t i = 0; i < count; ++i, src += 4, dst += 4) {
@@ -302,71 +312,94 @@ void fillBlocks(const BitmapView &bitmap, int pass, int32_t y, int64_t count)
 
 constexpr int32_t rowsPerBlock = 16;
 
-bool decodeProgressive(const Header &header, const Converter &converter, const DecodeOptions &options, uint8_t *stream,
-    qsizetype streamLength, const BitmapView &bitmap, const DecodeObserver &observer)
+// Rows are inflated and restored a block at a time into one small buffer: slot 0 keeps the
+// last restored row of the block before, slots 1-16 take the new rows.
+class RowBlocks
+{
+public:
+    RowBlocks(ImageStream &stream, int64_t maximumStride, int distance)
+        : m_stream(stream)
+        , m_distance(distance)
+        , m_buffer(new (std::nothrow) uint8_t[size_t(maximumStride) * (rowsPerBlock + 1)])
+    { }
+
+    bool valid() const { return m_buffer != nullptr; }
+
+    // Inflates and restores rows [first, first + count) of a pass whose rows are stride
+    // bytes (filter byte included); the first row of a pass has no row above.
+    bool restore(int64_t first, int count, int64_t stride)
+    {
+        m_stride = stride;
+        if (!m_stream.read(m_buffer.get() + stride, stride * count))
+            return false;
+        for (int k = 0; k < count; ++k) {
+            uint8_t *row = m_buffer.get() + (k + 1) * stride;
+            const uint8_t *above = first + k == 0 ? nullptr : m_buffer.get() + k * stride + 1;
+            if (!unfilterRow(row[0], row + 1, above, stride - 1, m_distance))
+                return false;
+        }
+        std::memcpy(m_buffer.get(), m_buffer.get() + count * stride, size_t(stride));
+        return true;
+    }
+
+    // Restored bytes of row k (0-based) of the last block.
+    const uint8_t *row(int k) const { return m_buffer.get() + (k + 1) * m_stride + 1; }
+
+private:
+    ImageStream &m_stream;
+    int m_distance;
+    std::unique_ptr<uint8_t[]> m_buffer;
+    int64_t m_stride = 0;
+};
+
+bool decodeProgressive(const Header &header, const Converter &converter, const DecodeOptions &options,
+    RowBlocks &blocks, const BitmapView &bitmap, const DecodeObserver &observer)
 {
     const int bpp = header.streamBitsPerPixel();
-    const int distance = std::max(1, bpp / 8);
-    qsizetype offset = 0;
     for (int pass = 0; pass < NonInterlacedPass; ++pass) {
         const int64_t width = passExtent(header.width, columnStart[pass], columnStep[pass]);
         const int64_t height = passExtent(header.height, rowStart[pass], rowStep[pass]);
         if (width < 1 || height < 1)
             continue;
-        const qsizetype stride = qsizetype(rowBytes(width, bpp) + 1);
-        if (streamLength - offset < stride * height)
-            return false;
-        uint8_t *rows = stream + offset;
-        for (int64_t r = 0; r < height; ++r) {
-            uint8_t *row = rows + r * stride;
-            if (!unfilterRow(row[0], row + 1, r ? row + 1 - stride : nullptr, stride - 1, distance))
+        const int64_t stride = rowBytes(width, bpp) + 1;
+        for (int64_t first = 0; first < height; first += rowsPerBlock) {
+            const int count = int(std::min<int64_t>(rowsPerBlock, height - first));
+            if (!blocks.restore(first, count, stride))
                 return false;
+            for (int k = 0; k < count; ++k) {
+                const int32_t y = int32_t(rowStart[pass] + (first + k) * rowStep[pass]);
+                converter.convert(blocks.row(k), width, bitmap.row(y), columnStart[pass], columnStep[pass]);
+                if (options.pixelated && pass < 6)
+                    fillBlocks(bitmap, pass, y, width);
+            }
         }
-        for (int64_t r = 0; r < height; ++r) {
-            const int32_t y = int32_t(rowStart[pass] + r * rowStep[pass]);
-            converter.convert(rows + r * stride + 1, width, bitmap.row(y), columnStart[pass], columnStep[pass]);
-            if (options.pixelated && pass < 6)
-                fillBlocks(bitmap, pass, y, width);
-        }
-        offset += stride * height;
-        if (observer.progress)
-            observer.progress((pass + 1) * 100 / 7);
+        if (observer.progress && !observer.progress((pass + 1) * 100 / 7))
+            return false;
         if (observer.passConverted)
             observer.passConverted(pass + 1);
     }
     return true;
 }
 
-bool decodeSequential(const Header &header, const Converter &converter, uint8_t *stream, qsizetype streamLength,
-    const BitmapView &bitmap, const DecodeObserver &observer)
+// Rows [r - 16, r) go to the bitmap once row r is restored, after the progress of row r;
+// the rows after the last full block follow Progress(100).
+bool decodeSequential(const Header &header, const Converter &converter, RowBlocks &blocks, const BitmapView &bitmap,
+    const DecodeObserver &observer)
 {
-    const int bpp = header.streamBitsPerPixel();
-    const int distance = std::max(1, bpp / 8);
     const int32_t height = header.height;
-    const qsizetype stride = qsizetype(rowBytes(header.width, bpp) + 1);
-    if (streamLength / stride < height)
-        return false;
-    int32_t converted = 0;
-    const auto convertUpTo = [&](int32_t end) {
-        for (int32_t y = converted; y < end; ++y)
-            converter.convert(stream + y * stride + 1, header.width, bitmap.row(y), 0, 1);
-        if (observer.rowsConverted && end > converted)
-            observer.rowsConverted(converted, end - converted);
-        converted = end;
-    };
-    for (int32_t r = 0; r < height; ++r) {
-        uint8_t *row = stream + r * stride;
-        if (!unfilterRow(row[0], row + 1, r ? row + 1 - stride : nullptr, stride - 1, distance))
+    const int64_t stride = rowBytes(header.width, header.streamBitsPerPixel()) + 1;
+    for (int32_t first = 0; first < height; first += rowsPerBlock) {
+        const int count = std::min(rowsPerBlock, height - first);
+        if (!blocks.restore(first, count, stride))
             return false;
-        if (r > 0 && r % rowsPerBlock == 0) {
-            if (observer.progress)
-                observer.progress(int(int64_t(r) * 100 / height));
-            convertUpTo(r);
-        }
+        const int percentage = first + rowsPerBlock < height ? int(int64_t(first + rowsPerBlock) * 100 / height) : 100;
+        if (observer.progress && !observer.progress(percentage))
+            return false;
+        for (int k = 0; k < count; ++k)
+            converter.convert(blocks.row(k), header.width, bitmap.row(first + k), 0, 1);
+        if (observer.rowsConverted)
+            observer.rowsConverted(first, count);
     }
-    if (observer.progress)
-        observer.progress(100);
-    convertUpTo(height);
     return true;
 }
 
@@ -420,17 +453,21 @@ std::vector<uint32_t> colorTable(const Header &header, FileInfo &info, int bitCo
     return table;
 }
 
-bool decodeImage(const Header &header, const FileInfo &info, const DecodeOptions &options, uint8_t *stream,
-    qsizetype streamLength, const BitmapView &bitmap, const DecodeObserver &observer)
+bool decodeImage(const Header &header, const FileInfo &info, const DecodeOptions &options, ImageStream &stream,
+    const BitmapView &bitmap, const DecodeObserver &observer)
 {
     if (!bitmap.bits || bitmap.width != header.width || bitmap.height != header.height
         || bitmap.bitCount != outputBitCount(header, info, options)
         || bitmap.stride < bitmapStride(bitmap.width, bitmap.bitCount))
         return false;
     const Converter converter(header, info, options, bitmap.bitCount);
-    if (header.interlaced())
-        return decodeProgressive(header, converter, options, stream, streamLength, bitmap, observer);
-    return decodeSequential(header, converter, stream, streamLength, bitmap, observer);
+    const int bpp = header.streamBitsPerPixel();
+    RowBlocks blocks(stream, rowBytes(header.width, bpp) + 1, std::max(1, bpp / 8));
+    if (!blocks.valid())
+        return false;
+    const bool decoded = header.interlaced() ? decodeProgressive(header, converter, options, blocks, bitmap, observer)
+                                             : decodeSequential(header, converter, blocks, bitmap, observer);
+    return decoded && stream.finish();
 }
 
 void applyConstantOpacity(const BitmapView &bitmap, uint8_t opacity)

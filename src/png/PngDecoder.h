@@ -53,17 +53,20 @@ std::vector<uint32_t> colorTable(const Header &header, FileInfo &info, int bitCo
 // What the decoder tells its caller while it works.
 struct DecodeObserver
 {
-    std::function<void(int percentage)> progress;
+    // False stops the decoding (the receiver is gone).
+    std::function<bool(int percentage)> progress;
     // Rows [first, first + count) of a non-interlaced image are in the bitmap.
     std::function<void(int32_t first, int32_t count)> rowsConverted;
     // An Adam7 pass (1-7) is in the bitmap.
     std::function<void(int pass)> passConverted;
 };
 
-// Decodes the filtered stream, which it unfilters in place, into bitmap. False on a bad
-// filter type, a stream too short for the header, or a format the decoder refuses.
-bool decodeImage(const Header &header, const FileInfo &info, const DecodeOptions &options, uint8_t *stream,
-    qsizetype streamLength, const BitmapView &bitmap, const DecodeObserver &observer);
+class ImageStream;
+
+// Decodes the image stream into bitmap. False on a bad filter type, a broken stream or one
+// whose length differs from the header's, or a format the decoder refuses.
+bool decodeImage(const Header &header, const FileInfo &info, const DecodeOptions &options, ImageStream &stream,
+    const BitmapView &bitmap, const DecodeObserver &observer);
 
 // Multiplies every byte of a 32-bit bitmap by opacity / 255, keeping it premultiplied.
 void applyConstantOpacity(const BitmapView &bitmap, uint8_t opacity);

@@ -1,6 +1,11 @@
 #include "PngFilters.h"
 
 #include <cstdlib>
+#include <cstring>
+
+#if defined(__SSE2__)
+#include <emmintrin.h>
+#endif
 
 namespace zelctl::png {
 
@@ -20,13 +25,27 @@ inline uint8_t paethPredictor(int a, int b, int c)
 
 void unfilterSub(uint8_t *row, qsizetype length, int distance)
 {
+    if (distance == 1 && length > 0) {
+        uint8_t a = row[0];
+        for (qsizetype i = 1; i < length; ++i)
+            row[i] = a = uint8_t(row[i] + a);
+        return;
+    }
     for (qsizetype i = distance; i < length; ++i)
         row[i] = uint8_t(row[i] + row[i - distance]);
 }
 
 void unfilterUp(uint8_t *row, const uint8_t *previous, qsizetype length)
 {
-    for (qsizetype i = 0; i < length; ++i)
+    qsizetype i = 0;
+#if defined(__SSE2__)
+    for (; i + 16 <= length; i += 16) {
+        const __m128i x = _mm_loadu_si128(reinterpret_cast<const __m128i *>(row + i));
+        const __m128i b = _mm_loadu_si128(reinterpret_cast<const __m128i *>(previous + i));
+        _mm_storeu_si128(reinterpret_cast<__m128i *>(row + i), _mm_add_epi8(x, b));
+    }
+#endif
+    for (; i < length; ++i)
         row[i] = uint8_t(row[i] + previous[i]);
 }
 
@@ -37,6 +56,13 @@ void unfilterAverage(uint8_t *row, const uint8_t *previous, qsizetype length, in
             row[i] = uint8_t(row[i] + (row[i - distance] >> 1));
         return;
     }
+    if (distance == 1 && length > 0) {
+        uint8_t a = uint8_t(row[0] + (previous[0] >> 1));
+        row[0] = a;
+        for (qsizetype i = 1; i < length; ++i)
+            row[i] = a = uint8_t(row[i] + ((a + previous[i]) >> 1));
+        return;
+    }
     const qsizetype head = std::min<qsizetype>(distance, length);
     for (qsizetype i = 0; i < head; ++i)
         row[i] = uint8_t(row[i] + (previous[i] >> 1));
@@ -44,16 +70,138 @@ void unfilterAverage(uint8_t *row, const uint8_t *previous, qsizetype length, in
         row[i] = uint8_t(row[i] + ((row[i - distance] + previous[i]) >> 1));
 }
 
-// Each pixel depends on the one before it, so the work runs pixel by pixel with the
-// distance known at compile time for the common layouts.
-template <int Distance> void unfilterPaethFixed(uint8_t *row, const uint8_t *previous, qsizetype length)
+#if defined(__SSE2__)
+// Pixels of 3, 4, 6 or 8 bytes are restored one whole pixel at a time in 16-bit lanes: each
+// pixel depends on the one before it, but its bytes do not depend on each other.
+// Loads go through integer registers: assembling odd sizes in memory would stall on every pixel.
+template <int Distance> __m128i loadPixel(const uint8_t *p)
 {
-    const qsizetype head = std::min<qsizetype>(Distance, length);
-    for (qsizetype i = 0; i < head; ++i)
-        row[i] = uint8_t(row[i] + previous[i]);
-    for (qsizetype i = Distance; i + Distance <= length; i += Distance) {
-        for (int k = 0; k < Distance; ++k)
-            row[i + k] = uint8_t(row[i + k] + paethPredictor(row[i + k - Distance], previous[i + k], previous[i + k - Distance]));
+    __m128i bytes;
+    if constexpr (Distance == 3) {
+        bytes = _mm_cvtsi32_si128(int(p[0] | p[1] << 8 | p[2] << 16));
+    } else if constexpr (Distance == 4) {
+        uint32_t value;
+        std::memcpy(&value, p, 4);
+        bytes = _mm_cvtsi32_si128(int(value));
+    } else if constexpr (Distance == 6) {
+        uint32_t low;
+        uint16_t high;
+        std::memcpy(&low, p, 4);
+        std::memcpy(&high, p + 4, 2);
+        bytes = _mm_cvtsi64_si128(int64_t(low | uint64_t(high) << 32));
+    } else {
+        bytes = _mm_loadl_epi64(reinterpret_cast<const __m128i *>(p));
+    }
+    return _mm_unpacklo_epi8(bytes, _mm_setzero_si128());
+}
+
+template <int Distance> void storePixel(uint8_t *p, __m128i wide)
+{
+    const __m128i bytes = _mm_packus_epi16(wide, wide);
+    if constexpr (Distance <= 4) {
+        const uint32_t value = uint32_t(_mm_cvtsi128_si32(bytes));
+        std::memcpy(p, &value, Distance);
+    } else {
+        const uint64_t value = uint64_t(_mm_cvtsi128_si64(bytes));
+        std::memcpy(p, &value, Distance);
+    }
+}
+
+inline __m128i absolute16(__m128i x)
+{
+    return _mm_max_epi16(x, _mm_sub_epi16(_mm_setzero_si128(), x));
+}
+
+inline __m128i select(__m128i mask, __m128i yes, __m128i no)
+{
+    return _mm_or_si128(_mm_and_si128(mask, yes), _mm_andnot_si128(mask, no));
+}
+
+// Sums wrap at 256 as the filters require: the low byte of each 16-bit lane is kept.
+inline __m128i wrap(__m128i x)
+{
+    return _mm_and_si128(x, _mm_set1_epi16(0xFF));
+}
+
+template <int Distance> void unfilterSubPixels(uint8_t *row, qsizetype length)
+{
+    __m128i a = loadPixel<Distance>(row);
+    for (qsizetype i = Distance; i < length; i += Distance) {
+        a = wrap(_mm_add_epi16(loadPixel<Distance>(row + i), a));
+        storePixel<Distance>(row + i, a);
+    }
+}
+
+template <int Distance> void unfilterAveragePixels(uint8_t *row, const uint8_t *previous, qsizetype length)
+{
+    __m128i a = _mm_setzero_si128();
+    for (qsizetype i = 0; i < length; i += Distance) {
+        const __m128i b = loadPixel<Distance>(previous + i);
+        a = wrap(_mm_add_epi16(loadPixel<Distance>(row + i), _mm_srli_epi16(_mm_add_epi16(a, b), 1)));
+        storePixel<Distance>(row + i, a);
+    }
+}
+
+template <int Distance> void unfilterPaethPixels(uint8_t *row, const uint8_t *previous, qsizetype length)
+{
+    __m128i a = _mm_setzero_si128();
+    __m128i c = _mm_setzero_si128();
+    for (qsizetype i = 0; i < length; i += Distance) {
+        const __m128i b = loadPixel<Distance>(previous + i);
+        const __m128i towardsB = _mm_sub_epi16(b, c);
+        const __m128i towardsA = _mm_sub_epi16(a, c);
+        const __m128i pa = absolute16(towardsB);
+        const __m128i pb = absolute16(towardsA);
+        const __m128i pc = absolute16(_mm_add_epi16(towardsB, towardsA));
+        const __m128i smallest = _mm_min_epi16(_mm_min_epi16(pa, pb), pc);
+        __m128i predictor = select(_mm_cmpeq_epi16(smallest, pb), b, c);
+        predictor = select(_mm_cmpeq_epi16(smallest, pa), a, predictor);
+        a = wrap(_mm_add_epi16(loadPixel<Distance>(row + i), predictor));
+        storePixel<Distance>(row + i, a);
+        c = b;
+    }
+}
+
+// True when the row was restored here.
+bool unfilterPixels(uint8_t filterType, uint8_t *row, const uint8_t *previous, qsizetype length, int distance)
+{
+    if (length % distance != 0)
+        return false;
+#define ZELCTL_PNG_DISPATCH(D)                                                                                         \
+    case D:                                                                                                            \
+        if (filterType == Sub)                                                                                         \
+            unfilterSubPixels<D>(row, length);                                                                         \
+        else if (filterType == Average)                                                                                \
+            unfilterAveragePixels<D>(row, previous, length);                                                           \
+        else                                                                                                           \
+            unfilterPaethPixels<D>(row, previous, length);                                                             \
+        return true;
+    switch (distance) {
+        ZELCTL_PNG_DISPATCH(3)
+        ZELCTL_PNG_DISPATCH(4)
+        ZELCTL_PNG_DISPATCH(6)
+        ZELCTL_PNG_DISPATCH(8)
+    default:
+        return false;
+    }
+#undef ZELCTL_PNG_DISPATCH
+}
+#endif
+
+// With one byte a pixel, the left and upper-left neighbours travel in registers: reading
+// them back from the row just written would wait on every byte.
+void unfilterPaethBytes(uint8_t *row, const uint8_t *previous, qsizetype length)
+{
+    if (length < 1)
+        return;
+    uint8_t a = uint8_t(row[0] + previous[0]);
+    row[0] = a;
+    uint8_t c = previous[0];
+    for (qsizetype i = 1; i < length; ++i) {
+        const uint8_t b = previous[i];
+        a = uint8_t(row[i] + paethPredictor(a, b, c));
+        row[i] = a;
+        c = b;
     }
 }
 
@@ -63,18 +211,8 @@ void unfilterPaeth(uint8_t *row, const uint8_t *previous, qsizetype length, int 
         unfilterSub(row, length, distance); // with nothing above, the predictor is the left byte
         return;
     }
-    if (length % distance == 0) {
-        switch (distance) {
-        case 1:
-            return unfilterPaethFixed<1>(row, previous, length);
-        case 3:
-            return unfilterPaethFixed<3>(row, previous, length);
-        case 4:
-            return unfilterPaethFixed<4>(row, previous, length);
-        default:
-            break;
-        }
-    }
+    if (distance == 1)
+        return unfilterPaethBytes(row, previous, length);
     const qsizetype head = std::min<qsizetype>(distance, length);
     for (qsizetype i = 0; i < head; ++i)
         row[i] = uint8_t(row[i] + previous[i]);
@@ -86,6 +224,11 @@ void unfilterPaeth(uint8_t *row, const uint8_t *previous, qsizetype length, int 
 
 bool unfilterRow(uint8_t filterType, uint8_t *row, const uint8_t *previous, qsizetype length, int distance)
 {
+#if defined(__SSE2__)
+    const bool wholePixels = filterType == Sub || (previous && (filterType == Average || filterType == Paeth));
+    if (wholePixels && unfilterPixels(filterType, row, previous, length, distance))
+        return true;
+#endif
     switch (filterType) {
     case None:
         return true;

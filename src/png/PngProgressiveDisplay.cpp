@@ -107,8 +107,8 @@ void ProgressiveDisplay::showPass(const stdPNGdata &image, int pass, bool fade)
     show(image, 0, m_height, fade ? quint8(pass * 255 / 7) : 255);
 }
 
-void ProgressiveDisplay::paintWhole(const stdPNGdata &image, qint32 targetDC, qint32 window, qint32 x, qint32 y,
-    quint8 opacity)
+void ProgressiveDisplay::paintWhole(
+    const stdPNGdata &image, qint32 targetDC, qint32 window, qint32 x, qint32 y, quint8 opacity)
 {
     const BitmapView bits = image.Bits();
     if (!targetDC || !image.OwnDC())

@@ -2,6 +2,7 @@
 
 #include "PngChunkReader.h"
 #include "PngDecoder.h"
+#include "PngImageStream.h"
 #include "PngProgressiveDisplay.h"
 #include "PngText.h"
 #include "platform/OleColor.h"
@@ -12,8 +13,6 @@
 #include <QGuiApplication>
 #include <QPointer>
 #include <QScreen>
-
-#include <zlib.h>
 
 #include <new>
 #include <optional>
@@ -39,7 +38,7 @@ enum StateFlag : qint32 {
 
 constexpr qint32 white = 0xFFFFFF;
 // A deflate stream cannot expand its input by more than this, so a header that asks for
-// more than the IDAT data can hold is refused before anything is allocated.
+// more than the IDAT data can hold is refused before the bitmap is made.
 constexpr qint64 maximumInflateRatio = 1032;
 
 bool isAlphaImage(const png::Header &header, const png::FileInfo &info)
@@ -59,7 +58,7 @@ public:
     bool load(const QByteArray &file, bool validateAllData, bool make32, quint8 alphaBlendValue);
     void reset();
     bool fail(const char *reason);
-    bool inflate(std::unique_ptr<uint8_t[]> &stream, qsizetype &length);
+    bool promisesMoreThanItHolds() const;
     void chooseDisplay(qint32 destinationDC, qint32 destinationHwnd);
     void chooseBackground();
     bool hidden() const { return stateFlags & PropertiesHidden; }
@@ -92,23 +91,9 @@ bool StdPNG::Private::fail(const char *reason)
     return false;
 }
 
-bool StdPNG::Private::inflate(std::unique_ptr<uint8_t[]> &stream, qsizetype &length)
+bool StdPNG::Private::promisesMoreThanItHolds() const
 {
-    const qint64 needed = png::inflatedSize(header);
-    const QByteArray &compressed = info.imageData;
-    if (needed < 1 || needed > (compressed.size() + 1) * maximumInflateRatio)
-        return false;
-    stream.reset(new (std::nothrow) uint8_t[size_t(needed)]);
-    if (!stream)
-        return false;
-    uLongf inflated = uLongf(needed);
-    if (uncompress(stream.get(), &inflated, reinterpret_cast<const Bytef *>(compressed.constData()),
-            uLong(compressed.size()))
-        != Z_OK)
-        return false;
-    // Rows past the end of a short stream would be read from memory nothing wrote.
-    length = qsizetype(inflated);
-    return qint64(inflated) == needed;
+    return png::inflatedSize(header) > (info.imageData.size() + 1) * maximumInflateRatio;
 }
 
 void StdPNG::Private::chooseDisplay(qint32 destinationDC, qint32 destinationHwnd)
@@ -177,9 +162,7 @@ bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool ma
     Q_EMIT q->Progress(0);
     if (!alive)
         return false;
-    std::unique_ptr<uint8_t[]> stream;
-    qsizetype streamLength = 0;
-    if (!inflate(stream, streamLength))
+    if (promisesMoreThanItHolds())
         return fail(png::reason::Inflate);
 
     if (make32 || alphaBlendValue < 255)
@@ -194,8 +177,8 @@ bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool ma
         const bool useProgression = header.interlaced()
             || (header.height / 100) * (header.width / 100)
                 > (screenSize.height() / 100) * (screenSize.width() / 100) / 3;
-        Q_EMIT q->ProgessiveDisplay(header.width, header.height, destinationDC, destinationHwnd,
-            info.backgroundColor, isAlphaImage(header, info), x, y, header.interlaced(), useProgression);
+        Q_EMIT q->ProgessiveDisplay(header.width, header.height, destinationDC, destinationHwnd, info.backgroundColor,
+            isAlphaImage(header, info), x, y, header.interlaced(), useProgression);
         if (!alive)
             return false;
     }
@@ -223,17 +206,23 @@ bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool ma
         }
     }
     png::DecodeObserver observer;
-    observer.progress = [&](int percentage) { Q_EMIT q->Progress(percentage); };
+    observer.progress = [&](int percentage) {
+        Q_EMIT q->Progress(percentage);
+        return !alive.isNull();
+    };
     if (display && (stateFlags & ScannerDisplay)) {
         observer.rowsConverted = [&](qint32 first, qint32 count) { display->showRows(imageData, first, count); };
     } else if (display) {
         const bool fade = stateFlags & FadeInDisplay;
         observer.passConverted = [&, fade](int pass) { display->showPass(imageData, pass, fade); };
     }
-    if (!png::decodeImage(header, info, options, stream.get(), streamLength, imageData.Bits(), observer))
-        return fail(png::reason::Unfilter);
+    png::ImageStream stream(info.imageData);
+    const bool decoded = png::decodeImage(header, info, options, stream, imageData.Bits(), observer);
+    // A Progress handler may have deleted this object.
     if (!alive)
         return false;
+    if (!decoded)
+        return fail(stream.failed() ? png::reason::Inflate : png::reason::Unfilter);
     display.reset();
     if (displayBackground != -1)
         png::applyConstantOpacity(imageData.Bits(), alphaBlendValue);
@@ -392,7 +381,9 @@ void StdPNG::setPalette(const QByteArray &palette)
 {
     png::Header &header = d->header;
     png::FileInfo &info = d->info;
-    if (d->hidden() || !header.validBitDepth() || (header.colorType != png::Indexed && header.colorType != png::Grey))
+    // A running load decodes with the header it read; the palette changes only between loads.
+    if (d->stateFlags >= LoadInProgress || !header.validBitDepth()
+        || (header.colorType != png::Indexed && header.colorType != png::Grey))
         return;
     if (palette.isEmpty()) {
         if (header.colorType == png::Indexed && info.transparentColor == -1) {

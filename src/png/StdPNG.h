@@ -87,11 +87,11 @@ public:
     // chunks. Make32Bit, or an AlphaBlendValue below 255, gives a 32-bit bitmap; the value is
     // the opacity of the final paint to a progressive target and of an image laid on a
     // background. Returns false at once while a load of this object runs.
-    Q_INVOKABLE bool LoadFile(const QString &FileName, bool ValidateAllData = true, bool Make32Bit = false,
-        quint8 AlphaBlendValue = 255);
+    Q_INVOKABLE bool LoadFile(
+        const QString &FileName, bool ValidateAllData = true, bool Make32Bit = false, quint8 AlphaBlendValue = 255);
     // LoadFile on the bytes of a file already in memory.
-    bool LoadData(const QByteArray &file, bool ValidateAllData = true, bool Make32Bit = false,
-        quint8 AlphaBlendValue = 255);
+    bool LoadData(
+        const QByteArray &file, bool ValidateAllData = true, bool Make32Bit = false, quint8 AlphaBlendValue = 255);
 
     // Draws the image, or its part (pngX, pngY, pngCx, pngCy), at (destX, destY) of hdc, scaled
     // to destCx × destCy (0: the image's size). 32-bit bitmaps are blended with their alpha and

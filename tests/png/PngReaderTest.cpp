@@ -39,7 +39,8 @@ QByteArray withBadCrc(const char *type, const QByteArray &data)
 
 TEST(PngReader, namesEachHeaderFailure)
 {
-    const struct {
+    const struct
+    {
         QByteArray header;
         const char *reason;
     } cases[] = {
@@ -132,17 +133,17 @@ TEST(PngReader, needsEveryChunkWholeAndAnIend)
 
 TEST(PngReader, skipsEmptyDataChunksAndStopsAtIend)
 {
-    EXPECT_EQ(loadFailure(signature() + ihdr(3, 1, 8, 0) + chunk("IDAT", {}) + idat + chunk("IDAT", {}) + iend),
-        "loaded");
+    EXPECT_EQ(
+        loadFailure(signature() + ihdr(3, 1, 8, 0) + chunk("IDAT", {}) + idat + chunk("IDAT", {}) + iend), "loaded");
     // Anything after IEND is never read.
     EXPECT_EQ(loadFailure(smallFile() + QByteArray(40, '\xff')), "loaded");
     // An IEND with data still ends the loop.
-    EXPECT_EQ(loadFailure(signature() + ihdr(3, 1, 8, 0) + idat + chunk("IEND", "xyz") + withBadCrc("IDAT", "z")),
-        "loaded");
+    EXPECT_EQ(
+        loadFailure(signature() + ihdr(3, 1, 8, 0) + idat + chunk("IEND", "xyz") + withBadCrc("IDAT", "z")), "loaded");
     // Data split over several IDAT chunks is joined.
     const QByteArray stream = deflate(QByteArray::fromHex("00010203"));
-    EXPECT_EQ(loadFailure(signature() + ihdr(3, 1, 8, 0) + chunk("IDAT", stream.left(3)) + chunk("IDAT", stream.mid(3))
-                  + iend),
+    EXPECT_EQ(loadFailure(
+                  signature() + ihdr(3, 1, 8, 0) + chunk("IDAT", stream.left(3)) + chunk("IDAT", stream.mid(3)) + iend),
         "loaded");
 }
 
@@ -236,8 +237,8 @@ TEST(PngReader, joinsTextAndCompressedTextIntoComments)
         + chunk("tEXt", QByteArray("\0no keyword", 11)) + chunk("zTXt", QByteArray("Bad\0\0not deflate", 17))
         + chunk("tEXt", QByteArray("Esc\0a\x1b[2Jb", 10));
     ASSERT_TRUE(image.LoadData(smallFile(text)));
-    EXPECT_EQ(image.Comments("(none)"),
-        QString::fromUtf8("Title: Café line\r\nnext\r\nAuthor: Ana\r\nSilva\r\nEsc: a [2Jb"));
+    EXPECT_EQ(
+        image.Comments("(none)"), QString::fromUtf8("Title: Café line\r\nnext\r\nAuthor: Ana\r\nSilva\r\nEsc: a [2Jb"));
 }
 
 TEST(PngReader, skipsTextThatInflatesBeyondFiftyTimesItsSize)
@@ -286,8 +287,8 @@ TEST(PngReader, givesPalettesAndGreyRamps)
     EXPECT_EQ(image.Palette(), palette);
 
     // An RGB image's suggested palette is not given.
-    ASSERT_TRUE(image.LoadData(signature() + ihdr(1, 1, 8, 2) + chunk("PLTE", palette)
-        + chunk("IDAT", deflate(QByteArray(4, '\0'))) + iend));
+    ASSERT_TRUE(image.LoadData(
+        signature() + ihdr(1, 1, 8, 2) + chunk("PLTE", palette) + chunk("IDAT", deflate(QByteArray(4, '\0'))) + iend));
     EXPECT_TRUE(image.Palette().isEmpty());
 }
 

@@ -33,7 +33,10 @@ QByteArray rgbFile(int width, int height)
 // Three RGBA pixels: transparent red, half-transparent green (alpha 0x80), opaque blue.
 QByteArray rgbaFile(const QByteArray &extra = {})
 {
-    const QByteArray rows = QByteArray::fromHex("00" "ff000000" "00ff0080" "0000ffff");
+    const QByteArray rows = QByteArray::fromHex("00"
+                                                "ff000000"
+                                                "00ff0080"
+                                                "0000ffff");
     return signature() + ihdr(3, 1, 8, 6) + extra + chunk("IDAT", deflate(rows)) + iend;
 }
 
@@ -316,8 +319,7 @@ TEST(PngEvents, scanTheImageInBlocksOfSixteenRows)
     });
     window.painted.clear();
     ASSERT_TRUE(image.LoadData(rgbFile(3, 40)));
-    EXPECT_EQ(window.painted,
-        (QList<QRect> { QRect(1, 2, 3, 16), QRect(1, 18, 3, 16), QRect(1, 34, 3, 8) }));
+    EXPECT_EQ(window.painted, (QList<QRect> { QRect(1, 2, 3, 16), QRect(1, 18, 3, 16), QRect(1, 34, 3, 8) }));
     EXPECT_EQ(target.argb(3, 2 + 39) & 0xFFFFFF, 0x148607u);
 }
 
@@ -349,5 +351,17 @@ TEST(PngEvents, showInterlacedPassesPixelatedOrFadingToTheSameImage)
                 ASSERT_EQ(target.argb(x, y) | 0xFF000000u, argbAt(plain, x, y)) << int(mode) << " at " << x << "," << y;
             }
         }
+    }
+}
+
+TEST(PngEvents, stopWhenAHandlerDeletesTheImage)
+{
+    for (const int when : { 0, 40 }) {
+        auto *image = new StdPNG;
+        QObject::connect(image, &StdPNG::Progress, [&](qint32 percentage) {
+            if (percentage == when)
+                delete image;
+        });
+        EXPECT_FALSE(image->LoadData(rgbFile(3, 40))) << when;
     }
 }

@@ -52,7 +52,7 @@ int channels(int colorType)
 
 } // namespace
 
-QByteArray writeWithLibpng(const ImageSpec &spec)
+QByteArray writeWithLibpng(const ImageRecipe &recipe)
 {
     QByteArray out;
     png_structp png = png_create_write_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
@@ -63,27 +63,27 @@ QByteArray writeWithLibpng(const ImageSpec &spec)
     }
     png_set_write_fn(png, &out, appendToBuffer, nullptr);
     png_set_filter(png, PNG_FILTER_TYPE_BASE, PNG_ALL_FILTERS);
-    png_set_IHDR(png, info, png_uint_32(spec.width), png_uint_32(spec.height), spec.bitDepth, spec.colorType,
-        spec.interlaced ? PNG_INTERLACE_ADAM7 : PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_BASE, PNG_FILTER_TYPE_BASE);
+    png_set_IHDR(png, info, png_uint_32(recipe.width), png_uint_32(recipe.height), recipe.bitDepth, recipe.colorType,
+        recipe.interlaced ? PNG_INTERLACE_ADAM7 : PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_BASE, PNG_FILTER_TYPE_BASE);
 
-    uint32_t state = spec.seed;
-    const int maximum = (1 << spec.bitDepth) - 1;
-    const int entries = spec.colorType == PNG_COLOR_TYPE_PALETTE ? 1 << spec.bitDepth : 0;
+    uint32_t state = recipe.seed;
+    const int maximum = (1 << recipe.bitDepth) - 1;
+    const int entries = recipe.colorType == PNG_COLOR_TYPE_PALETTE ? 1 << recipe.bitDepth : 0;
     std::vector<png_color> palette(static_cast<size_t>(entries));
     for (png_color &c : palette)
         c = { png_byte(nextRandom(state)), png_byte(nextRandom(state)), png_byte(nextRandom(state)) };
     if (entries)
         png_set_PLTE(png, info, palette.data(), entries);
 
-    const int samples = channels(spec.colorType);
-    std::vector<std::vector<int>> pixels(size_t(spec.height), std::vector<int>(size_t(spec.width * samples)));
+    const int samples = channels(recipe.colorType);
+    std::vector<std::vector<int>> pixels(size_t(recipe.height), std::vector<int>(size_t(recipe.width * samples)));
     for (auto &row : pixels) {
         for (int &sample : row)
             sample = int(nextRandom(state) % uint32_t(maximum + 1));
     }
     // Plenty of pixels repeat the first one, so colour keys match more than once.
-    for (int y = 0; y < spec.height; ++y) {
-        for (int x = 0; x < spec.width; ++x) {
+    for (int y = 0; y < recipe.height; ++y) {
+        for (int x = 0; x < recipe.width; ++x) {
             if ((x + y) % 3 == 0)
                 std::copy_n(pixels[0].begin(), samples, pixels[size_t(y)].begin() + x * samples);
         }
@@ -91,16 +91,16 @@ QByteArray writeWithLibpng(const ImageSpec &spec)
 
     std::vector<png_byte> alphas;
     png_color_16 key {};
-    if (spec.withTransparency) {
-        if (spec.colorType == PNG_COLOR_TYPE_PALETTE) {
+    if (recipe.withTransparency) {
+        if (recipe.colorType == PNG_COLOR_TYPE_PALETTE) {
             alphas.resize(size_t(std::max(1, entries / 2 + 1)));
             for (size_t i = 0; i < alphas.size(); ++i)
                 alphas[i] = png_byte(i % 3 == 0 ? 0 : nextRandom(state));
             png_set_tRNS(png, info, alphas.data(), int(alphas.size()), nullptr);
-        } else if (spec.colorType == PNG_COLOR_TYPE_GRAY) {
+        } else if (recipe.colorType == PNG_COLOR_TYPE_GRAY) {
             key.gray = png_uint_16(pixels[0][0]);
             png_set_tRNS(png, info, nullptr, 0, &key);
-        } else if (spec.colorType == PNG_COLOR_TYPE_RGB) {
+        } else if (recipe.colorType == PNG_COLOR_TYPE_RGB) {
             key.red = png_uint_16(pixels[0][0]);
             key.green = png_uint_16(pixels[0][1]);
             key.blue = png_uint_16(pixels[0][2]);
@@ -110,19 +110,19 @@ QByteArray writeWithLibpng(const ImageSpec &spec)
     png_write_info(png, info);
 
     const size_t rowBytes = png_get_rowbytes(png, info);
-    std::vector<std::vector<png_byte>> rows(size_t(spec.height), std::vector<png_byte>(rowBytes));
-    for (int y = 0; y < spec.height; ++y) {
+    std::vector<std::vector<png_byte>> rows(size_t(recipe.height), std::vector<png_byte>(rowBytes));
+    for (int y = 0; y < recipe.height; ++y) {
         png_byte *row = rows[size_t(y)].data();
-        for (int i = 0; i < spec.width * samples; ++i) {
+        for (int i = 0; i < recipe.width * samples; ++i) {
             const int value = pixels[size_t(y)][size_t(i)];
-            if (spec.bitDepth == 16) {
+            if (recipe.bitDepth == 16) {
                 row[2 * i] = png_byte(value >> 8);
                 row[2 * i + 1] = png_byte(value);
-            } else if (spec.bitDepth == 8) {
+            } else if (recipe.bitDepth == 8) {
                 row[i] = png_byte(value);
             } else {
-                const int perByte = 8 / spec.bitDepth;
-                const int shift = 8 - spec.bitDepth * (i % perByte + 1);
+                const int perByte = 8 / recipe.bitDepth;
+                const int shift = 8 - recipe.bitDepth * (i % perByte + 1);
                 row[i / perByte] = png_byte(row[i / perByte] | value << shift);
             }
         }
@@ -214,8 +214,7 @@ QByteArray greyFile(int width, int height, const QByteArray &extraChunks, uint8_
         for (int x = 0; x < width; ++x)
             rows.append(char(y + x));
     }
-    return signature() + ihdr(width, height, 8, 0) + extraChunks + chunk("IDAT", deflate(rows))
-        + chunk("IEND", {});
+    return signature() + ihdr(width, height, 8, 0) + extraChunks + chunk("IDAT", deflate(rows)) + chunk("IEND", {});
 }
 
 } // namespace zelctl::test

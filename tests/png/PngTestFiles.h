@@ -3,6 +3,7 @@
 #include <QByteArray>
 #include <QString>
 
+#include <algorithm>
 #include <cstdint>
 #include <ostream>
 #include <vector>
@@ -16,7 +17,7 @@ inline void PrintTo(const QString &text, std::ostream *out)
 // reader), and chunk by chunk for the malformed files libpng refuses to write.
 namespace zelctl::test {
 
-struct ImageSpec
+struct ImageRecipe
 {
     int width = 1;
     int height = 1;
@@ -25,12 +26,19 @@ struct ImageSpec
     bool interlaced = false;
     bool withTransparency = false;
     uint32_t seed = 1;
+
+    // Bytes of a pixel in the stream, at least 1.
+    int bytesPerPixel() const
+    {
+        const int channels = colorType == 2 ? 3 : colorType == 4 ? 2 : colorType == 6 ? 4 : 1;
+        return std::max(1, channels * bitDepth / 8);
+    }
 };
 
 // A file written by libpng with deterministic pseudo-random samples (every filter allowed).
 // Keyed images use the first pixel as their key, so some pixels match it; palette images
 // get fewer tRNS entries than palette entries, some of them 0.
-QByteArray writeWithLibpng(const ImageSpec &spec);
+QByteArray writeWithLibpng(const ImageRecipe &recipe);
 
 // Straight (not premultiplied) R, G, B, A per pixel as libpng reads the file, with 16-bit
 // samples cut to their first byte, low bit depths scaled to 8 bits and tRNS as alpha.
@@ -40,8 +48,8 @@ std::vector<uint8_t> readWithLibpng(const QByteArray &file, int &width, int &hei
 QByteArray chunk(const char *type, const QByteArray &data);
 QByteArray chunkWithCrc(const char *type, const QByteArray &data, uint32_t crc);
 QByteArray signature();
-QByteArray ihdr(int width, int height, int bitDepth, int colorType, int interlace = 0, int compression = 0,
-    int filter = 0);
+QByteArray ihdr(
+    int width, int height, int bitDepth, int colorType, int interlace = 0, int compression = 0, int filter = 0);
 // IDAT data: the rows (each starting with its filter byte) deflated.
 QByteArray deflate(const QByteArray &rows);
 QByteArray be32(uint32_t value);
