@@ -5,10 +5,10 @@
 #include "platform/Pointer.h"
 #include "tips/clsBalloonTip.h"
 
-#include <QGuiApplication>
 #include <QMouseEvent>
 
 #include <array>
+#include <optional>
 
 namespace zelctl {
 
@@ -32,9 +32,8 @@ public:
     std::array<QImage, SlotCount> pictures;
     QString skinId;
     bool active = false;
-    // A left press on the button that a release inside it turns into a click.
-    bool pressedHere = false;
     std::unique_ptr<clsBalloonTip> tip;
+    std::optional<skinCommon::HoverTracker> hover;
 };
 
 skGoButton::skGoButton(QWidget *parent)
@@ -42,6 +41,9 @@ skGoButton::skGoButton(QWidget *parent)
     , d(std::make_unique<skGoButtonPrivate>())
 {
     setMouseTracking(true);
+    d->hover.emplace(this, d->hovering,
+        skinCommon::HoverTracker::Handlers {
+            [this] { Q_EMIT MouseIn(); }, [this] { Q_EMIT MouseOut(); }, [this] { Repaint(); } });
     if (designMode())
         loadDesignPreview();
 }
@@ -217,48 +219,21 @@ void skGoButton::resizeEvent(QResizeEvent *event)
 
 void skGoButton::mouseMoveEvent(QMouseEvent *event)
 {
-    skinCommon::MouseArgs args = skinCommon::mouseArgs(event);
-    Q_EMIT MouseMove(args.Button, args.Shift, args.X, args.Y);
-    const bool held = event->buttons() != Qt::NoButton;
-    switch (skinCommon::trackPointer(this, event->globalPosition(), d->hovering, held)) {
-    case skinCommon::HoverChange::Entered:
-        d->hovering = true;
-        Q_EMIT MouseIn();
-        Repaint();
-        break;
-    case skinCommon::HoverChange::Left:
-        pointerLeft(held);
-        break;
-    case skinCommon::HoverChange::None:
-        break;
-    }
+    skinCommon::raiseMouse(this, &skGoButton::MouseMove, event);
+    d->hover->moved(event);
 }
 
 void skGoButton::leaveEvent(QEvent *event)
 {
     SurfaceHost::leaveEvent(event);
-    // Where the window system cannot capture the pointer, leaving the window is the last
-    // the control hears of it.
-    if (d->hovering && QGuiApplication::mouseButtons() == Qt::NoButton)
-        pointerLeft(false);
-}
-
-void skGoButton::pointerLeft(bool held)
-{
-    Q_EMIT MouseOut();
-    // While a button is held the capture stays, so the release still comes here.
-    if (!held)
-        platform::releaseCapture();
-    d->hovering = false;
-    Repaint();
+    d->hover->windowLeft();
 }
 
 void skGoButton::mousePressEvent(QMouseEvent *event)
 {
-    skinCommon::MouseArgs args = skinCommon::mouseArgs(event);
-    Q_EMIT MouseDown(args.Button, args.Shift, args.X, args.Y);
+    skinCommon::raiseMouse(this, &skGoButton::MouseDown, event);
+    d->hover->pressed(event);
     if (event->button() == Qt::LeftButton) {
-        d->pressedHere = true;
         if (!d->active) {
             setActive(true);
             Repaint();
@@ -268,15 +243,14 @@ void skGoButton::mousePressEvent(QMouseEvent *event)
 
 void skGoButton::mouseReleaseEvent(QMouseEvent *event)
 {
-    skinCommon::MouseArgs args = skinCommon::mouseArgs(event);
-    Q_EMIT MouseUp(args.Button, args.Shift, args.X, args.Y);
+    skinCommon::raiseMouse(this, &skGoButton::MouseUp, event);
     if (event->button() != Qt::LeftButton)
         return;
     if (d->active) {
         setActive(false);
         Repaint();
     }
-    if (std::exchange(d->pressedHere, false) && skinCommon::pointerInside(this, event->globalPosition()))
+    if (d->hover->releasedForClick(event))
         click();
     else if (!d->hovering && platform::capturedWidget() == this)
         platform::releaseCapture();

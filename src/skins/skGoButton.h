@@ -92,8 +92,6 @@ protected:
     void mouseReleaseEvent(QMouseEvent *event) override;
 
 private:
-    // The pointer went off the control: MouseOut, capture back unless a button is held.
-    void pointerLeft(bool held);
     void loadDesignPreview();
     void click();
 

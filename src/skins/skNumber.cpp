@@ -2,12 +2,10 @@
 
 #include "skinCommon.h"
 
-#include "platform/Pointer.h"
-
-#include <QGuiApplication>
 #include <QMouseEvent>
 
 #include <cmath>
+#include <optional>
 
 namespace zelctl {
 
@@ -44,7 +42,7 @@ public:
     bool active = false;
     QString caption;
     QString skinId;
-    bool pressedHere = false;
+    std::optional<skinCommon::HoverTracker> hover;
 };
 
 skNumber::skNumber(QWidget *parent)
@@ -52,6 +50,12 @@ skNumber::skNumber(QWidget *parent)
     , d(std::make_unique<skNumberPrivate>())
 {
     setMouseTracking(true);
+    // The pointer resting on the badge is what makes it active; leaving gives the capture
+    // back even with a button held.
+    d->hover.emplace(this, d->active,
+        skinCommon::HoverTracker::Handlers {
+            [this] { Q_EMIT MouseIn(); }, [this] { Q_EMIT MouseOut(); }, [this] { redraw(); } },
+        skinCommon::HoverTracker::HeldLeave::ReleaseCapture);
 }
 
 skNumber::~skNumber() = default;
@@ -205,14 +209,10 @@ void skNumber::redraw()
     dot(dc, w / 2, h / 2, w - 2, disc, gdi::R2_COPYPEN);
 
     if (!d->caption.isEmpty()) {
-        const gdi::HFONT gdiFont = gdi::CreateFont(captionFont.family(), captionFont.pointSizeF(), captionFont.bold());
-        const gdi::HGDIOBJ previous = gdi::SelectObject(dc, gdiFont);
-        gdi::SIZE extent;
-        gdi::GetTextExtentPoint32(dc, d->caption, extent);
+        const skinCommon::SelectedFont selected(dc, captionFont);
+        const gdi::SIZE extent = selected.extent(d->caption);
         gdi::SetTextColor(dc, text);
         gdi::TextOut(dc, int(std::floor((w - extent.cx) / 2.0)), int(std::floor((h - extent.cy) / 2.0)), d->caption);
-        gdi::SelectObject(dc, previous);
-        gdi::DeleteObject(gdiFont);
     }
     surface().setMaskColor(d->backColor);
     update();
@@ -229,52 +229,25 @@ void skNumber::resizeEvent(QResizeEvent *event)
 
 void skNumber::mouseMoveEvent(QMouseEvent *event)
 {
-    const bool held = event->buttons() != Qt::NoButton;
-    switch (skinCommon::trackPointer(this, event->globalPosition(), d->active, held)) {
-    case skinCommon::HoverChange::Entered:
-        d->active = true;
-        Q_EMIT MouseIn();
-        redraw();
-        break;
-    case skinCommon::HoverChange::Left:
-        pointerLeft(held);
-        break;
-    case skinCommon::HoverChange::None:
-        break;
-    }
+    d->hover->moved(event);
 }
 
 void skNumber::leaveEvent(QEvent *event)
 {
     SurfaceHost::leaveEvent(event);
-    // Where the window system cannot capture the pointer, leaving the window is the last
-    // the control hears of it.
-    if (d->active && QGuiApplication::mouseButtons() == Qt::NoButton)
-        pointerLeft(false);
-}
-
-void skNumber::pointerLeft(bool)
-{
-    Q_EMIT MouseOut();
-    platform::releaseCapture();
-    d->active = false;
-    redraw();
+    d->hover->windowLeft();
 }
 
 void skNumber::mousePressEvent(QMouseEvent *event)
 {
-    skinCommon::MouseArgs args = skinCommon::mouseArgs(event);
-    if (event->button() == Qt::LeftButton)
-        d->pressedHere = true;
-    Q_EMIT MouseDown(args.Button, args.Shift, args.X, args.Y);
+    d->hover->pressed(event);
+    skinCommon::raiseMouse(this, &skNumber::MouseDown, event);
 }
 
 void skNumber::mouseReleaseEvent(QMouseEvent *event)
 {
-    skinCommon::MouseArgs args = skinCommon::mouseArgs(event);
-    Q_EMIT MouseUp(args.Button, args.Shift, args.X, args.Y);
-    if (event->button() == Qt::LeftButton && std::exchange(d->pressedHere, false)
-        && skinCommon::pointerInside(this, event->globalPosition()))
+    skinCommon::raiseMouse(this, &skNumber::MouseUp, event);
+    if (d->hover->releasedForClick(event))
         Q_EMIT Clicked();
 }
 

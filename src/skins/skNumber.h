@@ -80,8 +80,6 @@ protected:
     void mouseDoubleClickEvent(QMouseEvent *event) override;
 
 private:
-    // The pointer went off the badge: MouseOut and the capture back, held button or not.
-    void pointerLeft(bool held);
     void redraw();
 
     std::unique_ptr<skNumberPrivate> const d;

@@ -5,10 +5,10 @@
 #include "platform/Pointer.h"
 #include "platform/Twips.h"
 
-#include <QGuiApplication>
 #include <QMouseEvent>
 
 #include <cmath>
+#include <optional>
 
 namespace zelctl {
 
@@ -42,8 +42,8 @@ public:
     qint32 margin = 0;
     bool active = false;
     bool hovering = false;
-    bool pressedHere = false;
     skinCommon::ImageFileSlots slices;
+    std::optional<skinCommon::HoverTracker> hover;
 };
 
 skSubMenu::skSubMenu(QWidget *parent)
@@ -51,6 +51,9 @@ skSubMenu::skSubMenu(QWidget *parent)
     , d(std::make_unique<skSubMenuPrivate>())
 {
     setMouseTracking(true);
+    d->hover.emplace(this, d->hovering,
+        skinCommon::HoverTracker::Handlers {
+            [this] { Q_EMIT MouseIn(); }, [this] { Q_EMIT MouseOut(); }, [this] { Redraw(); } });
 }
 
 skSubMenu::~skSubMenu() = default;
@@ -326,59 +329,29 @@ void skSubMenu::focusOutEvent(QFocusEvent *event)
 
 void skSubMenu::mouseMoveEvent(QMouseEvent *event)
 {
-    skinCommon::MouseArgs args = skinCommon::mouseArgs(event);
-    Q_EMIT MouseMove(args.Button, args.Shift, args.X, args.Y);
-    const bool held = event->buttons() != Qt::NoButton;
-    switch (skinCommon::trackPointer(this, event->globalPosition(), d->hovering, held)) {
-    case skinCommon::HoverChange::Entered:
-        d->hovering = true;
-        Q_EMIT MouseIn();
-        Redraw();
-        break;
-    case skinCommon::HoverChange::Left:
-        pointerLeft(held);
-        break;
-    case skinCommon::HoverChange::None:
-        break;
-    }
+    skinCommon::raiseMouse(this, &skSubMenu::MouseMove, event);
+    d->hover->moved(event);
 }
 
 void skSubMenu::leaveEvent(QEvent *event)
 {
     SurfaceHost::leaveEvent(event);
-    // Where the window system cannot capture the pointer, leaving the window is the last
-    // the control hears of it.
-    if (d->hovering && QGuiApplication::mouseButtons() == Qt::NoButton)
-        pointerLeft(false);
-}
-
-void skSubMenu::pointerLeft(bool held)
-{
-    Q_EMIT MouseOut();
-    // While a button is held the capture stays, so the release still comes here.
-    if (!held)
-        platform::releaseCapture();
-    d->hovering = false;
-    Redraw();
+    d->hover->windowLeft();
 }
 
 void skSubMenu::mousePressEvent(QMouseEvent *event)
 {
-    skinCommon::MouseArgs args = skinCommon::mouseArgs(event);
-    if (event->button() == Qt::LeftButton)
-        d->pressedHere = true;
-    Q_EMIT MouseDown(args.Button, args.Shift, args.X, args.Y);
+    d->hover->pressed(event);
+    skinCommon::raiseMouse(this, &skSubMenu::MouseDown, event);
 }
 
 void skSubMenu::mouseReleaseEvent(QMouseEvent *event)
 {
-    skinCommon::MouseArgs args = skinCommon::mouseArgs(event);
-    Q_EMIT MouseUp(args.Button, args.Shift, args.X, args.Y);
+    skinCommon::raiseMouse(this, &skSubMenu::MouseUp, event);
     d->active = false;
     d->hovering = false;
     Redraw();
-    if (event->button() == Qt::LeftButton && std::exchange(d->pressedHere, false)
-        && skinCommon::pointerInside(this, event->globalPosition()))
+    if (d->hover->releasedForClick(event))
         click();
     else if (platform::capturedWidget() == this && event->buttons() == Qt::NoButton)
         platform::releaseCapture();

@@ -111,8 +111,6 @@ protected:
     void mouseReleaseEvent(QMouseEvent *event) override;
 
 private:
-    // The pointer went off the control: MouseOut, capture back unless a button is held.
-    void pointerLeft(bool held);
     // Returns the x where the caption starts, in pixels.
     int drawArrowBox();
     int drawSlices(int captionWidth);

@@ -6,6 +6,7 @@
 #include "platform/Twips.h"
 
 #include <QFileInfo>
+#include <QGuiApplication>
 #include <QImageReader>
 #include <QMouseEvent>
 #include <QWidget>
@@ -43,17 +44,54 @@ bool pointerInside(const QWidget *control, QPointF global)
     return x >= 0 && y >= 0 && x <= twips(control->width()) && y <= twips(control->height());
 }
 
-HoverChange trackPointer(QWidget *control, QPointF global, bool hovering, bool buttonHeld)
+HoverTracker::HoverTracker(QWidget *control, bool &hovering, Handlers handlers, HeldLeave heldLeave)
+    : m_control(control)
+    , m_hovering(hovering)
+    , m_handlers(std::move(handlers))
+    , m_heldLeave(heldLeave)
+{ }
+
+void HoverTracker::moved(const QMouseEvent *event)
 {
-    platform::setCapture(control);
-    const bool inside = pointerInside(control, global);
-    if (inside && !hovering)
-        return HoverChange::Entered;
-    if (!inside && hovering)
-        return HoverChange::Left;
-    if (!inside && !buttonHeld)
+    const bool held = event->buttons() != Qt::NoButton;
+    platform::setCapture(m_control);
+    const bool inside = pointerInside(m_control, event->globalPosition());
+    if (inside && !m_hovering) {
+        m_hovering = true;
+        m_handlers.mouseIn();
+        m_handlers.repaint();
+    } else if (!inside && m_hovering) {
+        left(held);
+    } else if (!inside && !held) {
         platform::releaseCapture();
-    return HoverChange::None;
+    }
+}
+
+void HoverTracker::windowLeft()
+{
+    if (m_hovering && QGuiApplication::mouseButtons() == Qt::NoButton)
+        left(false);
+}
+
+void HoverTracker::left(bool held)
+{
+    m_handlers.mouseOut();
+    if (!held || m_heldLeave == HeldLeave::ReleaseCapture)
+        platform::releaseCapture();
+    m_hovering = false;
+    m_handlers.repaint();
+}
+
+void HoverTracker::pressed(const QMouseEvent *event)
+{
+    if (event->button() == Qt::LeftButton)
+        m_pressedHere = true;
+}
+
+bool HoverTracker::releasedForClick(const QMouseEvent *event)
+{
+    return event->button() == Qt::LeftButton && std::exchange(m_pressedHere, false)
+        && pointerInside(m_control, event->globalPosition());
 }
 
 MouseArgs mouseArgs(const QMouseEvent *event)

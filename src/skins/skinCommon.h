@@ -13,6 +13,7 @@
 #include <QVariant>
 
 #include <array>
+#include <functional>
 
 class QMouseEvent;
 class QWidget;
@@ -40,14 +41,48 @@ ZELCTL_EXPORT QString previewFolder();
 // Whether a pointer at a screen position lies on the control; the far edges count as on it.
 ZELCTL_EXPORT bool pointerInside(const QWidget *control, QPointF global);
 
-// What a pointer move means to a control that tracks hovering.
-enum class HoverChange { None, Entered, Left };
+// Hovering and clicking for a control that raises MouseIn and MouseOut itself. It takes
+// the pointer capture on a move (so the control hears of the pointer leaving) and gives
+// it back when the pointer is off an idle control, so an idle control never keeps the
+// application's pointer input. The hovering flag belongs to the control; the tracker
+// keeps it up to date.
+class ZELCTL_EXPORT HoverTracker
+{
+public:
+    // Whether leaving with a button held keeps the capture, so the release still comes
+    // to the control.
+    enum class HeldLeave { KeepCapture, ReleaseCapture };
 
-// Takes the pointer capture for the control (so it hears of the pointer leaving) and
-// tells whether the pointer entered or left it. A control that is not hovering and sees
-// the pointer outside gives the capture back unless a button is held, so an idle control
-// never keeps the application's pointer input.
-ZELCTL_EXPORT HoverChange trackPointer(QWidget *control, QPointF global, bool hovering, bool buttonHeld);
+    struct Handlers
+    {
+        std::function<void()> mouseIn;
+        std::function<void()> mouseOut;
+        std::function<void()> repaint;
+    };
+
+    HoverTracker(QWidget *control, bool &hovering, Handlers handlers, HeldLeave heldLeave = HeldLeave::KeepCapture);
+
+    // From mouseMoveEvent: raises MouseIn or MouseOut as the pointer crosses the edge.
+    void moved(const QMouseEvent *event);
+    // From leaveEvent: where the window system cannot capture the pointer, leaving the
+    // window is the last the control hears of it.
+    void windowLeft();
+
+    // From mousePressEvent: remembers a left press on the control.
+    void pressed(const QMouseEvent *event);
+    // From mouseReleaseEvent: whether this release ends a left press on the control
+    // inside it, i.e. makes a click. A left release forgets the press either way.
+    bool releasedForClick(const QMouseEvent *event);
+
+private:
+    void left(bool held);
+
+    QWidget *m_control;
+    bool &m_hovering;
+    Handlers m_handlers;
+    HeldLeave m_heldLeave;
+    bool m_pressedHere = false;
+};
 
 // The arguments of a mouse event as hosts receive them: Button 1 left, 2 right, 4 middle
 // (for a move, the buttons held), Shift 1 shift, 2 control, 4 alt, and the position in
@@ -60,6 +95,14 @@ struct MouseArgs
     float Y = 0;
 };
 ZELCTL_EXPORT MouseArgs mouseArgs(const QMouseEvent *event);
+
+// Raises one of a control's mouse events (MouseDown, MouseUp, MouseMove) for an event.
+template <typename Control>
+void raiseMouse(Control *control, void (Control::*event)(qint16 &, qint16 &, float &, float &), const QMouseEvent *from)
+{
+    MouseArgs args = mouseArgs(from);
+    Q_EMIT(control->*event)(args.Button, args.Shift, args.X, args.Y);
+}
 
 // The four picture slots that ImageFile(nIndex) fills: setting a slot to a new path empties
 // it and loads the file afresh; an index that is not a number from 0 to 3, a path the slot
