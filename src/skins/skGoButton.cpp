@@ -44,8 +44,6 @@ skGoButton::skGoButton(QWidget *parent)
     d->hover.emplace(this, d->hovering,
         skinCommon::HoverTracker::Handlers {
             [this] { Q_EMIT MouseIn(); }, [this] { Q_EMIT MouseOut(); }, [this] { Repaint(); } });
-    if (designMode())
-        loadDesignPreview();
 }
 
 skGoButton::~skGoButton() = default;
