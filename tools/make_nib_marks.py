@@ -4,24 +4,11 @@ valid number and a red no-entry disc (32 pixels) for a wrong one. Standard libra
 so the output is the same on every machine."""
 
 import math
-import struct
-import zlib
 from pathlib import Path
 
+import pngio
+
 SAMPLES = 4  # supersampling per axis, for smooth edges
-
-
-def write_png(path, size, pixels):
-    """pixels: rows of (r, g, b, a) tuples."""
-    raw = b"".join(b"\x00" + bytes(c for px in row for c in px) for row in pixels)
-
-    def chunk(kind, data):
-        body = kind + data
-        return struct.pack(">I", len(data)) + body + struct.pack(">I", zlib.crc32(body))
-
-    header = struct.pack(">IIBBBBB", size, size, 8, 6, 0, 0, 0)
-    png = b"\x89PNG\r\n\x1a\n" + chunk(b"IHDR", header) + chunk(b"IDAT", zlib.compress(raw, 9)) + chunk(b"IEND", b"")
-    path.write_bytes(png)
 
 
 def render(size, inside):
@@ -78,9 +65,9 @@ def no_entry(x, y):
 def main():
     out = Path(__file__).resolve().parent.parent / "resources" / "nib"
     out.mkdir(parents=True, exist_ok=True)
-    write_png(out / "validpic16.png", 16, render(16, tick))
-    write_png(out / "validpic32.png", 32, render(32, tick))
-    write_png(out / "Image1.png", 32, render(32, no_entry))
+    pngio.write(out / "validpic16.png", 16, 16, render(16, tick), alpha=True)
+    pngio.write(out / "validpic32.png", 32, 32, render(32, tick), alpha=True)
+    pngio.write(out / "Image1.png", 32, 32, render(32, no_entry), alpha=True)
 
 
 if __name__ == "__main__":

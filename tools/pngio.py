@@ -1,4 +1,4 @@
-"""Just enough PNG for the flag generator: read 8-bit, non-interlaced images and write
+"""Just enough PNG for the generators of tools/: read 8-bit, non-interlaced images and write
 RGB or RGBA ones, with nothing but the standard library."""
 
 import struct
@@ -63,7 +63,7 @@ def read_rgba(path):
     with open(path, "rb") as f:
         data = f.read()
     if not data.startswith(SIGNATURE):
-        raise PngError(path + ": not a PNG file")
+        raise PngError(str(path) + ": not a PNG file")
     header = None
     palette = []
     alphas = b""
@@ -78,14 +78,14 @@ def read_rgba(path):
         elif kind == b"IDAT":
             idat += body
     if header is None:
-        raise PngError(path + ": no header")
+        raise PngError(str(path) + ": no header")
     width, height, depth, colour, _, _, interlace = header
     if depth != 8 or interlace != 0 or colour not in CHANNELS:
         raise PngError("%s: unsupported form (depth %d, colour %d, interlace %d)" % (path, depth, colour, interlace))
     bpp = CHANNELS[colour]
     raw = zlib.decompress(idat)
     if len(raw) < height * (1 + width * bpp):
-        raise PngError(path + ": image data too short")
+        raise PngError(str(path) + ": image data too short")
     rows = []
     for line in _unfilter(raw, width, height, bpp):
         px = [tuple(line[i : i + bpp]) for i in range(0, len(line), bpp)]
