@@ -43,6 +43,20 @@ EventLog::EventLog(cNIF &control)
     QObject::connect(&control, &cNIF::NameUpdated, [this](const QString &name) { events << "NameUpdated:" + name; });
 }
 
+void NifFixture::SetUp()
+{
+    control = new cNIF(&form);
+    control->InitNew();
+    other = new QLineEdit(&form);
+    other->move(0, 40);
+    form.show();
+    QApplication::setActiveWindow(&form);
+    ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
+    box = entryBox(*control);
+    box->setFocus();
+    log = std::make_unique<EventLog>(*control);
+}
+
 platform::OleColor textColour(cNIF &control)
 {
     return platform::fromQColor(entryBox(control)->palette().color(QPalette::Text));

@@ -5,9 +5,15 @@
 #include "nif/cNIF.h"
 #include "platform/OleColor.h"
 
+#include <QApplication>
 #include <QHash>
 #include <QLineEdit>
 #include <QStringList>
+#include <QTest>
+
+#include <gtest/gtest.h>
+
+#include <memory>
 
 namespace zelctl::test {
 
@@ -69,6 +75,34 @@ platform::OleColor textColour(cNIF &control);
 platform::OleColor backColour(cNIF &control);
 platform::OleColor statusColour(cNIF &control);
 QString tipText(cNIF &control);
+
+// A shown, active form holding a fresh control (focused) and another input to move focus to.
+class NifFixture : public ::testing::Test
+{
+protected:
+    void SetUp() override;
+
+    void type(const QString &text)
+    {
+        box->setFocus();
+        QTest::keyClicks(box, text);
+    }
+
+    void erase()
+    {
+        box->setFocus();
+        box->selectAll();
+        QTest::keyClick(box, Qt::Key_Backspace);
+    }
+
+    ScriptedGrabberFactory grabbers;
+    QWidget form;
+    cNIF *control = nullptr;
+    QLineEdit *other = nullptr;
+    QLineEdit *box = nullptr;
+    std::unique_ptr<EventLog> log;
+    companion::JsonDeclaration declaration;
+};
 
 // Writes a value into a declaration's NIF information store.
 void storeInfo(companion::Declaration &declaration, const QString &key, const QString &value);
