@@ -13,6 +13,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <functional>
 
 using namespace zelctl;
@@ -31,37 +32,32 @@ QList<GFXItem> numberedItems(int count)
     return items;
 }
 
-CommandButton *element(QDialog &dialog, const QString &array, int index)
+// The first button of a control array that `wanted` picks.
+CommandButton *element(QDialog &dialog, const char *array, const std::function<bool(CommandButton *)> &wanted)
 {
-    for (CommandButton *button : dialog.findChildren<CommandButton *>(array)) {
-        if (button->Index() == index)
-            return button;
-    }
-    return nullptr;
+    const auto buttons = dialog.findChildren<CommandButton *>(QLatin1String(array));
+    const auto found = std::find_if(buttons.begin(), buttons.end(), wanted);
+    return found == buttons.end() ? nullptr : *found;
 }
 
 CommandButton *item(QDialog &dialog, int index)
 {
-    return element(dialog, QStringLiteral("btnSelector"), index);
-}
-
-CommandButton *okButton(QDialog &dialog)
-{
-    return element(dialog, QStringLiteral("btn_Handle"), 0);
-}
-
-CommandButton *cancelButton(QDialog &dialog)
-{
-    return element(dialog, QStringLiteral("btn_Handle"), 1);
+    return element(dialog, "btnSelector", [&](CommandButton *b) { return b->Index() == index; });
 }
 
 CommandButton *itemTitled(QDialog &dialog, const QString &title)
 {
-    for (CommandButton *button : dialog.findChildren<CommandButton *>(QStringLiteral("btnSelector"))) {
-        if (button->Caption() == title)
-            return button;
-    }
-    return nullptr;
+    return element(dialog, "btnSelector", [&](CommandButton *b) { return b->Caption() == title; });
+}
+
+CommandButton *okButton(QDialog &dialog)
+{
+    return element(dialog, "btn_Handle", [](CommandButton *b) { return b->Index() == 0; });
+}
+
+CommandButton *cancelButton(QDialog &dialog)
+{
+    return element(dialog, "btn_Handle", [](CommandButton *b) { return b->Index() == 1; });
 }
 
 // Every event of the class, in the order raised.
