@@ -5,6 +5,9 @@
 #include <QString>
 #include <QStringList>
 
+#include <gtest/gtest.h>
+
+#include <functional>
 #include <initializer_list>
 
 // Test-side arithmetic for building tax numbers. The check digits are worked out here from
@@ -87,6 +90,64 @@ template <typename Rule> QString firstWith(long long from, int width, Rule rule,
         if (mod(rule(text), modulus) == remainder)
             return text;
     }
+}
+
+inline int crossSum(int n)
+{
+    return n / 10 + n % 10;
+}
+
+// The check digit "up to the next ten" of a weighted sum.
+inline int tenComplement(int sum)
+{
+    return mod(-sum, 10);
+}
+
+// A country whose numbers are lead + prefix + one check digit + tail, and the check digits
+// it should accept after a prefix.
+struct CheckDigitRule
+{
+    const char *country;
+    QString lead, tail;
+    QStringList prefixes;
+    std::function<QString(const QString &)> accepted;
+};
+
+inline void expectCheckDigits(std::initializer_list<CheckDigitRule> rules)
+{
+    for (const CheckDigitRule &rule : rules) {
+        for (const QString &prefix : rule.prefixes) {
+            EXPECT_EQ(acceptedDigits(QString(rule.country), rule.lead + prefix, rule.tail), rule.accepted(prefix))
+                << rule.country << " " << prefix.toStdString();
+        }
+    }
+}
+
+// A prefix that no check digit makes valid, and the rule that refuses it.
+struct Refusal
+{
+    const char *rule, *country;
+    QString prefix, tail;
+};
+
+inline void expectRefused(std::initializer_list<Refusal> rows)
+{
+    for (const Refusal &row : rows)
+        EXPECT_EQ(acceptedDigits(QString(row.country), row.prefix, row.tail), "") << row.country << ": " << row.rule;
+}
+
+// A whole number, whether it is valid, and the rule that says so.
+struct FormRule
+{
+    const char *rule, *country;
+    QString number;
+    bool valid;
+};
+
+inline void expectForms(std::initializer_list<FormRule> rows)
+{
+    for (const FormRule &row : rows)
+        EXPECT_EQ(isValid(QString(row.country), row.number), row.valid) << row.country << ": " << row.rule;
 }
 
 } // namespace zelctl::test

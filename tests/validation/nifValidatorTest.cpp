@@ -24,22 +24,17 @@ TEST(CountryTable, mapsTheTwentySevenCodesInAlphabeticalOrderAndBack)
 
 TEST(CountryTable, acceptsOnlyTheExactCode)
 {
-    for (const char *code : { "pt", "Pt", "PT ", " PT", "P", "PRT", "", "GR", "UK", "US" })
+    for (const char *code : { "pt", "PT ", " PT", "P", "PRT", "", "GR", "US" })
         EXPECT_EQ(CountryIndex(QString(code)), -1) << code;
 }
 
-TEST(CheckTaxNumber, acceptsAnyTextForACountryWithoutARoutine)
+TEST(CheckTaxNumber, acceptsAnyTextForACountryWithoutARoutineButNoEmptyTextForOneWithIt)
 {
-    for (int index : { -1, CountryCount, 1000, INT_MAX, INT_MIN, 65536 + 22 }) {
+    for (int index : { -1, CountryCount, INT_MAX, INT_MIN, 65536 + 22 }) {
         EXPECT_TRUE(CheckTaxNumber(u"", index)) << index;
         EXPECT_TRUE(CheckTaxNumber(u"anything at all", index)) << index;
     }
-    EXPECT_TRUE(isValid(u"US", "123"));
     EXPECT_TRUE(isValid(u"pt", "123456780")) << "lower case is an unknown country";
-}
-
-TEST(CheckTaxNumber, rejectsTheEmptyTextForEveryCountry)
-{
     for (int index = 0; index < CountryCount; ++index)
         EXPECT_FALSE(CheckTaxNumber(u"", index)) << CountryCode(index).toString().toStdString();
 }
@@ -79,13 +74,10 @@ TEST(IsNumericFrom, takesTheLenientReadingOfTheRequestedPart)
         bool numeric;
     };
     const Row rows[] = { { "123456789", 1, 0, true }, { "", 1, 0, false }, { "   ", 1, 0, false },
-        { " 12 ", 1, 0, true }, { "+12", 1, 0, true }, { "12-", 1, 0, true }, { "-12-", 1, 0, false },
-        { "- 12", 1, 0, true }, { "1.5", 1, 0, true }, { "1,5", 1, 0, true }, { "1.5.1", 1, 0, false },
-        { ".", 1, 0, false }, { "1E5", 1, 0, true }, { "1e-5", 1, 0, true }, { "1E", 1, 0, false },
-        { "E5", 1, 0, false }, { "12A", 1, 0, false }, { "1 2", 1, 0, false }, { "U12345678", 2, 0, true },
-        { "U12345678", 1, 0, false }, { "12345678A", 1, 8, true }, { "12345678A", 1, 9, false },
-        { "12345678A", 9, 0, false }, { "123", 3, 0, true }, { "123", 4, 0, false }, { "123", 0, 0, false },
-        { "123", 2, 99, true }, { "123", 1, -3, true } };
+        { " 12 ", 1, 0, true }, { "12-", 1, 0, true }, { "-12-", 1, 0, false }, { "1,5", 1, 0, true },
+        { "1.5.1", 1, 0, false }, { "1e-5", 1, 0, true }, { "1E", 1, 0, false }, { "1 2", 1, 0, false },
+        { "U12345678", 2, 0, true }, { "12345678A", 1, 8, true }, { "12345678A", 1, 9, false }, { "123", 4, 0, false },
+        { "123", 0, 0, false }, { "123", 2, 99, true }, { "123", 1, -3, true } };
     for (const Row &row : rows)
         EXPECT_EQ(IsNumericFrom(QString(row.text), row.start, row.length), row.numeric)
             << '"' << row.text << "\" from " << row.start << " length " << row.length;
@@ -96,7 +88,6 @@ TEST(Helpers, roundUpGoesToTheNextWholeNumber)
 {
     EXPECT_EQ(RoundUp(4.0), 4);
     EXPECT_EQ(RoundUp(4.1), 5);
-    EXPECT_EQ(RoundUp(0.0), 0);
     EXPECT_EQ(RoundUp(-1.5), -1);
     EXPECT_EQ(RoundUp(156 / 10.0), 16);
     EXPECT_EQ(RoundUp(std::nan("")), 0);
@@ -108,8 +99,6 @@ TEST(Helpers, bigModIsExactForFifteenDigits)
 {
     EXPECT_EQ(BigMod(999999999999999LL, 97), 999999999999999LL % 97);
     EXPECT_EQ(BigMod(99999999999999LL * 97, 97), 0);
-    EXPECT_EQ(BigMod(12345678912LL, 97), 12345678912LL % 97);
-    EXPECT_EQ(BigMod(0, 11), 0);
     EXPECT_EQ(BigMod(5, 0), -1);
     EXPECT_EQ(BigMod(-5, 11), -1);
 }
@@ -118,14 +107,9 @@ TEST(Helpers, letters)
 {
     EXPECT_TRUE(IsLetter(u"a"));
     EXPECT_TRUE(IsLetter(u"Z"));
-    EXPECT_FALSE(IsLetter(u"É"));
-    EXPECT_FALSE(IsLetter(u"AB"));
-    EXPECT_FALSE(IsLetter(u""));
-    EXPECT_FALSE(IsLetter(u"1"));
-    EXPECT_FALSE(IsLetter(u"@"));
-    EXPECT_FALSE(IsLetter(u"["));
+    for (const char16_t *text : { u"É", u"AB", u"", u"1", u"@", u"[" })
+        EXPECT_FALSE(IsLetter(text));
 
-    EXPECT_EQ(AlphabetLetter(0), u'A');
     EXPECT_EQ(AlphabetLetter(25), u'Z');
     EXPECT_EQ(AlphabetLetter(26), u'?');
     EXPECT_EQ(AlphabetLetter(-1), u'?');
