@@ -18,6 +18,20 @@ template <typename Control> platform::OleColor pixel(Control &control, int x, in
     return platform::fromQColor(QColor(control.surface().image().pixel(x, y)));
 }
 
+struct PixelAt
+{
+    int x;
+    int y;
+    platform::OleColor colour;
+};
+
+// Checks the colours at the given positions, naming each position that differs.
+template <typename Control> void expectPixels(Control &control, std::initializer_list<PixelAt> expected)
+{
+    for (const PixelAt &p : expected)
+        EXPECT_EQ(pixel(control, p.x, p.y), p.colour) << "at " << p.x << "," << p.y;
+}
+
 // Pictures written for one test: solid blocks of colour, optionally with a transparent
 // border, saved as PNG files in a private folder.
 class PictureFolder

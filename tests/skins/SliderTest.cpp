@@ -72,9 +72,7 @@ TEST_F(Slider, opensWideEnoughForItsContentsAndClosesToTheButton)
     slider->setSlideOpen(false);
     EXPECT_EQ(width(), ButtonWidth);
     EXPECT_EQ(cc->Left(), 0);
-    EXPECT_EQ(cc->Top(), 0);
     EXPECT_EQ(cc->Caption(), QStringLiteral("è"));
-    EXPECT_EQ(cc->Height(), 600);
 }
 
 TEST_F(Slider, resizeKeepsTheButtonOnTheRightEdgeWhenOpen)

@@ -37,19 +37,11 @@ protected:
 TEST_F(SubMenu, arrowBoxHasANotchOnTheLeftAndAPointOnTheRight)
 {
     item->Redraw();
-    EXPECT_EQ(pixel(*item, 100, 10), Fill);
-    // The notch: its tip reaches x = 10 at mid height.
-    EXPECT_EQ(pixel(*item, 0, 0), Clear);
-    EXPECT_EQ(pixel(*item, 0, 19), Clear);
-    EXPECT_EQ(pixel(*item, 9, 10), Clear);
-    EXPECT_EQ(pixel(*item, 5, 2), Fill);
-    EXPECT_EQ(pixel(*item, 11, 10), Fill);
-    // The point: the box ends at 190, the point narrows to x = 199.
-    EXPECT_EQ(pixel(*item, 195, 10), Fill);
-    EXPECT_EQ(pixel(*item, 195, 2), Clear);
-    EXPECT_EQ(pixel(*item, 199, 10), Fill);
-    EXPECT_EQ(pixel(*item, 199, 8), Clear);
-    EXPECT_EQ(pixel(*item, 189, 0), Fill);
+    // The notch's tip reaches x = 10 at mid height; the box ends at 190 and its point
+    // narrows to x = 199.
+    zelctl::test::expectPixels(*item,
+        { { 100, 10, Fill }, { 0, 0, Clear }, { 0, 19, Clear }, { 9, 10, Clear }, { 5, 2, Fill }, { 11, 10, Fill },
+            { 195, 10, Fill }, { 195, 2, Clear }, { 199, 10, Fill }, { 199, 8, Clear }, { 189, 0, Fill } });
     EXPECT_FALSE(item->mask().contains(QPoint(0, 10)));
     EXPECT_FALSE(item->mask().contains(QPoint(195, 2)));
     EXPECT_TRUE(item->mask().contains(QPoint(100, 10)));
@@ -63,17 +55,12 @@ TEST_F(SubMenu, backgroundPrefersActiveOverHover)
     EXPECT_EQ(pixel(*item, 100, 10), 0x7FD5E1u);
 }
 
-TEST_F(SubMenu, transparencyMinusOneLeavesTheBoxOpaque)
+TEST_F(SubMenu, transparencyMinusOneLeavesTheBoxOpaqueAndColourChangesWaitForRedraw)
 {
     item->setTransparencyColor(skSubMenu::NoTransparency);
     item->Redraw();
     EXPECT_TRUE(item->mask().isEmpty());
     EXPECT_EQ(pixel(*item, 100, 10), Fill);
-}
-
-TEST_F(SubMenu, colourChangesWaitForRedraw)
-{
-    item->Redraw();
     item->setBackColor(0x0000FF);
     EXPECT_EQ(pixel(*item, 100, 10), Fill);
     item->Redraw();
@@ -115,9 +102,9 @@ TEST_F(SubMenu, slicesAreAndedOnWhiteOrOnGreyWhenHovered)
     item->resize(300, 24);
     item->setCaption(QString());
     EXPECT_EQ(item->size(), QSize(14, 24)) << "left width + caption width + middle width";
-    EXPECT_EQ(pixel(*item, 2, 5), platform::rgb(255, 0, 0));
-    EXPECT_EQ(pixel(*item, 6, 5), platform::rgb(255, 255, 0));
-    EXPECT_EQ(pixel(*item, 12, 5), platform::rgb(0, 255, 0));
+    zelctl::test::expectPixels(*item,
+        { { 2, 5, platform::rgb(255, 0, 0) }, { 6, 5, platform::rgb(255, 255, 0) },
+            { 12, 5, platform::rgb(0, 255, 0) } });
     EXPECT_TRUE(item->mask().isEmpty());
 
     // Now narrower than twice its height: the next Redraw widens it again first.
