@@ -5,7 +5,7 @@
 #include <cmath>
 
 using namespace zelctl::gdi;
-using zelctl::gdi::test::TestBitmap;
+using namespace zelctl::gdi::test;
 
 namespace {
 
@@ -35,15 +35,11 @@ TEST(AlphaBlend, edgeValuesCopyOrLeaveAlone)
 {
     TestBitmap src(4, 1, 32);
     TestBitmap dst(4, 1, 32);
-    src.setArgb(0, 0, 0xFF112233); // opaque
-    src.setArgb(1, 0, 0x00000000); // transparent
-    src.setArgb(2, 0, 0xFF445566);
-    src.setArgb(3, 0, 0x00000000);
+    setRow(src, 0, { 0xFF112233, 0x00000000, 0xFF445566, 0x00000000 }); // opaque, transparent
     dst.fill(0xFF808080, 4, 32);
 
     ASSERT_TRUE(AlphaBlend(dst.dc, 0, 0, 2, 1, src.dc, 0, 0, 2, 1, blend(255, true)));
-    EXPECT_EQ(dst.argb(0, 0), 0xFF112233u);
-    EXPECT_EQ(dst.argb(1, 0), 0xFF808080u);
+    EXPECT_EQ(rowOf(dst, 0, 2), (Values { 0xFF112233, 0xFF808080 }));
 
     ASSERT_TRUE(AlphaBlend(dst.dc, 2, 0, 2, 1, src.dc, 2, 0, 2, 1, blend(0, true)));
     EXPECT_EQ(dst.argb(2, 0), 0xFF808080u) << "constant alpha 0 draws nothing";
@@ -134,20 +130,16 @@ TEST(AlphaBlend, blendsIntoOtherDepthsAndFromOpaqueSources)
 TEST(AlphaBlend, stretchesByNearestPixelAndClipsTheTarget)
 {
     TestBitmap src(2, 1, 32);
-    src.setArgb(0, 0, 0xFF0000FF);
-    src.setArgb(1, 0, 0xFF00FF00);
+    setRow(src, 0, { 0xFF0000FF, 0xFF00FF00 });
     TestBitmap dst(4, 2, 32);
     SetStretchBltMode(dst.dc, HALFTONE); // ignored: blending always takes the nearest pixel
     ASSERT_TRUE(AlphaBlend(dst.dc, 0, 0, 4, 2, src.dc, 0, 0, 2, 1, blend(255, true)));
-    EXPECT_EQ(dst.argb(0, 1), 0xFF0000FFu);
-    EXPECT_EQ(dst.argb(1, 1), 0xFF0000FFu);
-    EXPECT_EQ(dst.argb(2, 0), 0xFF00FF00u);
-    EXPECT_EQ(dst.argb(3, 1), 0xFF00FF00u);
+    for (int y : { 0, 1 })
+        EXPECT_EQ(rowOf(dst, y, 4), (Values { 0xFF0000FF, 0xFF0000FF, 0xFF00FF00, 0xFF00FF00 })) << y;
 
     dst.fill(0, 4, 32);
     ASSERT_TRUE(AlphaBlend(dst.dc, 3, -1, 2, 2, src.dc, 0, 0, 2, 1, blend(255, true)));
-    EXPECT_EQ(dst.argb(3, 0), 0xFF0000FFu);
-    EXPECT_EQ(dst.argb(2, 0), 0u);
+    EXPECT_EQ(rowOf(dst, 0, 4), (Values { 0, 0, 0, 0xFF0000FF }));
     EXPECT_EQ(dst.argb(3, 1), 0u);
 }
 

@@ -30,6 +30,7 @@ public:
         stride = description.bmWidthBytes;
         this->height = height;
         this->topDown = topDown;
+        this->bpp = bpp;
     }
     ~TestBitmap()
     {
@@ -72,6 +73,25 @@ public:
     int stride = 0;
     int height = 0;
     bool topDown = true;
+    int bpp = 0;
 };
+
+using Values = std::vector<quint32>;
+
+// The first `width` pixels of a row of a 24- or 32-bit bitmap, left to right.
+inline Values rowOf(const TestBitmap &b, int y, int width)
+{
+    Values values;
+    for (int x = 0; x < width; ++x)
+        values.push_back(b.bpp == 32 ? b.argb(x, y) : b.rgb(x, y));
+    return values;
+}
+
+inline void setRow(TestBitmap &b, int y, std::initializer_list<quint32> values)
+{
+    int x = 0;
+    for (quint32 v : values)
+        b.bpp == 32 ? b.setArgb(x++, y, v) : b.setRgb(x++, y, v);
+}
 
 } // namespace zelctl::gdi::test

@@ -7,7 +7,7 @@
 #include <gtest/gtest.h>
 
 using namespace zelctl::gdi;
-using zelctl::gdi::test::TestBitmap;
+using namespace zelctl::gdi::test;
 
 TEST(Pictures, becomeBitmapsAndBack)
 {
@@ -55,10 +55,7 @@ TEST(Pictures, drawStretchedLeavingTransparentPixelsAlone)
         b.fill(0x00F0F0, 4, 24);
         ASSERT_TRUE(drawPicture(b.dc, sprite, 0, 0, 4, 1, rop));
         const quint32 inked = rop == SRCCOPY ? 0x808080 : rop == SRCAND ? 0x008080 : 0x80F0F0;
-        EXPECT_EQ(b.rgb(0, 0), inked) << rop;
-        EXPECT_EQ(b.rgb(1, 0), inked) << rop;
-        EXPECT_EQ(b.rgb(2, 0), 0x00F0F0u) << rop;
-        EXPECT_EQ(b.rgb(3, 0), 0x00F0F0u) << rop;
+        EXPECT_EQ(rowOf(b, 0, 4), (Values { inked, inked, 0x00F0F0, 0x00F0F0 })) << rop;
     }
     EXPECT_FALSE(drawPicture(b.dc, sprite, 0, 0, 4, 1, 0x00660046));
     EXPECT_FALSE(drawPicture(b.dc, QImage(), 0, 0, 4, 1));
