@@ -6,8 +6,8 @@
 #include <gtest/gtest.h>
 
 using namespace zelctl;
-using zelctl::test::decodeWithGiflib;
 using zelctl::test::Decoded;
+using zelctl::test::decodeWithGiflib;
 
 namespace {
 
