@@ -8,13 +8,9 @@
 
 using namespace zelctl;
 
-TEST(GifAnimator, minimumFrameDelayIsClampedAndApplied)
+TEST(GifAnimator, minimumFrameDelayIsApplied)
 {
     GifAnimator clock;
-    clock.setMinFrameDelay(5);
-    EXPECT_EQ(clock.minFrameDelay(), 10);
-    clock.setMinFrameDelay(40000);
-    EXPECT_EQ(clock.minFrameDelay(), 32700);
     clock.setMinFrameDelay(50);
 
     clock.setDelays({ 0, 100, 30 });

@@ -5,6 +5,10 @@
 #include <QByteArray>
 #include <QList>
 
+#include <gif_lib.h>
+
+#include <cstring>
+
 namespace zelctl::test {
 
 // Writes GIFs block by block, so each test file reads as the bytes it holds.
@@ -90,5 +94,58 @@ private:
 
     QByteArray m_bytes;
 };
+
+// Decodes a GIF with giflib, which has nothing in common with our encoder.
+struct Decoded
+{
+    int width = 0;
+    int height = 0;
+    QList<QByteArray> frames;
+    QList<GraphicsControlBlock> controls;
+    QList<GifImageDesc> descriptors;
+    QList<QList<quint32>> tables; // the table each frame uses
+};
+
+inline Decoded decodeWithGiflib(const QByteArray &gif)
+{
+    struct Source
+    {
+        const QByteArray *bytes;
+        qsizetype pos = 0;
+    } source { &gif };
+    auto read = [](GifFileType *file, GifByteType *out, int n) {
+        auto *s = static_cast<Source *>(file->UserData);
+        const int count = int(std::min<qsizetype>(n, s->bytes->size() - s->pos));
+        std::memcpy(out, s->bytes->constData() + s->pos, size_t(count));
+        s->pos += count;
+        return count;
+    };
+    int error = 0;
+    GifFileType *file = DGifOpen(&source, read, &error);
+    Decoded result;
+    if (!file)
+        return result;
+    if (DGifSlurp(file) == GIF_OK) {
+        result.width = file->SWidth;
+        result.height = file->SHeight;
+        for (int i = 0; i < file->ImageCount; ++i) {
+            const SavedImage &image = file->SavedImages[i];
+            result.frames.append(QByteArray(
+                reinterpret_cast<const char *>(image.RasterBits), image.ImageDesc.Width * image.ImageDesc.Height));
+            GraphicsControlBlock gcb {};
+            DGifSavedExtensionToGCB(file, i, &gcb);
+            result.controls.append(gcb);
+            result.descriptors.append(image.ImageDesc);
+            const ColorMapObject *map = image.ImageDesc.ColorMap ? image.ImageDesc.ColorMap : file->SColorMap;
+            QList<quint32> table;
+            for (int k = 0; map && k < map->ColorCount; ++k)
+                table.append(
+                    quint32(map->Colors[k].Red) << 16 | quint32(map->Colors[k].Green) << 8 | map->Colors[k].Blue);
+            result.tables.append(table);
+        }
+    }
+    DGifCloseFile(file, &error);
+    return result;
+}
 
 } // namespace zelctl::test

@@ -5,15 +5,12 @@
 #include "gif/ucAniGIF.h"
 #include "platform/Twips.h"
 
+#include <QHash>
 #include <QSignalSpy>
 #include <QTemporaryDir>
 #include <QTest>
 
-#include <gif_lib.h>
-
 #include <gtest/gtest.h>
-
-#include <cstring>
 
 using namespace zelctl;
 using zelctl::test::GifBuilder;
@@ -63,30 +60,15 @@ QByteArray layeredGif()
 
 QStringList shownPixels(const QImage &image)
 {
+    static const QHash<quint32, QChar> letters
+        = { { Red, 'R' }, { Green, 'G' }, { Blue, 'B' }, { Yellow, '.' }, { 0x222222, 'd' } };
     QStringList rows;
     for (int y = 0; y < image.height(); ++y) {
         QString row;
         for (int x = 0; x < image.width(); ++x) {
-            switch (image.pixel(x, y) & 0xFFFFFF) {
-            case Red:
-                row += 'R';
-                break;
-            case Green:
-                row += 'G';
-                break;
-            case Blue:
-                row += 'B';
-                break;
-            case Yellow:
-                row += '.';
-                break;
-            case 0x222222:
-                row += 'd';
-                break;
-            default:
-                row += QStringLiteral("<%1>").arg(image.pixel(x, y), 8, 16, QLatin1Char('0'));
-                break;
-            }
+            const QRgb pixel = image.pixel(x, y);
+            const QChar letter = letters.value(pixel & 0xFFFFFF);
+            row += letter.isNull() ? QStringLiteral("<%1>").arg(pixel, 8, 16, QLatin1Char('0')) : QString(letter);
         }
         rows << row;
     }
@@ -324,37 +306,9 @@ TEST_F(AniGif, animatedGifPictureHoldsTheSameIndices)
     EXPECT_EQ(picture.width(), 6);
     const QByteArray written = QByteArray::fromBase64(picture.image().text("GIF").toLatin1());
 
-    auto slurp = [](const QByteArray &bytes) {
-        struct Source
-        {
-            const QByteArray *bytes;
-            qsizetype pos;
-        } in { &bytes, 0 };
-        int error = 0;
-        GifFileType *file = DGifOpen(
-            &in,
-            [](GifFileType *f, GifByteType *out, int n) {
-                auto *s = static_cast<Source *>(f->UserData);
-                const int count = int(std::min<qsizetype>(n, s->bytes->size() - s->pos));
-                std::memcpy(out, s->bytes->constData() + s->pos, size_t(count));
-                s->pos += count;
-                return count;
-            },
-            &error);
-        QList<QByteArray> frames;
-        if (file && DGifSlurp(file) == GIF_OK) {
-            for (int i = 0; i < file->ImageCount; ++i) {
-                const GifImageDesc &desc = file->SavedImages[i].ImageDesc;
-                frames.append(QByteArray(
-                    reinterpret_cast<const char *>(file->SavedImages[i].RasterBits), desc.Width * desc.Height));
-            }
-        }
-        DGifCloseFile(file, &error);
-        return frames;
-    };
-    const QList<QByteArray> expected = slurp(source);
+    const QList<QByteArray> expected = test::decodeWithGiflib(source).frames;
     ASSERT_EQ(expected.size(), 4);
-    EXPECT_EQ(slurp(written), expected) << "written as the file had it, not mirrored";
+    EXPECT_EQ(test::decodeWithGiflib(written).frames, expected) << "written as the file had it, not mirrored";
 
     // At design time the picture loads back with all its frames; while running it is ignored.
     ucAniGIF other;

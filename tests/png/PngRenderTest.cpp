@@ -46,6 +46,18 @@ quint32 argbAt(const StdPNG &image, int x, int y)
     return quint32(p[3]) << 24 | quint32(p[2]) << 16 | quint32(p[1]) << 8 | p[0];
 }
 
+// Answers the progressive-display event with a target, its window (if any) and a position.
+void drawProgressivelyInto(StdPNG &image, const TestBitmap *target, QWidget *window = nullptr, QPoint at = {})
+{
+    QObject::connect(&image, &StdPNG::ProgessiveDisplay,
+        [=](qint32, qint32, qint32 &dc, qint32 &hwnd, qint32, bool, qint32 &x, qint32 &y, bool, bool) {
+            dc = target ? target->dc : 0;
+            hwnd = window ? platform::handleOf(window) : 0;
+            x = at.x();
+            y = at.y();
+        });
+}
+
 // Records the rectangles the window is repainted in.
 class RecordingWindow : public QWidget
 {
@@ -274,28 +286,15 @@ TEST(PngEvents, hideThePropertiesOfAnOpaqueImageWhileItDecodes)
     EXPECT_EQ(image.Width(), 5);
 }
 
-TEST(PngEvents, drawNothingForAHandlerThatGivesNoTarget)
+TEST(PngEvents, paintOnceAtTheEndForATargetWithoutWindowAndNothingWithoutATarget)
 {
-    StdPNG image;
-    TestBitmap target(12, 12, 32);
-    QObject::connect(&image, &StdPNG::ProgessiveDisplay,
-        [&](qint32, qint32, qint32 &, qint32 &, qint32, bool, qint32 &x, qint32 &, bool, bool) { x = 1; });
-    ASSERT_TRUE(image.LoadData(rgbFile(12, 12)));
-    EXPECT_EQ(target.argb(11, 11), 0u);
-}
-
-TEST(PngEvents, paintOnceAtTheEndForATargetWithoutWindow)
-{
-    StdPNG image;
-    TestBitmap target(20, 20, 32);
-    QObject::connect(&image, &StdPNG::ProgessiveDisplay,
-        [&](qint32, qint32, qint32 &dc, qint32 &, qint32, bool, qint32 &x, qint32 &y, bool, bool) {
-            dc = target.dc;
-            x = 2;
-            y = 3;
-        });
-    ASSERT_TRUE(image.LoadData(rgbFile(12, 12)));
-    EXPECT_EQ(target.argb(2 + 11, 3 + 11) & 0xFFFFFF, 0x6E6E07u);
+    for (const bool withTarget : { true, false }) {
+        StdPNG image;
+        TestBitmap target(20, 20, 32);
+        drawProgressivelyInto(image, withTarget ? &target : nullptr, nullptr, QPoint(2, 3));
+        ASSERT_TRUE(image.LoadData(rgbFile(12, 12)));
+        EXPECT_EQ(target.argb(2 + 11, 3 + 11) & 0xFFFFFF, withTarget ? 0x6E6E07u : 0u);
+    }
 }
 
 TEST(PngEvents, scanTheImageInBlocksOfSixteenRows)
@@ -303,13 +302,7 @@ TEST(PngEvents, scanTheImageInBlocksOfSixteenRows)
     StdPNG image;
     RecordingWindow window;
     TestBitmap target(60, 60, 32);
-    QObject::connect(&image, &StdPNG::ProgessiveDisplay,
-        [&](qint32, qint32, qint32 &dc, qint32 &hwnd, qint32, bool, qint32 &x, qint32 &y, bool, bool) {
-            dc = target.dc;
-            hwnd = platform::handleOf(&window);
-            x = 1;
-            y = 2;
-        });
+    drawProgressivelyInto(image, &target, &window, QPoint(1, 2));
     // When row 32 is restored, rows 16-31 are converted next; rows 0-15 are already shown.
     QObject::connect(&image, &StdPNG::Progress, [&](qint32 percentage) {
         if (percentage == 32 * 100 / 40) {
@@ -334,13 +327,7 @@ TEST(PngEvents, showInterlacedPassesPixelatedOrFadingToTheSameImage)
         image.setProgressiveDisplay(mode);
         RecordingWindow window;
         TestBitmap target(19, 13, 32);
-        QObject::connect(&image, &StdPNG::ProgessiveDisplay,
-            [&](qint32, qint32, qint32 &dc, qint32 &hwnd, qint32, bool, qint32 &, qint32 &, bool, bool) {
-                dc = target.dc;
-                hwnd = platform::handleOf(&window);
-            });
-        int passes = 0;
-        QObject::connect(&image, &StdPNG::Progress, [&](qint32) { ++passes; });
+        drawProgressivelyInto(image, &target, &window);
         window.painted.clear();
         ASSERT_TRUE(image.LoadData(file, true, true));
         EXPECT_EQ(window.painted.size(), 7) << int(mode);

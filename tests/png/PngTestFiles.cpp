@@ -36,20 +36,6 @@ void readFromBuffer(png_structp png, png_bytep data, png_size_t length)
     cursor->position += qsizetype(length);
 }
 
-int channels(int colorType)
-{
-    switch (colorType) {
-    case PNG_COLOR_TYPE_RGB:
-        return 3;
-    case PNG_COLOR_TYPE_GRAY_ALPHA:
-        return 2;
-    case PNG_COLOR_TYPE_RGB_ALPHA:
-        return 4;
-    default:
-        return 1;
-    }
-}
-
 } // namespace
 
 QByteArray writeWithLibpng(const ImageRecipe &recipe)
@@ -75,7 +61,7 @@ QByteArray writeWithLibpng(const ImageRecipe &recipe)
     if (entries)
         png_set_PLTE(png, info, palette.data(), entries);
 
-    const int samples = channels(recipe.colorType);
+    const int samples = recipe.channels();
     std::vector<std::vector<int>> pixels(size_t(recipe.height), std::vector<int>(size_t(recipe.width * samples)));
     for (auto &row : pixels) {
         for (int &sample : row)
