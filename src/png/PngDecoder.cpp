@@ -2,6 +2,7 @@
 
 #include "PngFilters.h"
 #include "PngImageStream.h"
+#include "platform/gdi/Surface.h"
 
 #include <algorithm>
 #include <cstring>
@@ -11,6 +12,10 @@
 namespace zelctl::png {
 
 namespace {
+
+// Pixels of the bitmap rows are read and written as the raster layer does.
+using gdi::detail::readPixel;
+using gdi::detail::writePixel;
 
 // floor(v / 255) for v up to 255 × 255, without a division.
 constexpr unsigned divide255(unsigned v)
@@ -41,52 +46,6 @@ inline unsigned sampleAt(const uint8_t *row, int64_t i, int depth)
         return (row[i >> 2] >> (6 - 2 * (i & 3))) & 0x3u;
     default:
         return (row[i >> 3] >> (7 - (i & 7))) & 0x1u;
-    }
-}
-
-inline unsigned readPixel(const uint8_t *row, int64_t x, int bitCount)
-{
-    switch (bitCount) {
-    case 1:
-        return (row[x >> 3] >> (7 - (x & 7))) & 1u;
-    case 4:
-        return (row[x >> 1] >> ((x & 1) ? 0 : 4)) & 0xFu;
-    case 8:
-        return row[x];
-    case 24:
-        return row[3 * x] | row[3 * x + 1] << 8 | row[3 * x + 2] << 16;
-    default: {
-        uint32_t value;
-        std::memcpy(&value, row + 4 * x, 4);
-        return value;
-    }
-    }
-}
-
-inline void writePixel(uint8_t *row, int64_t x, int bitCount, unsigned value)
-{
-    switch (bitCount) {
-    case 1: {
-        const uint8_t bit = uint8_t(0x80u >> (x & 7));
-        row[x >> 3] = (value & 1u) ? uint8_t(row[x >> 3] | bit) : uint8_t(row[x >> 3] & ~bit);
-        break;
-    }
-    case 4: {
-        uint8_t &byte = row[x >> 1];
-        byte = (x & 1) ? uint8_t((byte & 0xF0) | (value & 0xF)) : uint8_t((byte & 0x0F) | ((value & 0xF) << 4));
-        break;
-    }
-    case 8:
-        row[x] = uint8_t(value);
-        break;
-    case 24:
-        row[3 * x] = uint8_t(value);
-        row[3 * x + 1] = uint8_t(value >> 8);
-        row[3 * x + 2] = uint8_t(value >> 16);
-        break;
-    default:
-        std::memcpy(row + 4 * x, &value, 4);
-        break;
     }
 }
 
