@@ -12,6 +12,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdio>
 #include <cstdlib>
 
 int main(int argc, char **argv)
@@ -25,6 +26,12 @@ int main(int argc, char **argv)
     if (qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM"))
         qputenv("QT_QPA_PLATFORM", "offscreen");
 
+    // The x11 programs need a real server for grabs and focus; without one Qt would abort
+    // with a message that does not say how to get one.
+    if (qgetenv("QT_QPA_PLATFORM") == "xcb" && qEnvironmentVariableIsEmpty("DISPLAY")) {
+        std::fprintf(stderr, "this test program needs an X server: run it through scripts/test, which starts Xvfb\n");
+        return 1;
+    }
     QApplication app(argc, argv);
     zelctl::platform::SaveSetting("zEL", "Setup", "RootPath", ZELCTL_SOURCE_DIR "/");
     zelctl::platform::setMessageBoxPresenter([](const zelctl::platform::MessageBoxRequest &request) {
