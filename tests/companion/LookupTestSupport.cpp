@@ -13,7 +13,7 @@ void LookupFixture::SetUp()
     ASSERT_EQ(service.baseAddress().host(), "127.0.0.1");
     saveSetting("allowremotenif", "1");
     saveSetting("nifserviceurl", service.baseAddress().toString());
-    saveSetting("nifservicetimeout", "0.5");
+    saveSetting("nifservicetimeout", TimeoutSeconds);
     ASSERT_EQ(companion::LookupSettings::fromUserSettings().serviceAddress.host(), "127.0.0.1");
 }
 
@@ -33,7 +33,7 @@ companion::LookupSettings LookupFixture::settings() const
     companion::LookupSettings settings;
     settings.remoteAllowed = true;
     settings.serviceAddress = service.baseAddress();
-    settings.timeout = std::chrono::milliseconds(500);
+    settings.timeout = std::chrono::milliseconds(qRound(TimeoutSeconds.toDouble() * 1000));
     settings.cacheFile = folder.filePath("nifcache.sqlite");
     settings.directoryFile = sourcePath("data/contribuintes.json");
     return settings;

@@ -14,6 +14,9 @@ namespace zelctl::test {
 // Valid Portuguese numbers; the directory file knows the first.
 inline const QString DirectoryHolder = QStringLiteral("PT210345675");
 inline const QString UnknownHolder = QStringLiteral("PT123456789");
+// Long enough for an answer of the local server on a loaded machine.
+inline const QString TimeoutSeconds = QStringLiteral("1.5");
+inline const QString TimedOut = QStringLiteral("O serviço não respondeu em 1.5 s");
 
 // Points the user's lookup settings at a fake service on 127.0.0.1, with remote lookups
 // allowed and a short timeout, and takes them back afterwards.

@@ -50,7 +50,7 @@ TEST_F(NifCacheLookup, aStoredAnswerIsGivenWhileFreshAndStandsInWhenTheNetworkFa
         { "stale, the member state down", 31, FakeVatService::userError("MS_UNAVAILABLE"), true, false, "NOME ANTIGO",
             stale + "Serviço do Estado-membro indisponível (MS_UNAVAILABLE)", 1 },
         { "stale, no answer", 31, { 200, {}, FakeVatService::Manner::Silent }, true, false, "NOME ANTIGO",
-            stale + "O serviço não respondeu em 0.5 s", 1 },
+            stale + TimedOut, 1 },
         { "stale, remote lookups off", 31, newHolder, false, false, "NOME ANTIGO",
             stale + "consultas remotas desligadas", 0 },
     };
