@@ -1,10 +1,11 @@
 #include "Sections.h"
 
 #include "common/modFuncs.h"
-#include "companion/DirectoryNIFGrabber.h"
 #include "companion/JsonDeclaration.h"
+#include "companion/LookupSettings.h"
 #include "nif/cNIF.h"
 
+#include <QCheckBox>
 #include <QHBoxLayout>
 #include <QLabel>
 #include <QVBoxLayout>
@@ -13,23 +14,23 @@ using namespace zelctl;
 
 namespace {
 
-// The directory answers after a short wait, as a remote service would, so the blue
-// "fetching" mark can be seen.
-constexpr int FetchLatencyMs = 700;
+// Where the holder's data came from, and how the lookup went.
+QString origin(cNIF &nif)
+{
+    QString source = nif.Information(QStringLiteral("SOURCE"));
+    if (source.isEmpty())
+        source = nif.Nome().isEmpty() ? QStringLiteral("nenhuma") : QStringLiteral("declaração");
+    const QString status = nif.Information(QStringLiteral("status"));
+    return QStringLiteral("Origem: %1%2").arg(source, status.isEmpty() ? QString() : QStringLiteral(" — ") + status);
+}
 
 } // namespace
 
-// A NIF box on the bundled declaration and directory of holders: a valid number shows its
-// holder's name in the tip and below the box.
+// A NIF box on the bundled declaration, directory of holders and cache of earlier lookups,
+// with the switch that lets numbers go to the EU's VAT service: a valid number shows its
+// holder's name in the tip and below the box, and where it came from.
 QWidget *createNifSection()
 {
-    companion::setNIFGrabberFactory([](QObject *parent) {
-        auto *grabber
-            = new companion::DirectoryNIFGrabber(companion::DirectoryNIFGrabber::defaultDirectoryFile(), parent);
-        grabber->setLatency(FetchLatencyMs);
-        return grabber;
-    });
-
     auto *section = new QWidget;
     auto *column = new QVBoxLayout(section);
     auto *declaration = new companion::JsonDeclaration(section);
@@ -49,17 +50,31 @@ QWidget *createNifSection()
     auto *events = new QLabel;
     events->setWordWrap(true);
     column->addWidget(events);
+    auto *source = new QLabel;
+    source->setObjectName(QStringLiteral("origin"));
+    source->setWordWrap(true);
+    column->addWidget(source);
+    auto *remote = new QCheckBox(QStringLiteral("Consultar o serviço de IVA da Comissão Europeia (o número é enviado "
+                                                "pela Internet)"));
+    remote->setObjectName(QStringLiteral("allowremotenif"));
+    remote->setChecked(companion::remoteLookupsAllowed());
+    QObject::connect(remote, &QCheckBox::toggled, remote, [](bool on) { companion::setRemoteLookupsAllowed(on); });
+    column->addWidget(remote);
     auto *hint = new QLabel(QStringLiteral("Experimente 251739465 (diretório de contribuintes), 263958477 "
-                                           "(guardado na declaração) ou ES12345678Z; a bandeira abre a "
-                                           "lista de países e o botão direito o menu, com a ficha de "
-                                           "contribuinte."));
+                                           "(guardado na declaração) ou ES12345678Z; com a consulta ao serviço "
+                                           "ligada, um número que não se conheça aqui é perguntado à Comissão "
+                                           "Europeia, e cada resposta fica guardada neste computador. A "
+                                           "bandeira abre a lista de países e o botão direito o menu, com a "
+                                           "ficha de contribuinte."));
     hint->setWordWrap(true);
     column->addWidget(hint);
 
     QObject::connect(nif, &cNIF::NameUpdated, holder, [holder](const QString &name) { holder->setText(name); });
     QObject::connect(nif, &cNIF::Cleared, holder, [holder] { holder->setText(QStringLiteral("(sem titular)")); });
-    QObject::connect(nif, &cNIF::DataFinished, events,
-        [nif, events] { events->setText(QStringLiteral("Pesquisa terminada: %1").arg(nif->Description())); });
+    QObject::connect(nif, &cNIF::DataFinished, events, [nif, events, source] {
+        events->setText(QStringLiteral("Pesquisa terminada: %1").arg(nif->Description()));
+        source->setText(origin(*nif));
+    });
     QObject::connect(nif, &cNIF::Changed, events, [nif, events] {
         events->setText(nif->IsEmpty() ? QString()
                                        : QStringLiteral("%1 — %2").arg(nif->Value(),

@@ -15,6 +15,7 @@ struct Command
 int runGifInfo(const QStringList &args, QTextStream &out, QTextStream &err);
 int runClasses(const QStringList &args, QTextStream &out, QTextStream &err);
 int runNib(const QStringList &args, QTextStream &out, QTextStream &err);
+int runLookup(const QStringList &args, QTextStream &out, QTextStream &err);
 int runNif(const QStringList &args, QTextStream &out, QTextStream &err);
 int runPngInfo(const QStringList &args, QTextStream &out, QTextStream &err);
 int runPngDecode(const QStringList &args, QTextStream &out, QTextStream &err);

@@ -12,6 +12,7 @@ const std::array commands = {
     Command { "classes", "zelctl classes", runClasses },
     Command { "nib", "zelctl nib NUMBER", runNib },
     Command { "nif", "zelctl nif CC NUMBER | zelctl nif --batch", runNif },
+    Command { "lookup", "zelctl lookup NUMBER [--offline] [--refresh]", runLookup },
     Command { "gif-info", "zelctl gif-info [--hash] FILE", runGifInfo },
     Command { "png-info", "zelctl png-info FILE", runPngInfo },
     Command {

@@ -1,6 +1,6 @@
 #include "NIFGrabber.h"
 
-#include "DirectoryNIFGrabber.h"
+#include "ChainedNIFGrabber.h"
 
 namespace zelctl::companion {
 
@@ -8,7 +8,7 @@ namespace {
 
 NIFGrabber *createDefault(QObject *parent)
 {
-    return new DirectoryNIFGrabber(DirectoryNIFGrabber::defaultDirectoryFile(), parent);
+    return new ChainedNIFGrabber(parent);
 }
 
 NIFGrabberFactory &factory()

@@ -37,8 +37,8 @@ Q_SIGNALS:
     void Finished();
 };
 
-// Makes the fetcher of a new NIF control. The default reads the directory file of known
-// holders in the data folder; a host may install its own.
+// Makes the fetcher of a new NIF control. The default is a ChainedNIFGrabber on the user's
+// lookup settings; a host may install its own.
 using NIFGrabberFactory = std::function<NIFGrabber *(QObject *parent)>;
 
 ZELCTL_EXPORT NIFGrabber *createNIFGrabber(QObject *parent);

@@ -1,0 +1,40 @@
+#pragma once
+
+#include "FakeVatService.h"
+
+#include "companion/ChainedNIFGrabber.h"
+
+#include <QStringList>
+#include <QTemporaryDir>
+
+#include <gtest/gtest.h>
+
+namespace zelctl::test {
+
+// Valid Portuguese numbers; the directory file knows the first.
+inline const QString DirectoryHolder = QStringLiteral("PT210345675");
+inline const QString UnknownHolder = QStringLiteral("PT123456789");
+// Long enough for an answer of the local server on a loaded machine.
+inline const QString TimeoutSeconds = QStringLiteral("1.5");
+inline const QString TimedOut = QStringLiteral("O serviço não respondeu em 1.5 s");
+
+// Points the user's lookup settings at a fake service on 127.0.0.1, with remote lookups
+// allowed and a short timeout, and takes them back afterwards.
+class LookupFixture : public ::testing::Test
+{
+protected:
+    void SetUp() override;
+    void TearDown() override;
+    void saveSetting(const char *key, const QString &value);
+
+    // Settings for a fetcher the test makes: the fake service and a cache file of its own.
+    companion::LookupSettings settings() const;
+    // Runs one fetch to its end and gives its events: "Starting", "ReceivedInformation:<id>",
+    // "Finished".
+    QStringList fetch(companion::ChainedNIFGrabber &grabber, const QString &number);
+
+    FakeVatService service;
+    QTemporaryDir folder;
+};
+
+} // namespace zelctl::test

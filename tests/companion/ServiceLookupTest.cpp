@@ -1,0 +1,195 @@
+// The NIF control looking numbers up from the VAT information service, played by a local
+// server: what the user sees for each answer and each way the network can fail.
+
+#include "LookupTestSupport.h"
+
+#include "companion/VatServiceClient.h"
+#include "nif/cNIF.h"
+#include "tips/clsBalloonTip.h"
+
+#include <QJsonDocument>
+#include <QJsonObject>
+#include <QLineEdit>
+#include <QPointer>
+#include <QTest>
+
+using namespace zelctl;
+using namespace zelctl::companion;
+using namespace zelctl::test;
+
+namespace {
+
+using Reply = FakeVatService::Reply;
+using Manner = FakeVatService::Manner;
+
+constexpr quint32 WhiteMark = 0xFFFFFF;
+constexpr quint32 NamedMark = 0x00FF00;
+
+// A NIF control on a form, as a host places it, with its lookup events recorded.
+struct NifForm
+{
+    NifForm()
+    {
+        control->InitNew();
+        QObject::connect(control, &cNIF::UpdatedInformation, [this](const QString &id) { events << "Updated:" + id; });
+        QObject::connect(control, &cNIF::NameUpdated, [this](const QString &name) { events << "Name:" + name; });
+        QObject::connect(control, &cNIF::DataFinished, [this] { events << "DataFinished"; });
+    }
+
+    // Types a number's digits; the last one makes it valid and starts the lookup.
+    void typeAndWait(const QString &digits)
+    {
+        auto *box = control->findChild<QLineEdit *>("nif");
+        QTest::keyClicks(box, digits.chopped(1));
+        events.clear();
+        QTest::keyClick(box, digits.back().toLatin1());
+        QTRY_VERIFY_WITH_TIMEOUT(events.contains("DataFinished"), 10000);
+    }
+
+    quint32 statusMark() const { return control->findChild<QWidget *>("Shape1")->property("BorderColor").toUInt(); }
+    QString tip() const { return control->findChild<clsBalloonTip *>("tip")->TipText(); }
+
+    QWidget form;
+    cNIF *control = new cNIF(&form);
+    QStringList events;
+};
+
+// Runs a fetch whose listener deletes the fetcher, at once, from `signal`; whether Finished
+// was heard before it went.
+template <typename Signal> bool finishesWhenDeletedFrom(const LookupSettings &settings, Signal signal)
+{
+    auto *grabber = new ChainedNIFGrabber(settings);
+    const QPointer<ChainedNIFGrabber> alive(grabber);
+    bool finished = false;
+    QObject::connect(grabber, &NIFGrabber::Finished, [&finished] { finished = true; });
+    QObject::connect(grabber, signal, [grabber] { delete grabber; });
+    grabber->Fetch(UnknownHolder);
+    EXPECT_TRUE(QTest::qWaitFor([&] { return alive.isNull(); }, 5000));
+    return finished;
+}
+
+using ServiceLookup = LookupFixture;
+
+} // namespace
+
+TEST_F(ServiceLookup, showsTheHolderAndKeepsItThroughEveryFailureOfALaterLookup)
+{
+    saveSetting("nifsources", "service");
+    service.answerWith(FakeVatService::holder("MARIA DO CÉU ANTUNES", R"(RUA DO OURO 12\n1100-060 LISBOA)"));
+    NifForm nif;
+    nif.typeAndWait("123456789");
+
+    ASSERT_EQ(service.requests().size(), 1);
+    const FakeVatService::Request &request = service.requests().first();
+    EXPECT_EQ(request.method + ' ' + request.path, "POST /rest-api/check-vat-number");
+    EXPECT_EQ(QJsonDocument::fromJson(request.body).object(),
+        QJsonObject({ { "countryCode", "PT" }, { "vatNumber", "123456789" } }));
+    EXPECT_TRUE(nif.events.contains("Name:MARIA DO CÉU ANTUNES"));
+    EXPECT_EQ(nif.events.last(), "DataFinished");
+    EXPECT_EQ(nif.control->Information("status"), "Válido");
+    EXPECT_EQ(nif.control->Information("updated"), "2025-03-01") << "the day of the service's request";
+    EXPECT_EQ(nif.control->Information("SOURCE"), "Serviço de IVA da Comissão Europeia");
+    EXPECT_EQ(nif.control->Information("morada"), "RUA DO OURO 12");
+    const QString tip = "MARIA DO CÉU ANTUNES\r\n1100-060\r\nLISBOA\r\nNIF: 123456789\r\nPaís: Portugal";
+    EXPECT_EQ(nif.tip(), tip);
+
+    const QByteArray loop = service.baseAddress().toEncoded() + "/check-vat-number";
+    const struct
+    {
+        const char *answer;
+        Reply reply;
+        QString status;
+    } cases[] = {
+        { "an unregistered number", { 200, R"({"valid":false,"name":"---","address":"---"})" },
+            "Não registado no serviço de IVA" },
+        { "INVALID_INPUT", FakeVatService::userError("INVALID_INPUT"), "(INVALID_INPUT)" },
+        { "INVALID_INPUT as a rejected request",
+            { 400, R"({"actionSucceed":false,"errorWrappers":[{"error":"INVALID_INPUT"}]})" }, "(INVALID_INPUT)" },
+        { "SERVICE_UNAVAILABLE", FakeVatService::userError("SERVICE_UNAVAILABLE"), "(SERVICE_UNAVAILABLE)" },
+        { "MS_UNAVAILABLE", FakeVatService::userError("MS_UNAVAILABLE"), "(MS_UNAVAILABLE)" },
+        { "TIMEOUT", FakeVatService::userError("TIMEOUT"), "(TIMEOUT)" },
+        { "MS_MAX_CONCURRENT_REQ", FakeVatService::userError("MS_MAX_CONCURRENT_REQ"), "(MS_MAX_CONCURRENT_REQ)" },
+        { "GLOBAL_MAX_CONCURRENT_REQ", FakeVatService::userError("GLOBAL_MAX_CONCURRENT_REQ"),
+            "(GLOBAL_MAX_CONCURRENT_REQ)" },
+        { "an answer slower than the timeout", { 200, QByteArray(200, ' ') + "{}", Manner::Trickle }, TimedOut },
+        { "a connection that never answers", { 200, {}, Manner::Silent }, TimedOut },
+        { "a server error", { 500, "<html>Internal Server Error</html>" }, "O serviço respondeu com o erro HTTP 500" },
+        { "a redirect loop", { 302, {}, Manner::Whole, loop }, "redireccionou" },
+        { "a huge body", { 200, "{\"valid\":true,\"name\":\"" + QByteArray(200 * 1024, 'A') + "\"}" },
+            "Resposta do serviço demasiado grande" },
+        { "malformed JSON", { 200, R"({"valid":true,"name":"ANA)" }, "Resposta do serviço ilegível" },
+        { "JSON without a validity", { 200, R"({"name":"ANA"})" }, "Resposta do serviço ilegível" },
+    };
+    for (const auto &c : cases) {
+        SCOPED_TRACE(c.answer);
+        service.answerWith(c.reply);
+        nif.events.clear();
+        nif.control->GetNIFInformation();
+        ASSERT_TRUE(QTest::qWaitFor([&] { return nif.events.contains("DataFinished"); }, 10000));
+        EXPECT_EQ(nif.events, QStringList { "DataFinished" }) << "no information, no name";
+        EXPECT_TRUE(nif.control->Information("status").contains(c.status))
+            << nif.control->Information("status").toStdString();
+        EXPECT_EQ(nif.control->Nome(), "MARIA DO CÉU ANTUNES");
+        EXPECT_EQ(nif.control->Information("codigopostal"), "1100-060");
+        EXPECT_EQ(nif.statusMark(), NamedMark);
+        EXPECT_EQ(nif.tip(), tip);
+    }
+    EXPECT_EQ(service.abandoned(), 2) << "the slow and the silent connection were closed by the fetcher";
+}
+
+TEST_F(ServiceLookup, numbersStayOnTheMachineUnlessTheUserAllowsRemoteLookups)
+{
+    saveSetting("allowremotenif", "0");
+    NifForm nif;
+    nif.typeAndWait("123456789");
+    EXPECT_TRUE(service.requests().isEmpty());
+    EXPECT_EQ(nif.events, QStringList { "DataFinished" });
+    EXPECT_TRUE(nif.control->Information("status").contains("consultas remotas desligadas"));
+    EXPECT_EQ(nif.statusMark(), WhiteMark);
+
+    saveSetting("allowremotenif", "1");
+    for (const char *address : { "file:///etc/passwd", "http://192.0.2.1/plain-text" }) {
+        saveSetting("nifserviceurl", address);
+        ChainedNIFGrabber grabber;
+        fetch(grabber, UnknownHolder);
+        EXPECT_TRUE(grabber.GetField("STATUS").startsWith("Endereço do serviço inválido")) << address;
+    }
+}
+
+TEST_F(ServiceLookup, theFormMayGoWhileTheServiceIsAskedOrFromTheLookupsEvents)
+{
+    saveSetting("nifsources", "service");
+    service.answerWith({ 200, {}, Manner::Silent });
+    {
+        NifForm nif;
+        QTest::keyClicks(nif.control->findChild<QLineEdit *>("nif"), "123456789");
+        QTRY_COMPARE(service.requests().size(), 1);
+    }
+    // The request went with the control.
+    QTRY_COMPARE(service.abandoned(), 1);
+
+    service.answerWith(FakeVatService::holder("ANA", "1000-001 LISBOA"));
+    auto *form = new NifForm;
+    QObject::connect(form->control, &cNIF::DataFinished, [form] { delete form; });
+    QPointer<cNIF> control(form->control);
+    QTest::keyClicks(control->findChild<QLineEdit *>("nif"), "123456789");
+    QTRY_VERIFY(control.isNull());
+
+    EXPECT_FALSE(finishesWhenDeletedFrom(settings(), &NIFGrabber::Starting));
+    EXPECT_FALSE(finishesWhenDeletedFrom(settings(), &NIFGrabber::ReceivedInformation));
+    EXPECT_TRUE(finishesWhenDeletedFrom(settings(), &NIFGrabber::Finished));
+}
+
+TEST(PostalAddress, splitsThePostcodeAndLocalityFromTheStreet)
+{
+    const char *const cases[][3] = {
+        { "PT", "AV. DA LIBERDADE 1 1250-096 LISBOA", "AV. DA LIBERDADE 1|1250-096|LISBOA" },
+        { "DE", "Musterstr. 1\n10115 Berlin", "Musterstr. 1|10115|Berlin" },
+        { "NL", "Damrak 1\n1012 LG AMSTERDAM", "Damrak 1|1012 LG|AMSTERDAM" },
+        { "IE", "Main Street 3\nDUBLIN 2", "Main Street 3, DUBLIN 2||" },
+    };
+    for (const auto &c : cases) {
+        const PostalAddress postal = splitPostalAddress(c[1], c[0]);
+        EXPECT_EQ(QStringList({ postal.street, postal.postcode, postal.locality }).join('|'), c[2]) << c[1];
+    }
+}
