@@ -913,7 +913,12 @@ QObject *cNIF::IRSClass() const
 
 void cNIF::setIRSClass(QObject *declaration)
 {
-    d->declaration = qobject_cast<companion::Declaration *>(declaration);
+    auto *given = qobject_cast<companion::Declaration *>(declaration);
+    if (given == d->declaration)
+        return;
+    // What the user confirmed belongs to the declaration it was confirmed in.
+    d->declaration = given;
+    d->records.clear();
 }
 
 bool cNIF::DisablePopupMenu() const

@@ -51,6 +51,7 @@ class ZELCTL_EXPORT cNIF : public UserControl
     Q_PROPERTY(QString Nome READ Nome WRITE setNome)
     // The host's declaration (a companion::Declaration), where the holder's record is kept
     // under the number. Borrowed: the control never deletes it and forgets it when it goes.
+    // Another declaration starts the control's own records afresh.
     Q_PROPERTY(QObject *IRSClass READ IRSClass WRITE setIRSClass)
     // Whether the context menu is kept from showing.
     Q_PROPERTY(bool DisablePopupMenu READ DisablePopupMenu WRITE setDisablePopupMenu)

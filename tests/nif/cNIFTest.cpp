@@ -310,6 +310,9 @@ TEST_F(NifControl, recordIsKeptPerNumber)
         control->setValue("PT" + PlainNif);
         EXPECT_EQ(control->Information("telefone"), "210000000") << where << ": kept through the lookups";
         EXPECT_EQ(control->Nome(), "ANA") << where;
+        companion::JsonDeclaration another;
+        control->setIRSClass(&another);
+        EXPECT_EQ(control->Information("telefone"), "") << where << ": another declaration, another record";
     }
 }
 
