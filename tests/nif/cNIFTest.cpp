@@ -463,12 +463,12 @@ TEST(NifDirectoryFetch, answersArriveWithoutBlocking)
     EventLog log(*control);
     control->setValue("PT" + AnaNif);
     EXPECT_EQ(control->Nome(), "") << "Fetch returned at once";
-    QTRY_COMPARE(log.count("DataFinished"), 1);
+    ASSERT_TRUE(QTest::qWaitFor([&log] { return log.count("DataFinished") == 1; }));
     EXPECT_EQ(control->Nome(), "ANA MARIA FERREIRA LOPES");
     EXPECT_EQ(tipText(*control), "ANA MARIA FERREIRA LOPES\r\n1000-001\r\nLisboa\r\nNIF: 210345675\r\nPaís: Portugal");
 
     control->setValue("PT" + OtherNif);
-    QTRY_COMPARE(log.count("DataFinished"), 2);
+    ASSERT_TRUE(QTest::qWaitFor([&log] { return log.count("DataFinished") == 2; }));
     control->setValue("PT" + AnaNif);
     EXPECT_EQ(control->Nome(), "ANA MARIA FERREIRA LOPES") << "a holder looked up before is known at once";
     EXPECT_EQ(tipText(*control), "ANA MARIA FERREIRA LOPES\r\n1000-001\r\nLisboa\r\nNIF: 210345675\r\nPaís: Portugal");
