@@ -70,7 +70,11 @@ QWidget *createNifSection()
     column->addWidget(hint);
 
     QObject::connect(nif, &cNIF::NameUpdated, holder, [holder](const QString &name) { holder->setText(name); });
-    QObject::connect(nif, &cNIF::Cleared, holder, [holder] { holder->setText(QStringLiteral("(sem titular)")); });
+    // Another number is another holder: until its name arrives there is none.
+    QObject::connect(nif, &cNIF::Changed, holder, [nif, holder] {
+        if (nif->Nome().isEmpty())
+            holder->setText(QStringLiteral("(sem titular)"));
+    });
     QObject::connect(nif, &cNIF::DataFinished, events, [nif, events, source] {
         events->setText(QStringLiteral("Pesquisa terminada: %1").arg(nif->Description()));
         source->setText(origin(*nif));

@@ -7,6 +7,7 @@
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
+#include <QRegularExpression>
 #include <QWidget>
 
 #include <array>
@@ -130,10 +131,12 @@ QString ReadWholeFile(const QString &path, bool quiet)
 
 QString FormatShortName(const QString &name)
 {
-    const QStringList words
-        = QString(name).replace(QStringLiteral("  "), QStringLiteral(" ")).trimmed().split(QLatin1Char(' '));
+    // Every run of blanks counts as one, so a name padded to line up in a list keeps its words.
+    static const QRegularExpression blanks(QStringLiteral(" {2,}"));
+    const QString collapsed = QString(name).replace(blanks, QStringLiteral(" "));
+    const QStringList words = collapsed.split(QLatin1Char(' '), Qt::SkipEmptyParts);
     if (words.size() < 3)
-        return properCase(name);
+        return properCase(collapsed);
     QString shortName = words.first() + QLatin1Char(' ') + words.last();
     if (shortName.size() < 10)
         shortName = words.first() + QLatin1Char(' ') + words.at(1).left(1) + QStringLiteral(". ") + words.last();

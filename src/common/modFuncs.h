@@ -27,6 +27,7 @@ ZELCTL_EXPORT QString ReadWholeFile(const QString &path, bool quiet = false);
 ZELCTL_EXPORT qint64 SafeFileLength(const QString &path);
 
 // The display form of a person's name: "first last" or "first M. last", in proper case.
+// Runs of blanks count as one; a name of one or two words keeps its outer blanks.
 ZELCTL_EXPORT QString FormatShortName(const QString &name);
 
 // Keeps the window above all others, without moving, sizing or activating it, and shows it.

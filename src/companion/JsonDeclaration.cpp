@@ -1,11 +1,39 @@
 #include "JsonDeclaration.h"
 
 #include <QFile>
+#include <QJsonArray>
 #include <QJsonDocument>
 #include <QJsonObject>
 #include <QSaveFile>
 
 namespace zelctl::companion {
+
+namespace {
+
+// A number kept without its country code is Portuguese: older files wrote them so.
+QString withCountryCode(const QString &number)
+{
+    return !number.isEmpty() && number.front().isDigit() ? QStringLiteral("PT") + number : number;
+}
+
+FieldCollection readFields(const QJsonValue &json)
+{
+    FieldCollection fields;
+    if (json.isArray()) {
+        for (const QJsonValue &item : json.toArray()) {
+            const QJsonObject field = item.toObject();
+            if (field.value("id").isString())
+                fields.Add(field.value("id").toString(), field.value("value").toVariant().toString());
+        }
+    } else {
+        const QJsonObject object = json.toObject();
+        for (auto it = object.begin(); it != object.end(); ++it)
+            fields.Add(it.key(), it.value().toVariant().toString());
+    }
+    return fields;
+}
+
+} // namespace
 
 class JsonDeclaration::Store : public KeyedStore
 {
@@ -34,16 +62,14 @@ bool JsonDeclaration::load(const QString &path)
         return false;
     const QJsonObject json = doc.object();
 
-    FieldCollection fields;
-    const QJsonObject jsonFields = json.value("fields").toObject();
-    for (auto it = jsonFields.begin(); it != jsonFields.end(); ++it)
-        fields.Add(it.key(), it.value().toVariant().toString());
+    FieldCollection fields = readFields(json.value("fields"));
 
     QMap<QString, Subject> subjects;
     const QJsonObject jsonSubjects = json.value("subjects").toObject();
     for (auto it = jsonSubjects.begin(); it != jsonSubjects.end(); ++it) {
         const QJsonObject subject = it.value().toObject();
-        subjects.insert(it.key(), { subject.value("nif").toString(), subject.value("name").toString() });
+        subjects.insert(
+            it.key(), { withCountryCode(subject.value("nif").toString()), subject.value("name").toString() });
     }
 
     QHash<QString, QString> titles;
@@ -54,7 +80,7 @@ bool JsonDeclaration::load(const QString &path)
     QMap<QString, QString> nifInfo;
     const QJsonObject jsonInfo = json.value("nifInfo").toObject();
     for (auto it = jsonInfo.begin(); it != jsonInfo.end(); ++it)
-        nifInfo.insert(it.key(), it.value().toVariant().toString());
+        nifInfo.insert(withCountryCode(it.key()), it.value().toVariant().toString());
 
     m_fields = std::move(fields);
     m_subjects = std::move(subjects);
@@ -65,11 +91,9 @@ bool JsonDeclaration::load(const QString &path)
 
 bool JsonDeclaration::save(const QString &path) const
 {
-    QJsonObject fields;
-    for (const FieldCollection::Item &item : m_fields.items()) {
-        if (!fields.contains(item.id))
-            fields.insert(item.id, item.value.toString());
-    }
+    QJsonArray fields;
+    for (const FieldCollection::Item &item : m_fields.items())
+        fields.append(QJsonObject { { "id", item.id }, { "value", item.value.toString() } });
     QJsonObject subjects;
     for (auto it = m_subjects.begin(); it != m_subjects.end(); ++it)
         subjects.insert(it.key(), QJsonObject { { "nif", it->nif }, { "name", it->name } });

@@ -9,10 +9,14 @@ namespace zelctl::companion {
 
 // A declaration held in memory and kept in a JSON file:
 //
-//   { "fields": { "casado": "1", "dependentes": "2", ... },
+//   { "fields": [ { "id": "casado", "value": "1" }, ... ],   (in order; ids may repeat)
 //     "subjects": { "A": { "nif": "PT...", "name": "..." }, "D1": { ... }, ... },
 //     "titles": { "A": "Sujeito Passivo A", ... },          (optional)
 //     "nifInfo": { "PT123456789.nome": "...", ... } }
+//
+// Tax numbers are country code and number, as the NIF control's Value gives them, so what
+// the control records for a holder is what the subject selector finds. Older files, with
+// "fields" as an object and Portuguese numbers without their code, are read the same way.
 class ZELCTL_EXPORT JsonDeclaration : public Declaration, private DeclarationData
 {
     Q_OBJECT

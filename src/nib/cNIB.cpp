@@ -1,6 +1,8 @@
 #include "cNIB.h"
 
 #include "NibCheckDigits.h"
+#include "common/InnerCalls.h"
+#include "frame/PropertyReaders.h"
 #include "platform/MessageBox.h"
 #include "platform/Twips.h"
 
@@ -74,11 +76,13 @@ public:
     void refreshValidity();
     void showMarks(bool valid, bool error);
     void eraseBack(int index);
+    void applyBackColor();
 
     cNIB *q;
     std::array<QLineEdit *, 4> nib {};
     QLabel *validpic;
     ErrorMark *Image1;
+    InnerCalls innerCalls;
     platform::OleColor backColor = platform::systemColor(platform::COLOR_BTNFACE);
 };
 
@@ -86,6 +90,7 @@ cNIB::Private::Private(cNIB *owner)
     : q(owner)
     , validpic(new QLabel(owner))
     , Image1(new ErrorMark(owner))
+    , innerCalls(owner)
 {
     QFont font(QStringLiteral("Arial"));
     font.setPointSizeF(8.25);
@@ -98,7 +103,12 @@ cNIB::Private::Private(cNIB *owner)
         box->setFont(font);
         box->setGeometry(pixels(QRect(boxes[i].left, 0, boxes[i].width, boxHeight)));
         box->installEventFilter(owner);
-        QObject::connect(box, &QLineEdit::textChanged, owner, [this, i] { changed(int(i)); });
+        // Changed is raised from inside the box's own editing; a host deleting the control
+        // there leaves the box to go later.
+        QObject::connect(box, &QLineEdit::textChanged, owner, [this, i] {
+            const InnerCalls::Scope busy(innerCalls, nib[i]);
+            changed(int(i));
+        });
         nib[i] = box;
     }
 
@@ -142,8 +152,9 @@ void cNIB::Private::showMarks(bool valid, bool error)
 
 void cNIB::Private::changed(int index)
 {
+    // The caret follows the user's typing; a number written by the host moves no focus.
     QLineEdit *box = nib[size_t(index)];
-    if (box->text().size() == box->maxLength() && index < int(nib.size()) - 1)
+    if (box->text().size() == box->maxLength() && index < int(nib.size()) - 1 && box->hasFocus())
         nib[size_t(index) + 1]->setFocus();
 
     const qsizetype length = text().size();
@@ -165,10 +176,14 @@ void cNIB::Private::refreshValidity()
     case 0:
         showMarks(false, false);
         break;
-    case withoutDigits:
+    case withoutDigits: {
+        // Completing the number raises Changed, whose handler may delete the control.
+        const QPointer<cNIB> alive(q);
         nib[3]->setText(CalculateNibCheckDigits(number));
-        validpic->setVisible(q->Valid());
+        if (alive)
+            validpic->setVisible(q->Valid());
         break;
+    }
     case fullLength: {
         const bool right = CalculateNibCheckDigits(number) == nib[3]->text();
         showMarks(right, !right);
@@ -182,15 +197,27 @@ void cNIB::Private::refreshValidity()
 
 void cNIB::Private::eraseBack(int index)
 {
+    const QPointer<cNIB> alive(q);
     QLineEdit *previous = nib[size_t(index) - 1];
     previous->setFocus();
     QApplication::processEvents();
+    if (!alive)
+        return;
     QString previousText = previous->text();
     if (!previousText.isEmpty()) {
         previousText.chop(1);
         previous->setText(previousText);
+        if (!alive)
+            return;
     }
     previous->setCursorPosition(int(previous->text().size()));
+}
+
+void cNIB::Private::applyBackColor()
+{
+    QPalette pal = q->palette();
+    pal.setColor(QPalette::Window, platform::toQColor(backColor));
+    q->setPalette(pal);
 }
 
 cNIB::cNIB(QWidget *parent)
@@ -200,17 +227,17 @@ cNIB::cNIB(QWidget *parent)
     setFixedSize(pixelsFromTwips(validMarkTwips.right() + 1 + platform::TwipsPerPixel),
         pixelsFromTwips(boxHeight + platform::TwipsPerPixel));
     setAutoFillBackground(true);
-    setBackColor(d->backColor);
+    d->applyBackColor();
+    // Focus given to the control (a label's buddy, a host's setFocus) lands in the first box.
+    setFocusPolicy(Qt::StrongFocus);
+    setFocusProxy(d->nib[0]);
     setText(QString());
-
-    // Leaving the control, not moving between its boxes, refreshes the marks.
-    connect(qApp, &QApplication::focusChanged, this, [this](QWidget *old, QWidget *now) {
-        if (old && isAncestorOf(old) && !(now && isAncestorOf(now)))
-            d->refreshValidity();
-    });
 }
 
-cNIB::~cNIB() = default;
+cNIB::~cNIB()
+{
+    d->innerCalls.releaseBusy();
+}
 
 QString cNIB::Text() const
 {
@@ -245,16 +272,16 @@ platform::OleColor cNIB::BackColor() const
 
 void cNIB::setBackColor(platform::OleColor color)
 {
+    if (color == d->backColor)
+        return;
     d->backColor = color;
-    QPalette pal = palette();
-    pal.setColor(QPalette::Window, platform::toQColor(color));
-    setPalette(pal);
+    d->applyBackColor();
     PropertyChanged(QStringLiteral("BackColor"));
 }
 
 void cNIB::ReadProperties(const PropertyBag &bag)
 {
-    setBackColor(bag.ReadProperty(QStringLiteral("BackColor"), d->backColor).toUInt());
+    setBackColor(readColor(bag, QStringLiteral("BackColor"), d->backColor));
 }
 
 void cNIB::WriteProperties(PropertyBag &bag)
@@ -270,6 +297,15 @@ bool cNIB::eventFilter(QObject *watched, QEvent *event)
     QLineEdit *box = d->nib[size_t(index)];
     if (event->type() == QEvent::FocusIn) {
         box->selectAll();
+    } else if (event->type() == QEvent::FocusOut) {
+        // Leaving the control, not moving between its boxes, refreshes the marks. The box
+        // that takes the focus already has it when the one that lost it hears of it.
+        if (!isAncestorOf(QApplication::focusWidget())) {
+            const QPointer<cNIB> alive(this);
+            d->refreshValidity();
+            if (!alive)
+                return true;
+        }
     } else if (event->type() == QEvent::KeyPress && static_cast<QKeyEvent *>(event)->key() == Qt::Key_Backspace
         && index >= 1 && box->text().isEmpty()) {
         d->eraseBack(index);

@@ -12,7 +12,9 @@ namespace zelctl {
 // Entry box of a Portuguese bank account number (NIB), 21 characters over four boxes:
 // bank (4), branch (4), account (11) and check digits (2). The caret moves from box to box
 // as the user types or erases; a valid or an error mark shows beside the boxes. The
-// control always keeps its size of 2685 × 330 twips.
+// control always keeps its size of 2685 × 330 twips. Focus given to the control lands in
+// the first box; a number written by the host moves no focus. A host may delete the
+// control from its Changed event.
 class ZELCTL_EXPORT cNIB : public UserControl
 {
     Q_OBJECT

@@ -10,6 +10,7 @@
 #include <QKeyEvent>
 #include <QLineEdit>
 #include <QMenu>
+#include <QPointer>
 
 namespace zelctl {
 
@@ -27,19 +28,21 @@ NifPopupMenu::NifPopupMenu(cNIF &control, QLineEdit &box)
     , m_popup(new QMenu(QStringLiteral("&MenuPopup"), &control))
 {
     m_popup->setObjectName(QStringLiteral("popup"));
-    connect(add("mnu_undo", QStringLiteral("&Desfazer"), QKeySequence(Qt::CTRL | Qt::Key_Z)), &QAction::triggered, this,
-        &NifPopupMenu::Undo);
+    connect(add("mnu_undo", QStringLiteral("&Desfazer"), QKeySequence::Undo, QKeySequence(Qt::CTRL | Qt::Key_Z)),
+        &QAction::triggered, this, &NifPopupMenu::Undo);
     separator("mnu_blank00");
-    connect(add("mnu_cut", QStringLiteral("&Cortar"), QKeySequence(Qt::CTRL | Qt::Key_X)), &QAction::triggered, this,
-        &NifPopupMenu::Cut);
-    connect(add("mnu_Copy", QStringLiteral("&Copiar"), QKeySequence(Qt::CTRL | Qt::Key_C)), &QAction::triggered, this,
-        &NifPopupMenu::Copy);
-    QAction *paste = add("mnu_paste", QStringLiteral("&Colar"), QKeySequence(Qt::CTRL | Qt::Key_V));
+    connect(add("mnu_cut", QStringLiteral("&Cortar"), QKeySequence::Cut, QKeySequence(Qt::CTRL | Qt::Key_X)),
+        &QAction::triggered, this, &NifPopupMenu::Cut);
+    connect(add("mnu_Copy", QStringLiteral("&Copiar"), QKeySequence::Copy, QKeySequence(Qt::CTRL | Qt::Key_C)),
+        &QAction::triggered, this, &NifPopupMenu::Copy);
+    QAction *paste
+        = add("mnu_paste", QStringLiteral("&Colar"), QKeySequence::Paste, QKeySequence(Qt::CTRL | Qt::Key_V));
     connect(paste, &QAction::triggered, this, &NifPopupMenu::Paste);
     m_popup->setDefaultAction(paste);
     connect(add("mnu_Delete", QStringLiteral("&Apagar")), &QAction::triggered, this, &NifPopupMenu::Delete);
     separator("mnu_blank01");
-    connect(add("mnu_selectall", QStringLiteral("&Escolher tudo"), QKeySequence(Qt::CTRL | Qt::Key_A)),
+    connect(add("mnu_selectall", QStringLiteral("&Escolher tudo"), QKeySequence::SelectAll,
+                QKeySequence(Qt::CTRL | Qt::Key_A)),
         &QAction::triggered, this, &NifPopupMenu::SelectAll);
     separator("mnu_blank02");
     connect(add("mnu_RefreshNIFInfo", QStringLiteral("&Reobter informações...")), &QAction::triggered, &control,
@@ -51,10 +54,12 @@ NifPopupMenu::NifPopupMenu(cNIF &control, QLineEdit &box)
     add("mnu_ficha", QStringLiteral("&Ficha de contribuinte"))->setEnabled(false);
 }
 
-QAction *NifPopupMenu::add(const char *name, const QString &caption, const QKeySequence &shortcut)
+QAction *NifPopupMenu::add(
+    const char *name, const QString &caption, QKeySequence::StandardKey standard, const QKeySequence &shortcut)
 {
     QAction *action = m_popup->addAction(caption);
     action->setObjectName(QString::fromLatin1(name));
+    action->setProperty("standardKey", int(standard));
     if (!shortcut.isEmpty()) {
         action->setShortcut(shortcut);
         // Shown in the menu; the keys themselves reach the box, which hands them over.
@@ -73,13 +78,18 @@ QAction *NifPopupMenu::entry(const char *name) const
     return m_popup->findChild<QAction *>(QString::fromLatin1(name), Qt::FindDirectChildrenOnly);
 }
 
+bool NifPopupMenu::editable() const
+{
+    return !m_box.isReadOnly() && m_box.isEnabled();
+}
+
 void NifPopupMenu::updateEntries()
 {
-    const bool editable = !m_box.isReadOnly();
-    entry("mnu_undo")->setEnabled(editable && m_box.isUndoAvailable());
-    entry("mnu_cut")->setEnabled(editable);
-    entry("mnu_paste")->setEnabled(editable);
-    entry("mnu_Delete")->setEnabled(editable);
+    const bool mayEdit = editable();
+    entry("mnu_undo")->setEnabled(mayEdit && m_box.isUndoAvailable());
+    entry("mnu_cut")->setEnabled(mayEdit);
+    entry("mnu_paste")->setEnabled(mayEdit);
+    entry("mnu_Delete")->setEnabled(mayEdit);
 }
 
 void NifPopupMenu::popup()
@@ -95,7 +105,10 @@ bool NifPopupMenu::handleShortcut(const QKeyEvent &event)
 {
     const QKeySequence pressed(event.keyCombination());
     for (QAction *action : m_popup->actions()) {
-        if (action->shortcut().isEmpty() || action->shortcut() != pressed)
+        const auto standard = QKeySequence::StandardKey(action->property("standardKey").toInt());
+        const bool matches = (!action->shortcut().isEmpty() && action->shortcut() == pressed)
+            || (standard != QKeySequence::UnknownKey && event.matches(standard));
+        if (!matches)
             continue;
         updateEntries();
         if (action->isEnabled())
@@ -117,7 +130,7 @@ void NifPopupMenu::replaceText(const QString &text)
 
 void NifPopupMenu::Undo()
 {
-    if (!m_box.isReadOnly())
+    if (editable())
         m_box.undo();
 }
 
@@ -130,7 +143,7 @@ void NifPopupMenu::Copy()
 
 void NifPopupMenu::Cut()
 {
-    if (m_box.isReadOnly())
+    if (!editable())
         return;
     Copy();
     if (m_box.hasSelectedText())
@@ -141,26 +154,33 @@ void NifPopupMenu::Cut()
 
 void NifPopupMenu::Paste()
 {
-    if (m_box.isReadOnly())
+    PasteText(QGuiApplication::clipboard()->text());
+}
+
+void NifPopupMenu::PasteText(QString text)
+{
+    if (!editable())
         return;
-    QString text = QGuiApplication::clipboard()->text().left(PasteLimit);
+    text.truncate(PasteLimit);
     // A code in front of the number chooses the country: any two characters before a
     // number, or a member state's code before any number of its own form ("ES12345678Z").
     const QString code = text.left(2).toUpper();
     const bool coded = text.size() > 2 && !nifValidator::IsNumericFrom(text, 1, 2)
         && (nifValidator::IsNumericFrom(text, 3, 0) || nifValidator::CountryIndex(code) >= 0);
-    if (coded) {
-        m_control.setCountryID(code);
+    if (coded)
         text = text.sliced(2);
-    } else {
-        m_control.setCountryID(QStringLiteral("PT"));
-    }
+    // Choosing the country may cut the box's text, a change whose events may delete the
+    // control (and this menu with it).
+    const QPointer<cNIF> alive(&m_control);
+    m_control.setCountryID(coded ? code : QStringLiteral("PT"));
+    if (!alive)
+        return;
     replaceText(text);
 }
 
 void NifPopupMenu::Delete()
 {
-    if (!m_box.isReadOnly())
+    if (editable())
         replaceText(QString());
 }
 

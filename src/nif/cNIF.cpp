@@ -1,10 +1,13 @@
 #include "cNIF.h"
 
+#include "NifLengthValidator.h"
 #include "NifPopupMenu.h"
 #include "ShapeWidget.h"
+#include "common/InnerCalls.h"
 #include "common/modFuncs.h"
 #include "companion/Declaration.h"
 #include "companion/NIFGrabber.h"
+#include "frame/PropertyReaders.h"
 #include "frmEditNIF.h"
 #include "platform/ModalPresenter.h"
 #include "platform/Settings.h"
@@ -16,8 +19,11 @@
 #include "validation/nifValidator.h"
 
 #include <QAction>
+#include <QClipboard>
 #include <QContextMenuEvent>
+#include <QGuiApplication>
 #include <QLineEdit>
+#include <QMimeData>
 #include <QMouseEvent>
 #include <QPointer>
 #include <QStringTokenizer>
@@ -69,13 +75,9 @@ constexpr FetchedField FetchedFields[] = {
     { u"email", u"EMAIL" },
     { u"laststatus", u"LASTSTATUS" },
 };
-
-// The member states take their tax code "EL" for Greece; the flags and the country file
-// know it by its ISO code.
-QString isoCode(const QString &country)
-{
-    return country == QLatin1String("EL") ? QStringLiteral("GR") : country;
-}
+// Read by the tip; kept with the record, without events, so the tip of a number looked up
+// earlier still shows them once the fetcher has answered for another.
+constexpr FetchedField TipFields[] = { { u"codigopostal", u"CODIGOPOSTAL" }, { u"localidade", u"LOCALIDADE" } };
 
 bool isMemberState(const QString &code)
 {
@@ -94,38 +96,34 @@ QString trimBlanks(const QString &text)
     return text.sliced(first, last - first);
 }
 
-// A saved Boolean may be a real one or the text "True"/"False" (or -1/0).
-bool readBoolean(const QVariant &value, bool fallback)
-{
-    if (value.typeId() == QMetaType::QString) {
-        const QString text = value.toString().trimmed();
-        if (text.compare(u"true", Qt::CaseInsensitive) == 0 || text == QLatin1String("-1")
-            || text == QLatin1String("1"))
-            return true;
-        if (text.compare(u"false", Qt::CaseInsensitive) == 0 || text == QLatin1String("0"))
-            return false;
-        return fallback;
-    }
-    return value.canConvert<bool>() ? value.toBool() : fallback;
-}
-
 } // namespace
 
+// Events are raised synchronously and a host may delete the control from any of them:
+// after each event, and after each call that may raise one, the code checks its guard
+// (a QPointer to the control) and returns at once when the control has gone.
 class cNIF::Private
 {
 public:
+    using Guard = QPointer<cNIF>;
+
     explicit Private(cNIF *q);
 
     void textChanged();
+    bool switchesCountry(const QString &text) const;
     bool switchTypedCountry();
+    bool cutToLimit();
     void applyColours();
     void setStateColours(OleColor fore, OleColor back);
+    void showNumber();
     void refreshTip();
     QString tipText();
+    bool userMayEdit() const;
     companion::KeyedStore *store() const;
     QString storeKey(const QString &varID) const { return q->Value() + u'.' + varID; }
     // Whether the fetcher's last answer is about the number in the box.
     bool fetcherHoldsValue() const;
+    QString fetchedField(const QString &varID) const;
+    QString recordedName() const;
     void fetchStarting();
     void informationReceived(const QString &id);
     void fetchFinished();
@@ -142,6 +140,14 @@ public:
     QPointer<companion::Declaration> declaration;
     clsBalloonTip *tip = nullptr;
     NifPopupMenu *popup = nullptr;
+    InnerCalls innerCalls;
+
+    // The records the control keeps itself, by number (Value): every value let through
+    // Information and what fetches answered. They hold the record where the host set no
+    // declaration, and keep it whole while the fetcher answers for other numbers.
+    QHash<QString, QHash<QString, QString>> records;
+    // The number whose holder the name, the tip and the status mark show; "" when none.
+    QString shownNumber;
 
     QString country = QString(Portugal);
     QString lastAppliedCountry;
@@ -165,6 +171,7 @@ cNIF::Private::Private(cNIF *owner)
     , Shape1(new ShapeWidget(owner))
     , Shape2(new ShapeWidget(owner))
     , grabber(companion::createNIFGrabber(owner))
+    , innerCalls(owner)
 {
     Shape2->setObjectName(QStringLiteral("Shape2"));
     Shape2->setBorderColor(FrameColour);
@@ -178,16 +185,29 @@ cNIF::Private::Private(cNIF *owner)
     QFont font(QStringLiteral("Tahoma"));
     font.setPointSizeF(8.25);
     nif->setFont(font);
+    nif->setValidator(new NifLengthValidator([this] { return country == Portugal ? PortugalLength : 0; },
+        [this](const QString &text) { return switchesCountry(text); }, nif));
     // The box lies inside its status mark, which lies inside the frame.
     Shape2->lower();
     Shape1->stackUnder(nif);
-    QObject::connect(nif, &QLineEdit::textChanged, owner, [this] { textChanged(); });
+    QObject::connect(nif, &QLineEdit::textChanged, owner, [this] {
+        const InnerCalls::Scope busy(innerCalls, nif);
+        textChanged();
+    });
 
     if (grabber) {
-        QObject::connect(grabber, &companion::NIFGrabber::Starting, owner, [this] { fetchStarting(); });
-        QObject::connect(grabber, &companion::NIFGrabber::ReceivedInformation, owner,
-            [this](const QString &id) { informationReceived(id); });
-        QObject::connect(grabber, &companion::NIFGrabber::Finished, owner, [this] { fetchFinished(); });
+        QObject::connect(grabber, &companion::NIFGrabber::Starting, owner, [this] {
+            const InnerCalls::Scope busy(innerCalls, grabber);
+            fetchStarting();
+        });
+        QObject::connect(grabber, &companion::NIFGrabber::ReceivedInformation, owner, [this](const QString &id) {
+            const InnerCalls::Scope busy(innerCalls, grabber);
+            informationReceived(id);
+        });
+        QObject::connect(grabber, &companion::NIFGrabber::Finished, owner, [this] {
+            const InnerCalls::Scope busy(innerCalls, grabber);
+            fetchFinished();
+        });
     }
     mod_CTL::nifControlCreated();
 }
@@ -202,9 +222,12 @@ void cNIF::Private::uncount()
 
 void cNIF::Private::openRecordForm()
 {
-    frmEditNIF form(q->window());
-    form.SetNIFControl(q);
-    platform::showModal(form);
+    // On the heap and guarded: the host may close the window (and the form with it) or
+    // delete this control while the form is up.
+    const QPointer<frmEditNIF> form = new frmEditNIF(q->window());
+    form->SetNIFControl(q);
+    platform::showModal(*form);
+    delete form.data();
 }
 
 void cNIF::Private::layout()
@@ -218,36 +241,59 @@ void cNIF::Private::layout()
     nif->setGeometry(left + 1, 2, std::max(0, inner.width() - left - 3), std::max(0, inner.height() - 4));
 }
 
-bool cNIF::Private::switchTypedCountry()
+bool cNIF::Private::switchesCountry(const QString &text) const
 {
-    const QString text = nif->text();
     if (text.size() < 3)
         return false;
     const QString typed = text.first(2).toUpper();
-    if (nifValidator::IsNumericFrom(typed, 1, 0) || !isMemberState(typed) || typed == country)
+    return !nifValidator::IsNumericFrom(typed, 1, 0) && isMemberState(typed) && typed != country;
+}
+
+bool cNIF::Private::switchTypedCountry()
+{
+    const QString text = nif->text();
+    if (!switchesCountry(text))
         return false;
     // The number is taken before the new country applies, so the Portuguese length cut
     // cannot eat into it.
     const QString number = text.sliced(2);
     {
         const QSignalBlocker quiet(nif);
-        q->setCountryID(typed);
+        q->setCountryID(text.first(2).toUpper());
     }
     nif->setText(number);
-    nif->end(false);
+    return true;
+}
+
+bool cNIF::Private::cutToLimit()
+{
+    // The box refuses keys beyond the Portuguese limit, but a text set whole may still pass
+    // it; the cut is a change of its own.
+    const QString text = nif->text();
+    if (country != Portugal || text.size() <= PortugalLength || switchesCountry(text))
+        return false;
+    nif->setText(text.first(PortugalLength));
     return true;
 }
 
 void cNIF::Private::textChanged()
 {
-    if (switchTypedCountry())
+    if (cutToLimit() || switchTypedCountry())
         return;
+    const Guard alive(q);
     q->RefreshMe();
-    if (nif->text().isEmpty())
+    if (!alive)
+        return;
+    if (nif->text().isEmpty()) {
         Q_EMIT q->Cleared();
+        if (!alive)
+            return;
+    }
     Q_EMIT q->Changed();
 }
 
+// Enabling brings back the colour of the number's state, not plain white, so the white text
+// of an invalid number stays readable.
 void cNIF::Private::applyColours()
 {
     QPalette palette = nif->palette();
@@ -264,6 +310,22 @@ void cNIF::Private::setStateColours(OleColor fore, OleColor back)
     applyColours();
 }
 
+void cNIF::Private::showNumber()
+{
+    // Another number: what the control showed belongs to another holder.
+    const QString value = q->Value();
+    if (shownNumber == value)
+        return;
+    shownNumber = value;
+    name.clear();
+    Shape1->setBorderColor(White);
+}
+
+bool cNIF::Private::userMayEdit() const
+{
+    return !nif->isReadOnly() && nif->isEnabled();
+}
+
 companion::KeyedStore *cNIF::Private::store() const
 {
     return declaration ? &declaration->DeclarationData().NifInfoStore() : nullptr;
@@ -272,6 +334,29 @@ companion::KeyedStore *cNIF::Private::store() const
 bool cNIF::Private::fetcherHoldsValue() const
 {
     return grabber && grabber->GetField(QStringLiteral("ID")) == q->Value();
+}
+
+QString cNIF::Private::fetchedField(const QString &varID) const
+{
+    const QString answer = grabber->GetField(varID.toUpper());
+    if (!answer.isEmpty())
+        return answer;
+    for (const FetchedField &field : FetchedFields) {
+        if (varID == QStringView(field.id))
+            return grabber->GetField(QString::fromUtf16(field.key));
+    }
+    return {};
+}
+
+QString cNIF::Private::recordedName() const
+{
+    const QString id = QStringLiteral("nome");
+    if (companion::KeyedStore *kept = store()) {
+        const QString stored = kept->Read(storeKey(id)).toString();
+        if (!stored.isEmpty())
+            return stored;
+    }
+    return records.value(q->Value()).value(id);
 }
 
 void cNIF::Private::fetchStarting()
@@ -286,9 +371,26 @@ void cNIF::Private::informationReceived(const QString &id)
     const QString value = q->Value();
     if (!grabber || grabber->GetField(QStringLiteral("ID")) != value || id != value)
         return;
-    for (const FetchedField &field : FetchedFields)
-        q->setInformation(QString::fromUtf16(field.id), grabber->GetField(QString::fromUtf16(field.key)));
-    q->setNome(grabber->HolderName());
+    const Guard alive(q);
+    // A field the fetcher does not know says nothing about it: what the record holds stays.
+    for (const FetchedField &field : FetchedFields) {
+        const QString answer = grabber->GetField(QString::fromUtf16(field.key));
+        if (!answer.isEmpty())
+            q->setInformation(QString::fromUtf16(field.id), answer);
+        if (!alive || !grabber)
+            return;
+    }
+    for (const FetchedField &field : TipFields) {
+        const QString answer = grabber->GetField(QString::fromUtf16(field.key));
+        if (!answer.isEmpty())
+            records[value].insert(QString::fromUtf16(field.id), answer);
+    }
+    const QString holder = grabber->HolderName();
+    if (!holder.isEmpty()) {
+        q->setNome(holder);
+        if (!alive)
+            return;
+    }
     refreshTip();
 }
 
@@ -300,8 +402,6 @@ void cNIF::Private::fetchFinished()
 
 QString cNIF::Private::tipText()
 {
-    if (q->IsEmpty() || name.isEmpty() || !q->IsValid())
-        return {};
     const QString lineBreak = QStringLiteral("\r\n");
     QString text = name;
     for (const char16_t *id : { u"codigopostal", u"localidade" }) {
@@ -326,7 +426,15 @@ void cNIF::Private::refreshTip()
         tip->setIcon(clsBalloonTip::TTIconInfo);
         tip->Create();
     }
-    const QString text = tipText();
+    QString text;
+    if (!q->IsEmpty() && !name.isEmpty()) {
+        const Guard alive(q);
+        const bool valid = q->IsValid();
+        if (!alive)
+            return;
+        if (valid)
+            text = tipText();
+    }
     if (text != tip->TipText())
         tip->setTipText(text);
 }
@@ -342,6 +450,11 @@ cNIF::cNIF(QWidget *parent)
     palette.setColor(QPalette::Window, platform::toQColor(d->backColor));
     setPalette(palette);
     resize(DefaultSize);
+    // One line high in any layout; focus given to the control (a label's buddy, a host's
+    // setFocus) lands in the number box.
+    setSizePolicy(QSizePolicy::Preferred, QSizePolicy::Fixed);
+    setFocusPolicy(Qt::StrongFocus);
+    setFocusProxy(d->nif);
     d->popup = new NifPopupMenu(*this, *d->nif);
     connect(d->popup->entry("mnu_ficha"), &QAction::triggered, this, [this] { d->openRecordForm(); });
     d->cPicture->installEventFilter(this);
@@ -353,6 +466,10 @@ cNIF::cNIF(QWidget *parent)
 cNIF::~cNIF()
 {
     d->uncount();
+    // The box's validator asks this control; the box may outlive it (below) or hear of a
+    // focus change while the base class takes it down.
+    delete d->nif->validator();
+    d->innerCalls.releaseBusy();
 }
 
 QSize cNIF::sizeHint() const
@@ -370,29 +487,63 @@ bool cNIF::eventFilter(QObject *watched, QEvent *event)
 {
     if (watched != d->cPicture && watched != d->nif)
         return UserControl::eventFilter(watched, event);
+    // The handlers below may run the host's code; a control deleted there is left at once.
+    const Private::Guard alive(this);
     switch (event->type()) {
     case QEvent::MouseButtonPress:
         if (static_cast<QMouseEvent *>(event)->button() == Qt::RightButton) {
-            PopupContextMenu();
+            if (isEnabled())
+                PopupContextMenu();
             return true;
         }
         break;
     case QEvent::MouseButtonRelease: {
         const auto *mouse = static_cast<QMouseEvent *>(event);
         if (watched == d->cPicture && mouse->button() == Qt::LeftButton
-            && d->cPicture->rect().contains(mouse->position().toPoint()))
-            ShowCountryList();
+            && d->cPicture->rect().contains(mouse->position().toPoint())) {
+            // Only the host's code changes the country of a box the user may not change.
+            if (d->userMayEdit())
+                ShowCountryList();
+            return true;
+        }
+        // X11's middle-click paste reads a country code like every other paste.
+        if (watched == d->nif && mouse->button() == Qt::MiddleButton
+            && QGuiApplication::clipboard()->supportsSelection()) {
+            d->popup->PasteText(QGuiApplication::clipboard()->text(QClipboard::Selection));
+            return true;
+        }
+        break;
+    }
+    case QEvent::Drop: {
+        // Text dropped from elsewhere is pasted; text moved within the box is the box's own.
+        auto *drop = static_cast<QDropEvent *>(event);
+        if (watched == d->nif && drop->source() != d->nif && drop->mimeData()->hasText()) {
+            if (d->userMayEdit()) {
+                drop->acceptProposedAction();
+                d->popup->PasteText(drop->mimeData()->text());
+            } else {
+                drop->ignore();
+            }
+            return true;
+        }
         break;
     }
     case QEvent::ContextMenu:
         // The control's own menu replaces the box's: the right button opens it when pressed,
         // the menu key here.
-        if (static_cast<QContextMenuEvent *>(event)->reason() == QContextMenuEvent::Keyboard)
+        if (static_cast<QContextMenuEvent *>(event)->reason() == QContextMenuEvent::Keyboard && isEnabled())
             PopupContextMenu();
         return true;
     case QEvent::FocusIn:
         if (watched == d->nif)
             d->refreshTip();
+        if (!alive)
+            return true;
+        break;
+    case QEvent::EnabledChange:
+        // Also when a parent is enabled or disabled: the box looks as it acts.
+        if (watched == d->nif)
+            d->applyColours();
         break;
     case QEvent::KeyPress:
         if (watched == d->nif && d->popup->handleShortcut(*static_cast<QKeyEvent *>(event)))
@@ -408,22 +559,30 @@ QString cNIF::CountryName(bool fulldesc) const
 {
     if (d->country == Portugal)
         return QStringLiteral("Portugal");
-    const QString code = isoCode(d->country);
     const QString file = modFuncs::ReadWholeFile(modFuncs::GetDataPath() + QStringLiteral("iso3166.txt"), true);
-    for (const QStringView line : QStringTokenizer(file, u"\r\n")) {
-        const QList<QStringView> fields = line.split(u'\t');
-        if (fields.size() < 2 || fields[1] != code)
-            continue;
-        const auto field = [&fields](int i) { return i < fields.size() ? fields[i].toString() : QString(); };
-        if (!fulldesc)
-            return field(3);
-        QString text = field(3) + QStringLiteral(" - Código ISO3166: ") + field(0) + QStringLiteral(" (") + field(1)
-            + u',' + field(2) + u')';
-        if (isMemberState(d->country))
-            text += QStringLiteral(" - País da União Europeia");
-        return text;
-    }
-    return {};
+    const auto fieldsOf = [&file](QStringView code) -> QList<QStringView> {
+        for (const QStringView line : QStringTokenizer(file, u"\r\n")) {
+            const QList<QStringView> fields = line.split(u'\t');
+            if (fields.size() >= 2 && fields[1] == code)
+                return fields;
+        }
+        return {};
+    };
+    QList<QStringView> fields = fieldsOf(d->country);
+    // Greece is "EL" in the member-state lists and in the country file; older files know
+    // it by its ISO code.
+    if (fields.isEmpty() && d->country == QLatin1String("EL"))
+        fields = fieldsOf(u"GR");
+    if (fields.isEmpty())
+        return {};
+    const auto field = [&fields](int i) { return i < fields.size() ? fields[i].toString() : QString(); };
+    if (!fulldesc)
+        return field(3);
+    QString text = field(3) + QStringLiteral(" - Código ISO3166: ") + field(0) + QStringLiteral(" (") + field(1) + u','
+        + field(2) + u')';
+    if (isMemberState(d->country))
+        text += QStringLiteral(" - País da União Europeia");
+    return text;
 }
 
 GSEL_CountryFilterList cNIF::Countries() const
@@ -485,15 +644,11 @@ void cNIF::setCountryID(const QString &code)
         return;
     d->lastAppliedCountry = value;
     d->country = value.toUpper();
-    if (d->country == Portugal) {
-        if (d->nif->text().size() > PortugalLength)
-            d->nif->setText(d->nif->text().first(PortugalLength));
-        d->nif->setMaxLength(PortugalLength);
-    } else {
-        d->nif->setMaxLength(32767);
-    }
-    d->cPicture->setPicture(mod_CTL::flagOn(*d->cPicture, isoCode(d->country)));
+    d->cPicture->setPicture(mod_CTL::flagOn(*d->cPicture, d->country));
     PropertyChanged(QStringLiteral("CountryID"));
+    // The Portuguese limit holds for what the box already has; the cut is a change of the text.
+    if (d->country == Portugal && d->nif->text().size() > PortugalLength)
+        d->nif->setText(d->nif->text().first(PortugalLength));
 }
 
 bool cNIF::Required() const
@@ -529,50 +684,83 @@ bool cNIF::IsAccepted() const
 
 bool cNIF::IsOK()
 {
+    const Private::Guard alive(this);
     const bool valid = IsValid();
-    return valid && IsAccepted() && !IsEmpty();
+    return valid && alive && IsAccepted() && !IsEmpty();
 }
 
 void cNIF::RefreshMe()
 {
+    const Private::Guard alive(this);
+    QAction *ficha = d->popup->entry("mnu_ficha");
     if (IsEmpty()) {
         d->Shape1->setBorderColor(White);
-        if (!d->name.isEmpty())
+        ficha->setEnabled(false);
+        d->shownNumber.clear();
+        if (!d->name.isEmpty()) {
             Q_EMIT Cleared();
+            if (!alive)
+                return;
+        }
         d->name.clear();
         d->setStateColours(Black, White);
-    } else if (IsValid() && IsAccepted()) {
-        d->popup->entry("mnu_ficha")->setEnabled(true);
-        Q_EMIT NIFIndicated();
-        GetNIFInformation();
-        d->setStateColours(ValidText, White);
     } else {
-        d->popup->entry("mnu_ficha")->setEnabled(false);
-        d->name.clear();
-        d->Shape1->setBorderColor(InvalidBack);
-        d->setStateColours(White, InvalidBack);
+        const bool valid = IsValid();
+        if (!alive)
+            return;
+        if (valid && IsAccepted()) {
+            ficha->setEnabled(true);
+            d->showNumber();
+            Q_EMIT NIFIndicated();
+            if (!alive)
+                return;
+            GetNIFInformation();
+            if (!alive)
+                return;
+            d->setStateColours(ValidText, White);
+        } else {
+            ficha->setEnabled(false);
+            d->shownNumber.clear();
+            d->name.clear();
+            d->Shape1->setBorderColor(InvalidBack);
+            d->setStateColours(White, InvalidBack);
+        }
     }
     d->refreshTip();
 }
 
 void cNIF::ShowCountryList()
 {
+    const Private::Guard alive(this);
     if (d->filter == GSEL_OnlyPT) {
+        if (d->country == Portugal)
+            return;
         setCountryID(QString(Portugal));
+        if (alive)
+            RefreshMe();
         return;
     }
     setCursor(Qt::WaitCursor);
-    frmSelectCountry form(window());
-    form.setFilterMode(d->filter);
-    form.setCustomList(d->customCountryList);
-    form.RelistCountries();
-    platform::showModal(form);
-    const QString chosen = form.Tag();
-    if (!chosen.isEmpty())
+    // On the heap and guarded: the host may close the window (and the form with it) or
+    // delete this control while the list is up.
+    const QPointer<frmSelectCountry> form = new frmSelectCountry(window());
+    form->setFilterMode(d->filter);
+    form->setCustomList(d->customCountryList);
+    form->RelistCountries();
+    if (form && alive)
+        platform::showModal(*form);
+    const QString chosen = form ? form->Tag() : QString();
+    delete form.data();
+    if (!alive)
+        return;
+    if (!chosen.isEmpty()) {
         setCountryID(chosen);
-    form.Unload();
+        if (!alive)
+            return;
+    }
     RefreshMe();
-    unsetCursor();
+    if (alive)
+        unsetCursor();
 }
 
 QString cNIF::Value() const
@@ -582,35 +770,44 @@ QString cNIF::Value() const
 
 void cNIF::setValue(const QString &value)
 {
+    const Private::Guard alive(this);
+    const QString before = Value();
     const bool bareNumber = !value.isEmpty() && nifValidator::IsNumericFrom(value, 1, 1);
     if (value.isEmpty())
         setCountryID(QString(Portugal));
     else if (value.size() != PortugalLength && !bareNumber)
         setCountryID(value.first(std::min<qsizetype>(2, value.size())));
-    if (Value() == value)
+    if (!alive)
         return;
+    if (Value() == value) {
+        // The country alone made the new value: the same number is checked by its rules.
+        if (before != value)
+            RefreshMe();
+        return;
+    }
     if (bareNumber) {
         d->nif->setText(value);
     } else {
         setCountryID(value.first(std::min<qsizetype>(2, value.size())));
+        if (!alive)
+            return;
         d->nif->setText(value.size() > 2 ? value.sliced(2) : QString());
     }
-    RefreshMe();
+    if (alive)
+        RefreshMe();
 }
 
 bool cNIF::Enabled() const
 {
-    return d->nif->isEnabled();
+    return d->nif->isEnabledTo(this);
 }
 
 void cNIF::setEnabled(bool enabled)
 {
-    if (enabled == d->nif->isEnabled())
+    if (enabled == Enabled())
         return;
+    // The box's EnabledChange recolours it.
     d->nif->setEnabled(enabled);
-    // Enabling brings back the colour of the number's state, not plain white, so the white
-    // text of an invalid number stays readable.
-    d->applyColours();
 }
 
 QString cNIF::Information(const QString &varID)
@@ -620,41 +817,42 @@ QString cNIF::Information(const QString &varID)
         if (!stored.isEmpty())
             return stored;
     }
-    // The fetcher's answer counts only for the number it was about.
-    if (!d->fetcherHoldsValue())
-        return {};
-    const QString answer = d->grabber->GetField(varID.toUpper());
-    if (!answer.isEmpty())
-        return answer;
-    for (const FetchedField &field : FetchedFields) {
-        if (varID == QStringView(field.id))
-            return d->grabber->GetField(QString::fromUtf16(field.key));
+    const auto record = d->records.constFind(Value());
+    if (record != d->records.cend()) {
+        const auto kept = record->constFind(varID);
+        if (kept != record->cend())
+            return *kept;
     }
-    return {};
+    // The fetcher's answer counts only for the number it was about.
+    return d->fetcherHoldsValue() ? d->fetchedField(varID) : QString();
 }
 
 void cNIF::setInformation(const QString &varID, const QString &value)
 {
-    if (!IsValid())
+    const Private::Guard alive(this);
+    const bool valid = IsValid();
+    if (!alive || !valid)
         return;
-    bool changed = false;
+    // A change is a change of what the record held: the declaration's value, else the
+    // control's own.
+    QHash<QString, QString> &record = d->records[Value()];
+    companion::KeyedStore *store = d->store();
+    const QString stored = store ? store->Read(d->storeKey(varID)).toString() : QString();
+    const bool changed = (stored.isEmpty() ? record.value(varID) : stored) != value;
+    record.insert(varID, value);
     // The fetcher keeps the data of the number it fetched; another number's values are
     // not written into them.
-    if (d->fetcherHoldsValue() && d->grabber->GetField(varID) != value) {
+    if (d->fetcherHoldsValue() && d->grabber->GetField(varID) != value)
         d->grabber->SetField(varID, value);
-        changed = true;
-    }
-    if (companion::KeyedStore *store = d->store()) {
-        const QString key = d->storeKey(varID);
-        if (store->Read(key).toString() != value) {
-            store->Write(key, value);
-            changed = true;
-        }
-    }
+    if (store && stored != value)
+        store->Write(d->storeKey(varID), value);
     if (varID == QLatin1String("AUTO") || !changed)
         return;
-    if (!value.isEmpty())
+    if (!value.isEmpty()) {
         Q_EMIT UpdatedInformation(varID);
+        if (!alive)
+            return;
+    }
     if (varID == QLatin1String("nome")) {
         d->name = value;
         Q_EMIT NameUpdated(value);
@@ -663,16 +861,17 @@ void cNIF::setInformation(const QString &varID, const QString &value)
 
 void cNIF::GetNIFInformation()
 {
+    // A name already recorded needs no fetch, busy fetcher or not.
+    const QString known = d->recordedName();
+    if (!known.isEmpty()) {
+        const Private::Guard alive(this);
+        setNome(known);
+        if (alive)
+            d->fetchFinished();
+        return;
+    }
     if (d->grabber && d->grabber->IsBusy())
         return;
-    if (companion::KeyedStore *store = d->store()) {
-        const QString stored = store->Read(d->storeKey(QStringLiteral("nome"))).toString();
-        if (!stored.isEmpty()) {
-            setNome(stored);
-            d->fetchFinished();
-            return;
-        }
-    }
     if (platform::GetSetting(
             QStringLiteral("ZEL"), QStringLiteral("Config"), QStringLiteral("allowautonif"), QStringLiteral("1"))
         == QLatin1String("0"))
@@ -690,10 +889,16 @@ void cNIF::setNome(const QString &name)
 {
     if (name == d->name)
         return;
-    d->name = name;
-    setInformation(QStringLiteral("nome"), name);
+    const Private::Guard alive(this);
+    const QString value = name;
+    d->name = value;
+    setInformation(QStringLiteral("nome"), value);
+    if (!alive)
+        return;
     d->refreshTip();
-    Q_EMIT NameUpdated(d->name);
+    if (!alive)
+        return;
+    Q_EMIT NameUpdated(QString(d->name));
 }
 
 QString cNIF::Description()
@@ -708,7 +913,12 @@ QObject *cNIF::IRSClass() const
 
 void cNIF::setIRSClass(QObject *declaration)
 {
-    d->declaration = qobject_cast<companion::Declaration *>(declaration);
+    auto *given = qobject_cast<companion::Declaration *>(declaration);
+    if (given == d->declaration)
+        return;
+    // What the user confirmed belongs to the declaration it was confirmed in.
+    d->declaration = given;
+    d->records.clear();
 }
 
 bool cNIF::DisablePopupMenu() const
@@ -755,17 +965,15 @@ void cNIF::InitProperties()
 
 void cNIF::ReadProperties(const PropertyBag &bag)
 {
-    setDisablePopupMenu(readBoolean(bag.ReadProperty(QStringLiteral("DisablePopupMenu"), false), false));
+    setDisablePopupMenu(readBoolean(bag, QStringLiteral("DisablePopupMenu"), false));
     const QString saved = bag.ReadProperty(QStringLiteral("Country"), QString(Portugal)).toString();
-    d->required = readBoolean(bag.ReadProperty(QStringLiteral("Required"), QStringLiteral("False")), false);
+    d->required = readBoolean(bag, QStringLiteral("Required"), false);
     bool known = false;
     const int filter = bag.ReadProperty(QStringLiteral("Countries"), 0).toInt(&known);
     if (known && filter >= GSEL_OnlyPT && filter <= GSEL_Custom)
         d->filter = GSEL_CountryFilterList(filter);
     d->customCountryList = bag.ReadProperty(QStringLiteral("CustomCountryList"), QString()).toString();
-    bool isColour = false;
-    const OleColor colour = bag.ReadProperty(QStringLiteral("BackColor"), White).toUInt(&isColour);
-    setBackColor(isColour ? colour : White);
+    setBackColor(readColor(bag, QStringLiteral("BackColor"), White));
     // "Country" is what a saved control holds; a "CountryID" from the container wins.
     setCountryID(bag.ReadProperty(QStringLiteral("CountryID"), saved).toString());
 }
@@ -784,9 +992,11 @@ void cNIF::Terminate()
 {
     d->uncount();
     d->declaration = nullptr;
+    // The fetcher may be the caller (Release from one of its events); it goes with the
+    // control, silenced now.
     if (d->grabber) {
         d->grabber->disconnect(this);
-        delete d->grabber;
+        d->grabber = nullptr;
     }
     if (d->tip) {
         d->tip->DestroyTip();

@@ -17,11 +17,13 @@ namespace zelctl {
 // through IRSClass) and then through the control's information fetcher; the answer shows
 // in the box's balloon tip.
 //
-// Typing a member state's code in front of a number ("ES12345678Z") switches the country
-// and keeps only the number. For Portugal the box holds at most 9 characters.
+// Typing or pasting a member state's code in front of a number ("ES12345678Z") switches
+// the country and keeps only the number. For Portugal the box holds at most 9 characters.
+// Focus given to the control lands in the number box.
 //
 // Persisted as "Countries", "CustomCountryList", "Required", "BackColor", "Country" and
-// "DisablePopupMenu"; a saved "CountryID" is read as well.
+// "DisablePopupMenu"; a saved "CountryID" is read as well. A host may delete the control
+// (or close its form) from any of its events.
 class ZELCTL_EXPORT cNIF : public UserControl
 {
     Q_OBJECT
@@ -40,12 +42,16 @@ class ZELCTL_EXPORT cNIF : public UserControl
     // Country code followed by the number ("PT123456789"). Setting a bare number (starting
     // with a digit) keeps the country and puts the whole text in the box.
     Q_PROPERTY(QString Value READ Value WRITE setValue)
-    // Whether the number box takes input; a disabled box is grey.
+    // Whether the number box takes input; a disabled box is grey. Like a control inside a
+    // disabled parent, a disabled or locked box lets the user change nothing: the flag
+    // opens no country list and the menu offers no Paste.
     Q_PROPERTY(bool Enabled READ Enabled WRITE setEnabled)
-    // The holder's name: the one last known, or else the record's "nome".
+    // The holder's name: the one last known for this number, or else the record's "nome".
+    // A new number drops the previous holder's name.
     Q_PROPERTY(QString Nome READ Nome WRITE setNome)
     // The host's declaration (a companion::Declaration), where the holder's record is kept
     // under the number. Borrowed: the control never deletes it and forgets it when it goes.
+    // Another declaration starts the control's own records afresh.
     Q_PROPERTY(QObject *IRSClass READ IRSClass WRITE setIRSClass)
     // Whether the context menu is kept from showing.
     Q_PROPERTY(bool DisablePopupMenu READ DisablePopupMenu WRITE setDisablePopupMenu)
@@ -98,15 +104,19 @@ public:
     void setEnabled(bool enabled);
 
     // A value of the holder's record ("nome", "servico", "estadocivil" ...): the one kept in
-    // the declaration, or else the fetcher's answer for this number; "" when neither has it.
+    // the declaration, else the control's own record of this number (every value set
+    // through setInformation and every fetched one), else the fetcher's answer for this
+    // number; "" when none has it.
     Q_INVOKABLE QString Information(const QString &varID);
-    // Stores a value of the record in the fetcher and the declaration, raising
-    // UpdatedInformation (for a non-empty value) and, for "nome", NameUpdated, when it
-    // changed something. The id "AUTO" stores without events. Only for a valid number.
+    // Stores a value of the record of this number, in the control's own record and the
+    // declaration, raising UpdatedInformation (for a non-empty value) and, for "nome",
+    // NameUpdated, when it changed something. The id "AUTO" stores without events. Only for
+    // a valid number; another number's record is never touched.
     Q_INVOKABLE void setInformation(const QString &varID, const QString &value);
-    // Looks the holder up: the name kept in the declaration if there is one (then
-    // DataFinished follows at once), else a fetch, unless the "allowautonif" setting of
-    // application "ZEL", section "Config", is "0". Nothing while a fetch runs.
+    // Looks the holder up: a name already recorded for this number (then DataFinished
+    // follows at once), else a fetch, unless a fetch runs or the "allowautonif" setting of
+    // application "ZEL", section "Config", is "0". A fetched value never empties one the
+    // record holds.
     Q_INVOKABLE void GetNIFInformation();
 
     QString Nome();

@@ -15,6 +15,7 @@
 #include <QLabel>
 #include <QLineEdit>
 #include <QPointer>
+#include <QRegularExpression>
 #include <QSet>
 #include <QVBoxLayout>
 
@@ -70,17 +71,45 @@ QString tagOf(const QObject *input)
     return input->property("Tag").toString();
 }
 
-// A birth date as a user types it, in the forms a Portuguese user writes; invalid when
-// it is none of them.
+// A two-digit year is the latest year with those digits that is not after this one: a birth
+// date lies in the past, so in 2026 "80" is 1980, "26" is 2026 and "27" is 1927.
+int fullYear(int twoDigits)
+{
+    const int thisYear = QDate::currentDate().year();
+    const int year = thisYear / 100 * 100 + twoDigits;
+    return year > thisYear ? year - 100 : year;
+}
+
+// A birth date as a Portuguese user types it: year first ("1980-5-7", "1980/05/07",
+// "19800507") or day first ("7/5/1980", "7-5-80", "7.5.80"); invalid when it is none of
+// them.
 QDate readDate(const QString &text)
 {
+    static const QRegularExpression yearFirst(QStringLiteral(R"(^(\d{4})[-/.](\d{1,2})[-/.](\d{1,2})$)"));
+    static const QRegularExpression dayFirst(QStringLiteral(R"(^(\d{1,2})[-/.](\d{1,2})[-/.](\d{4}|\d{2})$)"));
+    static const QRegularExpression compact(QStringLiteral(R"(^(\d{4})(\d{2})(\d{2})$)"));
     const QString trimmed = text.trimmed();
-    for (const char *format : { "yyyy-M-d", "yyyy/M/d", "d-M-yyyy", "d/M/yyyy", "d.M.yyyy", "yyyyMMdd" }) {
-        const QDate date = QDate::fromString(trimmed, QLatin1String(format));
-        if (date.isValid())
-            return date;
+    if (const auto match = yearFirst.match(trimmed); match.hasMatch())
+        return QDate(match.captured(1).toInt(), match.captured(2).toInt(), match.captured(3).toInt());
+    if (const auto match = compact.match(trimmed); match.hasMatch())
+        return QDate(match.captured(1).toInt(), match.captured(2).toInt(), match.captured(3).toInt());
+    if (const auto match = dayFirst.match(trimmed); match.hasMatch()) {
+        const QString year = match.captured(3);
+        return QDate(year.size() == 2 ? fullYear(year.toInt()) : year.toInt(), match.captured(2).toInt(),
+            match.captured(1).toInt());
     }
     return {};
+}
+
+// An unreadable date is shown as an invalid number is: white on red.
+void markUnreadable(QLineEdit &box, bool unreadable)
+{
+    QPalette palette = box.parentWidget()->palette();
+    if (unreadable) {
+        palette.setColor(QPalette::Base, Qt::red);
+        palette.setColor(QPalette::Text, Qt::white);
+    }
+    box.setPalette(palette);
 }
 
 } // namespace
@@ -95,7 +124,9 @@ public:
     QWidget *createInput(const QString &id, const RowSetup &setup, int index);
     QWidget *rowOf(const QString &id) const;
     void applyMaritalRule();
+    static bool isDate(const QObject *box) { return tagOf(box).toLower() == QLatin1String("datanascimento"); }
     void normaliseDate(QLineEdit *box);
+    void normaliseDates();
     void buttonClicked(int index);
 
     frmEditNIF *q;
@@ -157,6 +188,8 @@ frmEditNIFPrivate::frmEditNIFPrivate(frmEditNIF *owner)
         (*buttons)(index)->setCaption(QString::fromUtf8(captions[index]));
         buttonRow->addWidget((*buttons)(index));
     }
+    // Enter confirms the record, from whichever box the user is in.
+    (*buttons)(Ok)->setDefault(true);
 
     auto *top = new QHBoxLayout;
     top->addWidget(image);
@@ -198,12 +231,13 @@ QWidget *frmEditNIFPrivate::createInput(const QString &id, const RowSetup &setup
     case RowKind::ReadOnlyText: {
         auto *box = new QLineEdit(pFrame);
         box->setObjectName(QStringLiteral("tField"));
+        box->setProperty("Tag", id);
         box->setReadOnly(setup.kind == RowKind::ReadOnlyText);
         if (id == QLatin1String("servico")) {
             box->setMaxLength(TaxOfficeLength);
             box->setFixedWidth(platform::pixelsFromTwips(TaxOfficeWidthTwips));
         }
-        if (id.toLower() == QLatin1String("datanascimento"))
+        if (isDate(box))
             box->installEventFilter(q);
         input = box;
         break;
@@ -286,19 +320,33 @@ void frmEditNIFPrivate::applyMaritalRule()
 
 void frmEditNIFPrivate::normaliseDate(QLineEdit *box)
 {
+    // What cannot be read stays as typed, marked, for the user to mend.
     const QDate date = readDate(box->text());
-    box->setText(date.isValid() ? date.toString(QStringLiteral("yyyy-MM-dd")) : QString());
+    if (date.isValid())
+        box->setText(date.toString(QStringLiteral("yyyy-MM-dd")));
+    markUnreadable(*box, !date.isValid() && !box->text().trimmed().isEmpty());
+}
+
+void frmEditNIFPrivate::normaliseDates()
+{
+    for (QWidget *row : std::as_const(rows)) {
+        if (auto *box = qobject_cast<QLineEdit *>(row); box && isDate(box))
+            normaliseDate(box);
+    }
 }
 
 void frmEditNIFPrivate::buttonClicked(int index)
 {
+    // The bound control's events run the host's code, which may delete this form.
+    const QPointer<frmEditNIF> alive(q);
     switch (index) {
     case Apply:
         q->ApplyValues();
         break;
     case Ok:
         q->ApplyValues();
-        q->accept();
+        if (alive)
+            q->accept();
         break;
     case Cancel:
         q->reject();
@@ -309,7 +357,8 @@ void frmEditNIFPrivate::buttonClicked(int index)
             reloadWhenFetched = true;
             bound->GetNIFInformation();
         }
-        q->LoadValues();
+        if (alive)
+            q->LoadValues();
         break;
     default:
         break;
@@ -352,6 +401,8 @@ void frmEditNIF::LoadValues()
         if (auto *box = qobject_cast<QLineEdit *>(row)) {
             box->setText(value);
             box->setModified(false);
+            if (d->isDate(box))
+                markUnreadable(*box, !value.trimmed().isEmpty() && !readDate(value).isValid());
         } else if (auto *list = qobject_cast<QComboBox *>(row)) {
             // The record keeps the position; a fetched record may hold the state's name.
             bool number = false;
@@ -369,19 +420,29 @@ void frmEditNIF::ApplyValues()
 {
     if (!d->bound)
         return;
-    cNIF &bound = *d->bound;
-    bound.setNome(d->xNome->text());
+    // A date typed in the box the user is still in is read as leaving the box reads it.
+    d->normaliseDates();
+    // The values are taken first: the control's events run the host's code, which may
+    // delete the control or this form between two writes.
+    QList<std::pair<QString, QString>> values;
     for (QWidget *row : std::as_const(d->rows)) {
         const QString id = tagOf(row);
         if (auto *nif = qobject_cast<cNIF *>(row)) {
             // An empty number is kept as nothing, not as a bare country code.
-            bound.setInformation(id, nif->IsEmpty() ? QString() : nif->Value());
+            values.append({ id, nif->IsEmpty() ? QString() : nif->Value() });
         } else if (auto *list = qobject_cast<QComboBox *>(row)) {
-            bound.setInformation(id, QString::number(list->currentIndex()));
-            bound.setInformation(id + QStringLiteral(".text"), list->currentText());
+            values.append({ id, QString::number(list->currentIndex()) });
+            values.append({ id + QStringLiteral(".text"), list->currentText() });
         } else if (auto *box = qobject_cast<QLineEdit *>(row)) {
-            bound.setInformation(id, box->text());
+            values.append({ id, box->text() });
         }
+    }
+    const QPointer<cNIF> bound = d->bound;
+    bound->setNome(d->xNome->text());
+    for (const auto &[id, value] : std::as_const(values)) {
+        if (!bound)
+            return;
+        bound->setInformation(id, value);
     }
 }
 

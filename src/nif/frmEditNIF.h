@@ -13,9 +13,12 @@ class cNIF;
 // "Editar informação de contribuinte": the record of the number in one NIF control, with
 // the holder's name, tax office, marital status, spouse's number, bank number, e-mail,
 // birth date, telephone, territory and status. Each input carries its record id in its
-// "Tag" property. Nothing is written until "&Aplicar" or "&OK"; the values then go through
-// the control's Nome and Information, which keep them in the host's declaration and raise
-// the control's events. Shown modally with platform::showModal after SetNIFControl.
+// "Tag" property. Nothing is written until "&Aplicar" or "&OK" (also Enter); the values
+// then go through the control's Nome and Information, which keep them in its record and
+// the host's declaration and raise the control's events. A birth date is shown as
+// yyyy-MM-dd once read (a two-digit year is the latest such year not after this one); one
+// that cannot be read stays as typed, marked white on red. Shown modally with
+// platform::showModal after SetNIFControl.
 class ZELCTL_EXPORT frmEditNIF : public QDialog
 {
     Q_OBJECT

@@ -33,10 +33,13 @@ constexpr platform::OleColor White = platform::rgb(255, 255, 255);
 
 int flagCellIndex(const QString &code)
 {
+    // Greece's tax code "EL" (the code of the member-state lists and the country file)
+    // names the flag of its ISO code.
+    const QString iso = code == QLatin1String("EL") ? QStringLiteral("GR") : code;
     // Only a whole entry counts: a text search alone would find "" or "A" inside another code.
     const QLatin1StringView order(FlagOrder, sizeof(FlagOrder) - 1);
     for (int index = 0; index < FlagCellCount; ++index) {
-        if (order.sliced(index * EntryLength, 2) == code)
+        if (order.sliced(index * EntryLength, 2) == iso)
             return index;
     }
     return -1;

@@ -30,8 +30,8 @@ ZELCTL_EXPORT extern thread_local qint32 NifControlCount;
 inline constexpr int FlagCellCount = 239;
 inline constexpr int FlagSize = 16;
 
-// The strip cell of a two-letter ISO 3166 code ("PT", upper case; Greece is "GR"), or -1
-// for any other text.
+// The strip cell of a two-letter ISO 3166 code ("PT", upper case; Greece is "GR", and its
+// tax code "EL" finds the same cell), or -1 for any other text.
 ZELCTL_EXPORT int flagCellIndex(const QString &code);
 
 // The 16 x 16 flag of the code, composed on FlagScratchSurface and taken from its backing

@@ -3,6 +3,7 @@
 #include "skinCommon.h"
 
 #include "common/modFuncs.h"
+#include "frame/PropertyReaders.h"
 
 #include <QLabel>
 
@@ -145,7 +146,7 @@ void skGrowth::Repaint()
 void skGrowth::ReadProperties(const PropertyBag &bag)
 {
     setCaption(bag.ReadProperty(QStringLiteral("Caption"), QString()).toString());
-    setCaptionColor(bag.ReadProperty(QStringLiteral("CaptionColor"), CaptionColor()).toUInt());
+    setCaptionColor(readColor(bag, QStringLiteral("CaptionColor"), CaptionColor()));
     d->skinId = bag.ReadProperty(QStringLiteral("SkinID"), QString()).toString();
 }
 

@@ -2,6 +2,8 @@
 
 #include "skinCommon.h"
 
+#include "frame/PropertyReaders.h"
+
 #include <QMouseEvent>
 
 #include <cmath>
@@ -166,7 +168,7 @@ void skNumber::InitProperties()
 void skNumber::ReadProperties(const PropertyBag &bag)
 {
     const auto color = [&bag](const char *name, platform::OleColor fallback) {
-        return platform::OleColor(bag.ReadProperty(QLatin1String(name), fallback).toUInt());
+        return readColor(bag, QLatin1String(name), fallback);
     };
     d->caption = bag.ReadProperty(QStringLiteral("Caption"), QStringLiteral("1")).toString();
     d->background = color("Background", DefaultBackground);

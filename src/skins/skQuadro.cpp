@@ -2,6 +2,8 @@
 
 #include "skinCommon.h"
 
+#include "frame/PropertyReaders.h"
+
 #include <QMouseEvent>
 
 namespace zelctl {
@@ -85,7 +87,7 @@ void skQuadro::InitProperties()
 
 void skQuadro::ReadProperties(const PropertyBag &bag)
 {
-    d->transparencyColor = bag.ReadProperty(QStringLiteral("TransparentBack"), 0).toUInt();
+    d->transparencyColor = readColor(bag, QStringLiteral("TransparentBack"), 0);
     d->debugDesign = bag.ReadProperty(QStringLiteral("DebugDesignImgID"), d->debugDesign).toInt();
     loadDesignPreview();
     QPalette colours = palette();

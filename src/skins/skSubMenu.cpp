@@ -2,6 +2,7 @@
 
 #include "skinCommon.h"
 
+#include "frame/PropertyReaders.h"
 #include "platform/Pointer.h"
 #include "platform/Twips.h"
 
@@ -263,7 +264,7 @@ void skSubMenu::InitProperties()
 void skSubMenu::ReadProperties(const PropertyBag &bag)
 {
     const auto color = [&bag](const char *name, platform::OleColor fallback) {
-        return platform::OleColor(bag.ReadProperty(QLatin1String(name), fallback).toUInt());
+        return readColor(bag, QLatin1String(name), fallback);
     };
     const platform::OleColor foreColor = color("ForeColor", DefaultForeColor);
     const platform::OleColor backColor = color("BackColor", DefaultBackColor);

@@ -115,7 +115,8 @@ TEST(FormatShortName, shortensAndCapitalises)
         { "JOAO PEDRO DA SILVA", "Joao Silva" }, // "JOAO SILVA" has 10
         { "maria  da   conceicao   ferreira", "Maria Ferreira" },
         { "ana luz", "Ana Luz" },
-        { "  ana  ", "  Ana  " }, // fewer than three words: the input unchanged
+        { "RUI     SOUSA", "Rui Sousa" }, // a run of blanks is one, whatever its length
+        { "  ana  ", " Ana " }, // fewer than three words: not trimmed
         { "", "" },
     };
     for (const Case &c : cases)

@@ -37,7 +37,7 @@ TEST(DirectoryNIFGrabber, answersLaterAndInOrderForAKnownHolder)
     EXPECT_TRUE(grabber.IsBusy());
     EXPECT_TRUE(log.events.isEmpty()) << "Fetch returns before anything is answered";
     grabber.Fetch("PT198765436");
-    QTRY_VERIFY(!grabber.IsBusy());
+    ASSERT_TRUE(QTest::qWaitFor([&] { return !grabber.IsBusy(); }));
     EXPECT_EQ(log.events, QStringList({ "Starting", "ReceivedInformation:PT210345675", "Finished" }))
         << "a second fetch while busy is not started";
     EXPECT_EQ(grabber.HolderName(), "ANA MARIA FERREIRA LOPES");
@@ -52,14 +52,14 @@ TEST(DirectoryNIFGrabber, finishesAlsoWhenNothingIsFound)
     grabber.SetField("nome", "antes");
     EventLog log(grabber);
     grabber.Fetch("PT999999990");
-    QTRY_VERIFY(!grabber.IsBusy());
+    ASSERT_TRUE(QTest::qWaitFor([&] { return !grabber.IsBusy(); }));
     EXPECT_EQ(log.events, QStringList({ "Starting", "Finished" }));
     EXPECT_EQ(grabber.GetField("NOME"), "") << "the fields answer for the last fetch, which found nothing";
 
     DirectoryNIFGrabber missing("/nonexistent/contribuintes.json");
     EventLog missingLog(missing);
     missing.Fetch("PT210345675");
-    QTRY_VERIFY(!missing.IsBusy());
+    ASSERT_TRUE(QTest::qWaitFor([&] { return !missing.IsBusy(); }));
     EXPECT_EQ(missingLog.events, QStringList({ "Starting", "Finished" }));
 }
 
@@ -89,9 +89,11 @@ TEST(JsonDeclaration, answersTheQuestionsOfTheControls)
     EXPECT_EQ(data.Dependants(), 2);
     EXPECT_EQ(data.Ascendants(), 1);
     EXPECT_EQ(data.Estates(), 1);
-    EXPECT_EQ(data.SubjectNif("D2"), "246813571");
+    EXPECT_EQ(data.SubjectNif("D2"), "PT246813571");
     EXPECT_EQ(data.SubjectName("D3"), "");
-    EXPECT_EQ(data.NifInfoStore().Read("182937461.nome").toString(), QString::fromUtf8("MARIA DA CONCEIÇÃO FERREIRA"));
+    EXPECT_EQ(data.SubjectNif("S1"), "PT182937461");
+    EXPECT_EQ(data.NifInfoStore().Read("PT182937461.nome").toString(), QString::fromUtf8("MARIA DA CONCEIÇÃO FERREIRA"))
+        << "records are kept under country code and number, as the NIF control keys them";
     EXPECT_EQ(data.NifInfoStore().Read("absent").toString(), "");
     EXPECT_EQ(data.GetSujeitoTitle("D2"), "Dependente 2");
     EXPECT_EQ(data.GetSujeitoTitle("H1"), QString::fromUtf8("Herança 1"));
@@ -103,13 +105,21 @@ TEST(JsonDeclaration, savesWhatItHoldsAndRejectsBadFilesWithoutLosingData)
     JsonDeclaration declaration;
     ASSERT_TRUE(declaration.load(test::sourcePath("data/declaracao.json")));
     declaration.DeclarationData().NifInfoStore().Write("PT210345675.telefone", "210000000");
-    declaration.DeclarationData().FieldStore().Set("obito", "1");
+    FieldCollection &fields = declaration.DeclarationData().FieldStore();
+    fields.Set("obito", "1");
+    fields.Add("casado", "0");
+    fields.Add("anexo", "B");
     ASSERT_TRUE(declaration.save(dir.filePath("d.json")));
 
     JsonDeclaration reloaded;
     ASSERT_TRUE(reloaded.load(dir.filePath("d.json")));
     EXPECT_EQ(reloaded.DeclarationData().NifInfoStore().Read("PT210345675.telefone").toString(), "210000000");
-    EXPECT_EQ(reloaded.DeclarationData().FieldStore().Lookup("obito").toString(), "1");
+    QStringList saved;
+    for (const FieldCollection::Item &item : reloaded.DeclarationData().FieldStore().items())
+        saved << item.id + '=' + item.value.toString();
+    EXPECT_EQ(saved,
+        QStringList({ "casado=1", "dependentes=2", "ascendentes=1", "obito=1", "herancas=1", "casado=0", "anexo=B" }))
+        << "the fields keep their order and their repeated ids";
     EXPECT_EQ(reloaded.DeclarationData().SubjectName("A"), "ANA MARIA FERREIRA LOPES");
 
     QFile broken(dir.filePath("broken.json"));
@@ -119,6 +129,25 @@ TEST(JsonDeclaration, savesWhatItHoldsAndRejectsBadFilesWithoutLosingData)
     EXPECT_FALSE(reloaded.load(broken.fileName()));
     EXPECT_FALSE(reloaded.load(dir.filePath("missing.json")));
     EXPECT_EQ(reloaded.DeclarationData().Dependants(), 2) << "a failed load keeps the declaration";
+}
+
+TEST(JsonDeclaration, readsOlderFilesWithNumbersWithoutTheirCode)
+{
+    QTemporaryDir dir;
+    QFile old(dir.filePath("old.json"));
+    ASSERT_TRUE(old.open(QIODevice::WriteOnly));
+    old.write(R"({ "fields": { "casado": "1" },
+                   "subjects": { "S1": { "nif": "182937461" }, "D1": { "nif": "ES12345678Z" } },
+                   "nifInfo": { "182937461.nome": "MARIA", "ES12345678Z.nome": "JUAN" } })");
+    old.close();
+    JsonDeclaration declaration;
+    ASSERT_TRUE(declaration.load(old.fileName()));
+    DeclarationData &data = declaration.DeclarationData();
+    EXPECT_EQ(data.FieldStore().Lookup("casado").toString(), "1");
+    EXPECT_EQ(data.SubjectNif("S1"), "PT182937461");
+    EXPECT_EQ(data.NifInfoStore().Read("PT182937461.nome").toString(), "MARIA");
+    EXPECT_EQ(data.SubjectNif("D1"), "ES12345678Z");
+    EXPECT_EQ(data.NifInfoStore().Read("ES12345678Z.nome").toString(), "JUAN");
 }
 
 TEST(FieldCollection, keepsInsertionOrderAndFindsTheFirst)

@@ -8,47 +8,13 @@
 #include <QClipboard>
 #include <QContextMenuEvent>
 #include <QMenu>
+#include <QMimeData>
 #include <QTimer>
 
 using namespace zelctl;
 using namespace zelctl::test;
 
 namespace {
-
-// Stands in for the user at the context menu: records what it offered and chooses the
-// entry named `choice` (when it is enabled).
-class MenuChooser
-{
-public:
-    explicit MenuChooser(QString choice = {})
-        : m_previous(setPopupMenuPresenter([this, choice](QMenu &menu, const QPoint &) {
-            ++shown;
-            entries.clear();
-            for (const QAction *action : menu.actions()) {
-                entries << QStringList { action->objectName(), action->text(), action->shortcut().toString(),
-                    action->isEnabled() ? "on" : "off" }
-                               .join('|');
-            }
-            defaultEntry = menu.defaultAction() ? menu.defaultAction()->objectName() : QString();
-            QAction *action = choice.isEmpty() ? nullptr : menu.findChild<QAction *>(choice);
-            if (action && action->isEnabled())
-                action->trigger();
-        }))
-    { }
-    ~MenuChooser() { setPopupMenuPresenter(std::move(m_previous)); }
-
-    bool offered(const QString &name) const
-    {
-        return entries.filter(QRegularExpression("^" + name + "\\|.*\\|on$")).size() == 1;
-    }
-
-    int shown = 0;
-    QStringList entries;
-    QString defaultEntry;
-
-private:
-    PopupMenuPresenter m_previous;
-};
 
 class NifMenu : public NifFixture
 {
@@ -92,7 +58,11 @@ TEST_F(NifMenu, offersItsEntriesOnTheBoxAndTheFlag)
 
     QTest::keyClick(box, Qt::Key_Backspace);
     control->PopupContextMenu();
-    EXPECT_FALSE(chooser.offered("mnu_ficha"));
+    EXPECT_FALSE(chooser.offered("mnu_ficha")) << "an invalid number has no record";
+    QTest::keyClicks(box, "9");
+    erase();
+    control->PopupContextMenu();
+    EXPECT_FALSE(chooser.offered("mnu_ficha")) << "nor has an empty box";
 }
 
 TEST_F(NifMenu, disabledMenuShowsNoMenuAtAll)
@@ -169,14 +139,48 @@ TEST_F(NifMenu, pasteReadsTheCountryCode)
     }
     paste("US123456");
     EXPECT_TRUE(control->IsValid()) << "numbers of a country without a check are valid";
+
+    // Every way of pasting reads the code, and no character is lost to the Portuguese limit.
+    const std::pair<const char *, std::function<void()>> routes[] = {
+        { "Ctrl+V", [&] { QTest::keyClick(box, Qt::Key_V, Qt::ControlModifier); } },
+        { "Shift+Insert", [&] { QTest::keyClick(box, Qt::Key_Insert, Qt::ShiftModifier); } },
+        { "a host's paste()",
+            [&] {
+                box->selectAll();
+                box->paste();
+            } },
+        { "drop",
+            [&] {
+                QMimeData data;
+                data.setText(clipboard());
+                QDragEnterEvent enter(QPoint(5, 5), Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+                QApplication::sendEvent(box, &enter);
+                QDropEvent drop(QPointF(5, 5), Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+                QApplication::sendEvent(box, &drop);
+            } },
+    };
+    const Case everyRoute[] = {
+        { "a member state's number", "ES12345678Z", "ES", "12345678Z" },
+        { "a Portuguese number", PlainNif, "PT", PlainNif },
+        { "a long number is cut to nine", "1234567890123", "PT", PlainNif },
+    };
+    for (const auto &[route, paste] : routes) {
+        for (const Case &c : everyRoute) {
+            control->setCountryID("PT");
+            box->setText("0000");
+            QGuiApplication::clipboard()->setText(c.clipboard);
+            paste();
+            EXPECT_EQ(control->CountryID(), c.country) << route << ": " << c.rule;
+            EXPECT_EQ(box->text(), c.text) << route << ": " << c.rule;
+        }
+    }
 }
 
-TEST_F(NifMenu, deleteSelectAllAndUndo)
+TEST_F(NifMenu, deleteSelectAllAndUndoByMenuAndKey)
 {
     QTest::keyClicks(box, "12345");
     choose("mnu_selectall");
     EXPECT_EQ(box->selectedText(), "12345");
-
     choose("mnu_Delete");
     EXPECT_EQ(box->text(), "");
     choose("mnu_undo");
@@ -186,53 +190,58 @@ TEST_F(NifMenu, deleteSelectAllAndUndo)
     EXPECT_EQ(box->text(), "12345678Z");
     choose("mnu_undo");
     EXPECT_EQ(box->text(), "12345");
-}
 
-TEST_F(NifMenu, shortcutsRunTheMenuCommands)
-{
     QGuiApplication::clipboard()->setText("ES12345678Z");
     QTest::keyClick(box, Qt::Key_V, Qt::ControlModifier);
-    EXPECT_EQ(control->Value(), "ES12345678Z");
     QTest::keyClick(box, Qt::Key_A, Qt::ControlModifier);
     QTest::keyClick(box, Qt::Key_X, Qt::ControlModifier);
     EXPECT_EQ(box->text(), "");
     QTest::keyClick(box, Qt::Key_Z, Qt::ControlModifier);
-    EXPECT_EQ(box->text(), "12345678Z");
+    EXPECT_EQ(control->Value(), "ES12345678Z");
 }
 
-TEST_F(NifMenu, lockedBoxKeepsItsText)
+// Locked, disabled, or in a disabled form: only the host's code changes the number.
+TEST_F(NifMenu, aBoxTheUserMayNotChangeKeepsItsText)
 {
-    control->setValue("PT" + PlainNif);
-    control->setLocked(true);
-    MenuChooser chooser;
-    control->PopupContextMenu();
-    for (const char *entry : { "mnu_undo", "mnu_cut", "mnu_paste", "mnu_Delete" })
-        EXPECT_FALSE(chooser.offered(entry)) << entry;
-    EXPECT_TRUE(chooser.offered("mnu_Copy"));
+    const struct
+    {
+        const char *state;
+        std::function<void(bool)> set;
+    } states[] = {
+        { "locked", [&](bool on) { control->setLocked(on); } },
+        { "disabled", [&](bool on) { control->setEnabled(!on); } },
+    };
+    control->setCountries(GSEL_OnlyEU);
+    for (const auto &state : states) {
+        control->setValue("ES12345678Z");
+        state.set(true);
+        MenuChooser chooser;
+        control->PopupContextMenu();
+        for (const char *entry : { "mnu_undo", "mnu_cut", "mnu_paste", "mnu_Delete" })
+            EXPECT_FALSE(chooser.offered(entry)) << state.state << ": " << entry;
+        EXPECT_TRUE(chooser.offered("mnu_Copy")) << state.state;
 
-    QGuiApplication::clipboard()->setText("ES12345678Z");
-    QTest::keyClick(box, Qt::Key_V, Qt::ControlModifier);
-    QTest::keyClick(box, Qt::Key_X, Qt::ControlModifier);
-    EXPECT_EQ(control->Value(), "PT" + PlainNif);
-    EXPECT_EQ(clipboard(), "ES12345678Z");
+        QGuiApplication::clipboard()->setText("PT" + PlainNif);
+        QTest::keyClick(box, Qt::Key_V, Qt::ControlModifier);
+        QTest::keyClick(box, Qt::Key_X, Qt::ControlModifier);
+        QTest::mouseClick(control->findChild<QWidget *>("cPicture"), Qt::LeftButton);
+        EXPECT_EQ(control->Value(), "ES12345678Z") << state.state << ": the flag opens no list";
+        EXPECT_EQ(clipboard(), "PT" + PlainNif) << state.state;
+        state.set(false);
+    }
 }
 
-TEST_F(NifMenu, refreshEntryFetchesAgain)
+TEST_F(NifMenu, refreshAndRecordEntriesServeTheHolder)
 {
     control->setValue("PT" + AnaNif);
     ScriptedGrabber *grabber = grabbers.last;
     grabber->answer("PT" + AnaNif, {});
     choose("mnu_RefreshNIFInfo");
     EXPECT_EQ(grabber->fetched, QStringList({ "PT" + AnaNif, "PT" + AnaNif }));
-}
 
-TEST_F(NifMenu, recordEntryOpensTheRecordForm)
-{
-    control->setValue("PT" + PlainNif);
     ModalDriver driver([](QDialog &dialog) {
-        EXPECT_NE(qobject_cast<frmEditNIF *>(&dialog), nullptr);
         EXPECT_EQ(dialog.windowTitle(), "Editar informação de contribuinte");
-        EXPECT_EQ(dialog.findChild<cNIF *>("cNIF1")->Value(), "PT" + PlainNif);
+        EXPECT_EQ(dialog.findChild<cNIF *>("cNIF1")->Value(), "PT" + AnaNif);
         return int(QDialog::Rejected);
     });
     choose("mnu_ficha");

@@ -1,8 +1,11 @@
 #include "NifTestSupport.h"
 
+#include "nif/PopupMenuPresenter.h"
 #include "tips/clsBalloonTip.h"
 
+#include <QAction>
 #include <QPalette>
+#include <QRegularExpression>
 
 namespace zelctl::test {
 
@@ -30,6 +33,34 @@ ScriptedGrabberFactory::~ScriptedGrabberFactory()
     companion::setNIFGrabberFactory(std::move(m_previous));
 }
 
+MenuChooser::MenuChooser(QString choice, std::function<void()> user)
+    : m_previous(setPopupMenuPresenter([this, choice, user](QMenu &menu, const QPoint &) {
+        ++shown;
+        entries.clear();
+        for (const QAction *action : menu.actions()) {
+            entries << QStringList { action->objectName(), action->text(), action->shortcut().toString(),
+                action->isEnabled() ? "on" : "off" }
+                           .join('|');
+        }
+        defaultEntry = menu.defaultAction() ? menu.defaultAction()->objectName() : QString();
+        if (user)
+            return user();
+        QAction *action = choice.isEmpty() ? nullptr : menu.findChild<QAction *>(choice);
+        if (action && action->isEnabled())
+            action->trigger();
+    }))
+{ }
+
+MenuChooser::~MenuChooser()
+{
+    setPopupMenuPresenter(std::move(m_previous));
+}
+
+bool MenuChooser::offered(const QString &name) const
+{
+    return entries.filter(QRegularExpression("^" + name + "\\|.*\\|on$")).size() == 1;
+}
+
 EventLog::EventLog(cNIF &control)
 {
     const auto plain = [this](const char *name) { return [this, name] { events << QString::fromLatin1(name); }; };
@@ -45,13 +76,20 @@ EventLog::EventLog(cNIF &control)
 
 void NifFixture::SetUp()
 {
-    control = new cNIF(&form);
-    control->InitNew();
     other = new QLineEdit(&form);
     other->move(0, 40);
     form.show();
     QApplication::setActiveWindow(&form);
     ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
+    replaceControl();
+}
+
+void NifFixture::replaceControl()
+{
+    delete control;
+    control = new cNIF(&form);
+    control->InitNew();
+    control->show();
     box = entryBox(*control);
     box->setFocus();
     log = std::make_unique<EventLog>(*control);

@@ -8,12 +8,22 @@
 #include <QApplication>
 #include <QHash>
 #include <QLineEdit>
+#include <QMenu>
 #include <QStringList>
 #include <QTest>
+
+#include <functional>
 
 #include <gtest/gtest.h>
 
 #include <memory>
+#include <ostream>
+
+// Readable texts in the test's messages.
+inline void PrintTo(const QString &text, std::ostream *out)
+{
+    *out << '"' << text.toStdString() << '"';
+}
 
 namespace zelctl::test {
 
@@ -66,9 +76,36 @@ public:
     void clear() { events.clear(); }
 };
 
+// Stands in for the user at the context menu: records what it offered and chooses the
+// entry named `choice` (when it is enabled), or runs `user` instead.
+class MenuChooser
+{
+public:
+    explicit MenuChooser(QString choice = {}, std::function<void()> user = {});
+    ~MenuChooser();
+    MenuChooser(const MenuChooser &) = delete;
+    MenuChooser &operator=(const MenuChooser &) = delete;
+
+    // Whether the entry was offered and enabled the last time.
+    bool offered(const QString &name) const;
+
+    int shown = 0;
+    QStringList entries;
+    QString defaultEntry;
+
+private:
+    std::function<void(QMenu &, const QPoint &)> m_previous;
+};
+
 inline QLineEdit *entryBox(cNIF &control)
 {
     return control.findChild<QLineEdit *>(QStringLiteral("nif"));
+}
+
+// Deletes what deleteLater left, as the event loop would.
+inline void runDeferredDeletes()
+{
+    QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
 }
 
 platform::OleColor textColour(cNIF &control);
@@ -81,6 +118,8 @@ class NifFixture : public ::testing::Test
 {
 protected:
     void SetUp() override;
+    // A fresh control in place of the current one, focused.
+    void replaceControl();
 
     void type(const QString &text)
     {

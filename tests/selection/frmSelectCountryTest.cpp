@@ -130,15 +130,21 @@ TEST(CountryList, eachModeListsItsCountries)
     EXPECT_TRUE(rows(form).isEmpty());
 }
 
-TEST(CountryList, eachCountryShowsItsFlag)
+TEST(CountryList, everyMemberStateShowsItsFlag)
 {
     frmSelectCountry form;
-    relist(form, GSEL_Custom, QStringLiteral("PT,ES"));
+    relist(form, GSEL_OnlyEU);
     PictureBox surface;
-    const QImage pt = mod_CTL::flagOn(surface, QStringLiteral("PT")).image();
-    const QIcon icon = listOf(form)->topLevelItem(1)->icon(0);
-    ASSERT_FALSE(icon.isNull());
-    EXPECT_EQ(icon.pixmap(16, 16).toImage().convertToFormat(QImage::Format_RGB32), pt);
+    const QTreeWidget *list = listOf(form);
+    ASSERT_EQ(list->topLevelItemCount(), 27);
+    for (int row = 0; row < list->topLevelItemCount(); ++row) {
+        const QString code = list->topLevelItem(row)->text(1);
+        const QIcon icon = list->topLevelItem(row)->icon(0);
+        ASSERT_FALSE(icon.isNull()) << code.toStdString();
+        EXPECT_EQ(icon.pixmap(16, 16).toImage().convertToFormat(QImage::Format_RGB32),
+            mod_CTL::flagOn(surface, code).image().convertToFormat(QImage::Format_RGB32))
+            << code.toStdString();
+    }
 }
 
 TEST(CountryList, aMissingFileIsReportedAndLeavesPortugalAlone)

@@ -1,0 +1,203 @@
+#include "NifTestSupport.h"
+
+#include "companion/CommandButton.h"
+#include "nif/frmEditNIF.h"
+#include "selection/frmSelectCountry.h"
+#include "support/TestSupport.h"
+
+#include <QClipboard>
+#include <QDialog>
+#include <QPointer>
+
+using namespace zelctl;
+using namespace zelctl::test;
+
+// A host may delete the control, or close the window that holds it, from any of its events
+// and while its fetch, menu, country list or record form is pending. Nothing may run on
+// what was deleted afterwards (the sanitizers watch), and what the host kept lives on.
+namespace {
+
+class NifLifetime : public ::testing::Test
+{
+public:
+    void SetUp() override
+    {
+        window = new QWidget;
+        control = new cNIF(window);
+        control->InitNew();
+        window->show();
+    }
+
+    void TearDown() override
+    {
+        delete window.data();
+        runDeferredDeletes();
+    }
+
+    void reset()
+    {
+        TearDown();
+        SetUp();
+    }
+
+    template <typename Event> void deleteOn(Event event, bool wholeWindow = false)
+    {
+        QObject::connect(control, event, [this, wholeWindow] {
+            if (wholeWindow)
+                delete window.data();
+            else
+                delete control.data();
+        });
+    }
+
+    QLineEdit *box() const { return entryBox(*control); }
+
+    // The user's path, step by step, until the control has gone: a pasted number whose
+    // holder is fetched, its country changed by the flag, then the box emptied.
+    void walkUntilDeleted()
+    {
+        const QPointer<ScriptedGrabber> grabber = grabbers.last;
+        const std::function<void()> steps[] = {
+            [&] { QTest::keyClicks(box(), PlainNif.left(8)); },
+            [&] { QTest::keyClicks(box(), PlainNif.right(1)); },
+            [&] {
+                grabber->answer("PT" + PlainNif, { { "NAME", "MARIA" }, { "SERVICO", "3131" } });
+            },
+            [&] {
+                QGuiApplication::clipboard()->setText("ES12345678Z");
+                QTest::keyClick(box(), Qt::Key_V, Qt::ControlModifier);
+            },
+            [&] { QTest::mouseClick(control->findChild<QWidget *>("cPicture"), Qt::LeftButton); },
+            [&] {
+                box()->selectAll();
+                QTest::keyClick(box(), Qt::Key_Backspace);
+            },
+        };
+        for (const auto &step : steps) {
+            step();
+            if (!control)
+                break;
+        }
+        runDeferredDeletes();
+    }
+
+    ScriptedGrabberFactory grabbers;
+    QPointer<QWidget> window;
+    QPointer<cNIF> control;
+};
+
+} // namespace
+
+TEST_F(NifLifetime, deletedFromInsideEachOfItsEvents)
+{
+    const struct
+    {
+        const char *event;
+        std::function<void(NifLifetime &, bool)> hook;
+    } events[] = {
+        { "Changed", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::Changed, w); } },
+        { "Validated", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::Validated, w); } },
+        { "NIFIndicated", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::NIFIndicated, w); } },
+        { "UpdatedInformation", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::UpdatedInformation, w); } },
+        { "NameUpdated", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::NameUpdated, w); } },
+        { "DataFinished", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::DataFinished, w); } },
+        { "Cleared", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::Cleared, w); } },
+    };
+    for (const bool wholeWindow : { false, true }) {
+        for (const auto &event : events) {
+            reset();
+            event.hook(*this, wholeWindow);
+            walkUntilDeleted();
+            EXPECT_TRUE(control.isNull()) << event.event << " was raised on the user's path";
+            EXPECT_EQ(window.isNull(), wholeWindow) << event.event;
+        }
+    }
+}
+
+TEST_F(NifLifetime, deletedWhileSomethingOfItsOwnIsPending)
+{
+    const struct
+    {
+        const char *pending;
+        std::function<void()> open;
+    } cases[] = {
+        { "its menu", [&] { QTest::mousePress(box(), Qt::RightButton); } },
+        { "its country list",
+            [&] {
+                control->setCountries(GSEL_All);
+                QTest::mousePress(control->findChild<QWidget *>("cPicture"), Qt::LeftButton);
+                QTest::mouseRelease(control->findChild<QWidget *>("cPicture"), Qt::LeftButton);
+            } },
+        { "its record form",
+            [&] {
+                control->setValue("PT" + PlainNif);
+                MenuChooser chooser("mnu_ficha");
+                control->PopupContextMenu();
+            } },
+    };
+    for (const bool wholeWindow : { false, true }) {
+        for (const auto &c : cases) {
+            reset();
+            const auto goAway = [&] {
+                if (wholeWindow)
+                    delete window.data();
+                else
+                    delete control.data();
+            };
+            MenuChooser menu({}, goAway);
+            ModalDriver dialogs([&](QDialog &) {
+                goAway();
+                return int(QDialog::Rejected);
+            });
+            c.open();
+            runDeferredDeletes();
+            EXPECT_TRUE(control.isNull()) << c.pending;
+        }
+    }
+
+    // A fetch that answers after its control went reaches nothing.
+    reset();
+    companion::setNIFGrabberFactory({});
+    auto *fetching = new cNIF(window);
+    fetching->setValue("PT" + AnaNif);
+    delete fetching;
+    QTest::qWait(20);
+}
+
+TEST_F(NifLifetime, recordFormSurvivesItsHostsEvents)
+{
+    control->setValue("PT" + PlainNif);
+    const auto press = [](frmEditNIF &form, int index) {
+        for (auto *button : form.findChildren<CommandButton *>()) {
+            if (button->Index() == index)
+                return QTest::mouseClick(button, Qt::LeftButton);
+        }
+    };
+    // The host closes the form, or deletes the control, when the name it confirmed arrives.
+    QPointer<frmEditNIF> form = new frmEditNIF(window);
+    form->SetNIFControl(control);
+    form->findChild<QLineEdit *>("xNome")->setText("OUTRO NOME");
+    QObject::connect(control, &cNIF::NameUpdated, [&form] { delete form.data(); });
+    press(*form, 1);
+    EXPECT_TRUE(form.isNull());
+
+    form = new frmEditNIF(window);
+    form->SetNIFControl(control);
+    form->findChild<QLineEdit *>("xNome")->setText("TERCEIRO");
+    QObject::connect(control, &cNIF::UpdatedInformation, [this] { delete control.data(); });
+    press(*form, 0);
+    EXPECT_TRUE(control.isNull());
+    EXPECT_FALSE(form.isNull());
+
+    // A form closed while its public information is fetched hears nothing of the answer.
+    reset();
+    control->setValue("PT" + AnaNif);
+    QPointer<ScriptedGrabber> grabber = grabbers.last;
+    grabber->answer("PT" + AnaNif, {});
+    form = new frmEditNIF(window);
+    form->SetNIFControl(control);
+    press(*form, 3);
+    delete form.data();
+    grabber->answer("PT" + AnaNif, { { "NAME", "ANA LOPES" } });
+    EXPECT_EQ(control->Nome(), "ANA LOPES");
+}
