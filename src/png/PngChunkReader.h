@@ -5,6 +5,8 @@
 #include <QByteArrayView>
 #include <QString>
 
+#include <vector>
+
 // The chunk side of a PNG file: signature, chunk loop with its CRC rules, the header checks
 // and every understood ancillary chunk. Every length is checked against the file first.
 namespace zelctl::png {
@@ -40,6 +42,9 @@ struct ReadResult
 {
     bool ok = false; // the chunks are good enough to decode
     const char *reason = nullptr; // why not
+    // The data of the IDAT chunks in file order: views into the file, the compressed stream.
+    std::vector<QByteArrayView> imageData;
+    qsizetype imageDataSize = 0;
 };
 
 // Reads the chunks of a whole file into header and info. The header fields are assigned

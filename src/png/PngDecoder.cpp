@@ -6,8 +6,6 @@
 
 #include <algorithm>
 #include <cstring>
-#include <memory>
-#include <new>
 
 namespace zelctl::png {
 
@@ -271,43 +269,40 @@ void fillBlocks(const BitmapView &bitmap, int pass, int32_t y, int64_t count)
 
 constexpr int32_t rowsPerBlock = 16;
 
-// Rows are inflated and restored a block at a time into one small buffer: slot 0 keeps the
-// last restored row of the block before, slots 1-16 take the new rows.
+// Rows are taken from the stream and restored in place a block at a time; the stream keeps
+// the last row of the block before readable in front of the next block.
 class RowBlocks
 {
 public:
-    RowBlocks(ImageStream &stream, int64_t maximumStride, int distance)
+    RowBlocks(ImageStream &stream, int distance)
         : m_stream(stream)
         , m_distance(distance)
-        , m_buffer(new (std::nothrow) uint8_t[size_t(maximumStride) * (rowsPerBlock + 1)])
     { }
 
-    bool valid() const { return m_buffer != nullptr; }
-
-    // Inflates and restores rows [first, first + count) of a pass whose rows are stride
-    // bytes (filter byte included); the first row of a pass has no row above.
+    // Takes and restores rows [first, first + count) of a pass whose rows are stride bytes
+    // (filter byte included); the first row of a pass has no row above.
     bool restore(int64_t first, int count, int64_t stride)
     {
+        m_rows = m_stream.next(stride * count, first == 0 ? 0 : stride);
         m_stride = stride;
-        if (!m_stream.read(m_buffer.get() + stride, stride * count))
+        if (!m_rows)
             return false;
         for (int k = 0; k < count; ++k) {
-            uint8_t *row = m_buffer.get() + (k + 1) * stride;
-            const uint8_t *above = first + k == 0 ? nullptr : m_buffer.get() + k * stride + 1;
+            uint8_t *row = m_rows + k * stride;
+            const uint8_t *above = first + k == 0 ? nullptr : row - stride + 1;
             if (!unfilterRow(row[0], row + 1, above, stride - 1, m_distance))
                 return false;
         }
-        std::memcpy(m_buffer.get(), m_buffer.get() + count * stride, size_t(stride));
         return true;
     }
 
     // Restored bytes of row k (0-based) of the last block.
-    const uint8_t *row(int k) const { return m_buffer.get() + (k + 1) * m_stride + 1; }
+    const uint8_t *row(int k) const { return m_rows + k * m_stride + 1; }
 
 private:
     ImageStream &m_stream;
     int m_distance;
-    std::unique_ptr<uint8_t[]> m_buffer;
+    uint8_t *m_rows = nullptr;
     int64_t m_stride = 0;
 };
 
@@ -420,10 +415,7 @@ bool decodeImage(const Header &header, const FileInfo &info, const DecodeOptions
         || bitmap.stride < bitmapStride(bitmap.width, bitmap.bitCount))
         return false;
     const Converter converter(header, info, options, bitmap.bitCount);
-    const int bpp = header.streamBitsPerPixel();
-    RowBlocks blocks(stream, rowBytes(header.width, bpp) + 1, std::max(1, bpp / 8));
-    if (!blocks.valid())
-        return false;
+    RowBlocks blocks(stream, std::max(1, header.streamBitsPerPixel() / 8));
     const bool decoded = header.interlaced() ? decodeProgressive(header, converter, options, blocks, bitmap, observer)
                                              : decodeSequential(header, converter, blocks, bitmap, observer);
     return decoded && stream.finish();

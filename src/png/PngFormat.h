@@ -77,7 +77,6 @@ struct FileInfo
     QByteArray textRecords;
     std::optional<std::array<uint8_t, 8>> timeBytes;
     uint8_t stdRgbIntent = 0;
-    QByteArray imageData; // the IDAT stream, still compressed
     bool headerSeen = false;
 };
 
