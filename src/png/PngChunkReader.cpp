@@ -1,6 +1,6 @@
 #include "PngChunkReader.h"
 
-#include <zlib.h>
+#include <libdeflate.h>
 
 #include <cstring>
 #include <limits>
@@ -217,16 +217,8 @@ ReadResult refused(const char *why)
 
 uint32_t chunkCrc(QByteArrayView typeAndData)
 {
-    uLong crc = crc32(0, nullptr, 0);
-    const auto *p = reinterpret_cast<const Bytef *>(typeAndData.data());
-    qsizetype left = typeAndData.size();
-    while (left > 0) {
-        const uInt part = uInt(std::min<qsizetype>(left, std::numeric_limits<uInt>::max()));
-        crc = crc32(crc, p, part);
-        p += part;
-        left -= part;
-    }
-    return uint32_t(crc);
+    // zlib's crc32 with initial value 0; libdeflate computes the same sum several times faster.
+    return libdeflate_crc32(0, typeAndData.data(), size_t(typeAndData.size()));
 }
 
 ReadResult readChunks(QByteArrayView file, bool validateAllData, Header &header, FileInfo &info)

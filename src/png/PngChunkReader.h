@@ -1,5 +1,7 @@
 #pragma once
 
+#include "zelctl_export.h"
+
 #include "PngFormat.h"
 
 #include <QByteArrayView>
@@ -49,9 +51,9 @@ struct ReadResult
 
 // Reads the chunks of a whole file into header and info. The header fields are assigned
 // as soon as they are read, so they show what a rejected file claimed.
-ReadResult readChunks(QByteArrayView file, bool validateAllData, Header &header, FileInfo &info);
+ZELCTL_EXPORT ReadResult readChunks(QByteArrayView file, bool validateAllData, Header &header, FileInfo &info);
 
-// CRC of a chunk: zlib's crc32 over type and data.
+// CRC of a chunk: the CRC-32 of zlib's crc32 over type and data.
 uint32_t chunkCrc(QByteArrayView typeAndData);
 
 } // namespace zelctl::png

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "zelctl_export.h"
+
 #include <QByteArrayView>
 
 #include <cstdint>
@@ -18,7 +20,7 @@ namespace zelctl::png {
 // save that copy). Larger streams are inflated by zlib, part after part, as the blocks are
 // asked for, into a buffer of a few rows, so that a huge image costs little more than its
 // bitmap.
-class ImageStream
+class ZELCTL_EXPORT ImageStream
 {
 public:
     enum class Mode { Automatic, Whole, Streaming };
