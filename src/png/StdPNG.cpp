@@ -491,7 +491,7 @@ void StdPNG::Paint(qint32 hdc, qint32 destX, qint32 destY, qint32 destCx, qint32
     pngCx = pngCx < 1 ? bits.width : pngCx;
     pngCy = pngCy < 1 ? bits.height : pngCy;
     const qint32 source = PngDC ? PngDC : image.OwnDC();
-    if (!source)
+    if (!source || !png::reachesTarget(hdc, destX, destY, destCx, destCy))
         return;
     const bool borrowed = source != image.OwnDC();
     const gdi::HGDIOBJ previous = borrowed ? gdi::SelectObject(source, image.BitmapHandle()) : 0;
