@@ -11,7 +11,7 @@
 // Then the peak memory of StdPNG.LoadFile, each image in a fresh process.
 //
 //   build/bench/bench_png [--rounds N] [--write DIR]
-// --write DIR only writes the images as DIR/NAME.png (for scripts/bench-png-cli).
+// --write DIR only writes the images as DIR/NAME.png (for bench/png-decode-vs-libpng).
 
 #include "png/StdPNG.h"
 
