@@ -246,21 +246,6 @@ TEST(PngDecode, choosesTheBitmapFormatOfEachImage)
     }
 }
 
-TEST(PngDecode, premultipliesSixteenBitRgbaFromTheFirstBytes)
-{
-    // One pixel R 0xFFFF, G 0x0000, B 0x8000, A 0x8000.
-    const QByteArray rows = QByteArray::fromHex("00"
-                                                "ffff"
-                                                "0000"
-                                                "8000"
-                                                "8000");
-    const QByteArray file = signature() + ihdr(1, 1, 16, 6) + chunk("IDAT", deflate(rows)) + chunk("IEND", {});
-    StdPNG image;
-    image.setTransparentStyle(StdPNG::alphaTransparent);
-    ASSERT_TRUE(image.LoadData(file));
-    EXPECT_EQ(bitmapPixel(image, 0, 0), (std::array<uint8_t, 4> { 0x40, 0x00, 0x80, 0x80 }));
-}
-
 TEST(PngDecode, restoresEveryFilterAtEveryPixelSize)
 {
     // Rows filtered by hand with every type, for stream pixels of 1 to 8 bytes, checked
