@@ -6,6 +6,11 @@
 
 #include <QFile>
 
+#include <algorithm>
+#include <array>
+#include <cstring>
+#include <vector>
+
 namespace {
 
 QString joined(const auto &values)
@@ -16,36 +21,81 @@ QString joined(const auto &values)
     return parts.join(' ');
 }
 
-// The bitmap as R, G, B, A per pixel: table-based pixels through their table.
-QByteArray rgbaPixels(const zelctl::StdPNG &image)
+// The bitmap's pixels as R, G, B, A bytes (a little-endian word): table-based pixels through
+// their table (entries it lacks are black), 24-bit pixels opaque, 32-bit ones as stored.
+class PamRows
 {
-    const zelctl::png::BitmapView bits = image.ImageData().Bits();
-    const std::vector<uint32_t> &table = image.ImageData().ColorTable();
-    QByteArray out;
-    out.reserve(qsizetype(bits.width) * bits.height * 4);
-    for (int y = 0; y < bits.height; ++y) {
-        const uint8_t *row = bits.row(y);
-        for (int x = 0; x < bits.width; ++x) {
-            if (bits.bitCount == 32) {
-                out.append(char(row[4 * x + 2])).append(char(row[4 * x + 1])).append(char(row[4 * x]));
-                out.append(char(row[4 * x + 3]));
-                continue;
+public:
+    explicit PamRows(const zelctl::stdPNGdata &image)
+        : m_bits(image.Bits())
+    {
+        m_table.fill(0xFF000000u);
+        const std::vector<uint32_t> &table = image.ColorTable();
+        for (size_t i = 0; i < std::min<size_t>(table.size(), 256); ++i)
+            m_table[i] = 0xFF000000u | (table[i] >> 16 & 0xFF) | (table[i] & 0xFF00) | (table[i] & 0xFF) << 16;
+    }
+
+    void convert(int y, uint32_t *out) const
+    {
+        const uint8_t *row = m_bits.row(y);
+        const int width = m_bits.width;
+        switch (m_bits.bitCount) {
+        case 32:
+            for (int x = 0; x < width; ++x) {
+                uint32_t bgra;
+                std::memcpy(&bgra, row + 4 * x, 4);
+                out[x] = (bgra & 0xFF00FF00u) | (bgra >> 16 & 0xFF) | (bgra & 0xFF) << 16;
             }
-            if (bits.bitCount == 24) {
-                out.append(char(row[3 * x + 2])).append(char(row[3 * x + 1])).append(char(row[3 * x]));
-                out.append(char(0xFF));
-                continue;
-            }
-            unsigned index = row[x * bits.bitCount / 8];
-            if (bits.bitCount == 4)
-                index = (index >> (x % 2 ? 0 : 4)) & 0xF;
-            else if (bits.bitCount == 1)
-                index = (index >> (7 - x % 8)) & 1;
-            const uint32_t color = index < table.size() ? table[index] : 0;
-            out.append(char(color >> 16)).append(char(color >> 8)).append(char(color)).append(char(0xFF));
+            break;
+        case 24:
+            for (int x = 0; x < width; ++x, row += 3)
+                out[x] = 0xFF000000u | row[2] | row[1] << 8 | uint32_t(row[0]) << 16;
+            break;
+        case 8:
+            for (int x = 0; x < width; ++x)
+                out[x] = m_table[row[x]];
+            break;
+        case 4:
+            for (int x = 0; x < width; ++x)
+                out[x] = m_table[(row[x / 2] >> (x % 2 ? 0 : 4)) & 0xF];
+            break;
+        default:
+            for (int x = 0; x < width; ++x)
+                out[x] = m_table[(row[x / 8] >> (7 - x % 8)) & 1];
+            break;
         }
     }
-    return out;
+
+private:
+    zelctl::png::BitmapView m_bits;
+    std::array<uint32_t, 256> m_table;
+};
+
+// Writes the bitmap as an 8-bit RGB_ALPHA PAM, a band of rows of about a megabyte at a time.
+bool writePam(const zelctl::StdPNG &image, QFile &pam)
+{
+    const QByteArray header
+        = QStringLiteral("P7\nWIDTH %1\nHEIGHT %2\nDEPTH 4\nMAXVAL 255\nTUPLTYPE RGB_ALPHA\nENDHDR\n")
+              .arg(image.Width())
+              .arg(image.Height())
+              .toLatin1();
+    if (pam.write(header) != header.size())
+        return false;
+    static_assert(Q_BYTE_ORDER == Q_LITTLE_ENDIAN, "PAM words are written as R, G, B, A bytes");
+    const PamRows rows(image.ImageData());
+    const int width = image.Width();
+    const int height = image.Height();
+    const int band = std::max(1, (1 << 18) / width);
+    std::vector<uint32_t> pixels(size_t(width) * size_t(std::min(band, height)));
+    for (int top = 0; top < height; top += band) {
+        const int count = std::min(band, height - top);
+        for (int k = 0; k < count; ++k)
+            rows.convert(top + k, pixels.data() + size_t(k) * size_t(width));
+        const qint64 bytes = qint64(width) * count * 4;
+        if (pam.write(reinterpret_cast<const char *>(pixels.data()), bytes) != bytes)
+            return false;
+    }
+    return true;
 }
 
 } // namespace
@@ -127,13 +177,7 @@ int runPngDecode(const QStringList &args, QTextStream &, QTextStream &err)
         return 1;
     }
     QFile pam(files[1]);
-    const QByteArray header
-        = QStringLiteral("P7\nWIDTH %1\nHEIGHT %2\nDEPTH 4\nMAXVAL 255\nTUPLTYPE RGB_ALPHA\nENDHDR\n")
-              .arg(image.Width())
-              .arg(image.Height())
-              .toLatin1();
-    if (!pam.open(QIODevice::WriteOnly) || pam.write(header) != header.size() || !pam.write(rgbaPixels(image))
-        || !pam.flush()) {
+    if (!pam.open(QIODevice::WriteOnly) || !writePam(image, pam) || !pam.flush()) {
         err << "zelctl png-decode: cannot write " << files[1] << '\n';
         return 1;
     }

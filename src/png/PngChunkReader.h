@@ -1,9 +1,13 @@
 #pragma once
 
+#include "zelctl_export.h"
+
 #include "PngFormat.h"
 
 #include <QByteArrayView>
 #include <QString>
+
+#include <vector>
 
 // The chunk side of a PNG file: signature, chunk loop with its CRC rules, the header checks
 // and every understood ancillary chunk. Every length is checked against the file first.
@@ -40,13 +44,16 @@ struct ReadResult
 {
     bool ok = false; // the chunks are good enough to decode
     const char *reason = nullptr; // why not
+    // The data of the IDAT chunks in file order: views into the file, the compressed stream.
+    std::vector<QByteArrayView> imageData;
+    qsizetype imageDataSize = 0;
 };
 
 // Reads the chunks of a whole file into header and info. The header fields are assigned
 // as soon as they are read, so they show what a rejected file claimed.
-ReadResult readChunks(QByteArrayView file, bool validateAllData, Header &header, FileInfo &info);
+ZELCTL_EXPORT ReadResult readChunks(QByteArrayView file, bool validateAllData, Header &header, FileInfo &info);
 
-// CRC of a chunk: zlib's crc32 over type and data.
+// CRC of a chunk: the CRC-32 of zlib's crc32 over type and data.
 uint32_t chunkCrc(QByteArrayView typeAndData);
 
 } // namespace zelctl::png

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "zelctl_export.h"
+
 #include "PngFormat.h"
 
 #include <QtGlobal>
@@ -44,7 +46,7 @@ struct DecodeOptions
 
 // Bits per pixel of the bitmap for an image; 0 when the header's colour type and bit depth do
 // not form a PNG format, which the decoder refuses.
-int outputBitCount(const Header &header, const FileInfo &info, const DecodeOptions &options);
+ZELCTL_EXPORT int outputBitCount(const Header &header, const FileInfo &info, const DecodeOptions &options);
 
 // Colour table of a bitmap below 16 bits, entries 0x00RRGGBB. Grey images of bit depth 2 get
 // their four levels written into info.paletteBytes first.
@@ -65,8 +67,8 @@ class ImageStream;
 
 // Decodes the image stream into bitmap. False on a bad filter type, a broken stream or one
 // whose length differs from the header's, or a format the decoder refuses.
-bool decodeImage(const Header &header, const FileInfo &info, const DecodeOptions &options, ImageStream &stream,
-    const BitmapView &bitmap, const DecodeObserver &observer);
+ZELCTL_EXPORT bool decodeImage(const Header &header, const FileInfo &info, const DecodeOptions &options,
+    ImageStream &stream, const BitmapView &bitmap, const DecodeObserver &observer);
 
 // Multiplies every byte of a 32-bit bitmap by opacity / 255, keeping it premultiplied.
 void applyConstantOpacity(const BitmapView &bitmap, uint8_t opacity);

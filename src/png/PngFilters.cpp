@@ -74,30 +74,27 @@ void unfilterAverage(uint8_t *row, const uint8_t *previous, qsizetype length, in
 // Pixels of 3, 4, 6 or 8 bytes are restored one whole pixel at a time in 16-bit lanes: each
 // pixel depends on the one before it, but its bytes do not depend on each other.
 // Loads go through integer registers: assembling odd sizes in memory would stall on every pixel.
-template <int Distance> __m128i loadPixel(const uint8_t *p)
+template <int Distance> __m128i loadBytes(const uint8_t *p)
 {
-    __m128i bytes;
     if constexpr (Distance == 3) {
-        bytes = _mm_cvtsi32_si128(int(p[0] | p[1] << 8 | p[2] << 16));
+        return _mm_cvtsi32_si128(int(p[0] | p[1] << 8 | p[2] << 16));
     } else if constexpr (Distance == 4) {
         uint32_t value;
         std::memcpy(&value, p, 4);
-        bytes = _mm_cvtsi32_si128(int(value));
+        return _mm_cvtsi32_si128(int(value));
     } else if constexpr (Distance == 6) {
         uint32_t low;
         uint16_t high;
         std::memcpy(&low, p, 4);
         std::memcpy(&high, p + 4, 2);
-        bytes = _mm_cvtsi64_si128(int64_t(low | uint64_t(high) << 32));
+        return _mm_cvtsi64_si128(int64_t(low | uint64_t(high) << 32));
     } else {
-        bytes = _mm_loadl_epi64(reinterpret_cast<const __m128i *>(p));
+        return _mm_loadl_epi64(reinterpret_cast<const __m128i *>(p));
     }
-    return _mm_unpacklo_epi8(bytes, _mm_setzero_si128());
 }
 
-template <int Distance> void storePixel(uint8_t *p, __m128i wide)
+template <int Distance> void storeBytes(uint8_t *p, __m128i bytes)
 {
-    const __m128i bytes = _mm_packus_epi16(wide, wide);
     if constexpr (Distance <= 4) {
         const uint32_t value = uint32_t(_mm_cvtsi128_si32(bytes));
         std::memcpy(p, &value, Distance);
@@ -105,6 +102,16 @@ template <int Distance> void storePixel(uint8_t *p, __m128i wide)
         const uint64_t value = uint64_t(_mm_cvtsi128_si64(bytes));
         std::memcpy(p, &value, Distance);
     }
+}
+
+template <int Distance> __m128i loadPixel(const uint8_t *p)
+{
+    return _mm_unpacklo_epi8(loadBytes<Distance>(p), _mm_setzero_si128());
+}
+
+template <int Distance> void storePixel(uint8_t *p, __m128i wide)
+{
+    storeBytes<Distance>(p, _mm_packus_epi16(wide, wide));
 }
 
 inline __m128i absolute16(__m128i x)
@@ -132,13 +139,16 @@ template <int Distance> void unfilterSubPixels(uint8_t *row, qsizetype length)
     }
 }
 
+// With n = ~a carried from pixel to pixel, floor((a + b) / 2) is ~avg(n, ~b) (avg rounds
+// up) and the next n is avg(n, ~b) - x: two instructions from one pixel to the next.
 template <int Distance> void unfilterAveragePixels(uint8_t *row, const uint8_t *previous, qsizetype length)
 {
-    __m128i a = _mm_setzero_si128();
+    const __m128i ones = _mm_set1_epi8(-1);
+    __m128i notA = ones;
     for (qsizetype i = 0; i < length; i += Distance) {
-        const __m128i b = loadPixel<Distance>(previous + i);
-        a = wrap(_mm_add_epi16(loadPixel<Distance>(row + i), _mm_srli_epi16(_mm_add_epi16(a, b), 1)));
-        storePixel<Distance>(row + i, a);
+        const __m128i notB = _mm_xor_si128(loadBytes<Distance>(previous + i), ones);
+        notA = _mm_sub_epi8(_mm_avg_epu8(notA, notB), loadBytes<Distance>(row + i));
+        storeBytes<Distance>(row + i, _mm_xor_si128(notA, ones));
     }
 }
 

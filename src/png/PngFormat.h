@@ -1,5 +1,7 @@
 #pragma once
 
+#include "zelctl_export.h"
+
 #include <QByteArray>
 #include <QString>
 
@@ -61,7 +63,7 @@ inline int64_t rowBytes(int64_t pixels, int bitsPerPixel)
 
 // Bytes of the whole filtered stream (filter bytes included) for a header; 0 when any size
 // is out of range.
-int64_t inflatedSize(const Header &header);
+ZELCTL_EXPORT int64_t inflatedSize(const Header &header);
 
 // Everything a load gathers from the chunks. The header survives a reset (see StdPNG).
 struct FileInfo
@@ -77,7 +79,6 @@ struct FileInfo
     QByteArray textRecords;
     std::optional<std::array<uint8_t, 8>> timeBytes;
     uint8_t stdRgbIntent = 0;
-    QByteArray imageData; // the IDAT stream, still compressed
     bool headerSeen = false;
 };
 

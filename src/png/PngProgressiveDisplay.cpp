@@ -27,6 +27,14 @@ void blend(qint32 target, qint32 x, qint32 y, qint32 width, qint32 height, qint3
 
 } // namespace
 
+bool reachesTarget(qint32 dc, qint64 x, qint64 y, qint64 width, qint64 height)
+{
+    gdi::BITMAP target;
+    if (!gdi::GetObject(gdi::GetCurrentObject(dc, gdi::OBJ_BITMAP), target))
+        return false;
+    return width > 0 && height > 0 && x < target.bmWidth && y < target.bmHeight && x + width > 0 && y + height > 0;
+}
+
 ProgressiveDisplay::ProgressiveDisplay(qint32 targetDC, qint32 window, qint32 x, qint32 y, qint32 background)
     : m_target(targetDC)
     , m_window(window)
@@ -54,11 +62,12 @@ bool ProgressiveDisplay::start(const stdPNGdata &image)
     gdi::BITMAP target;
     if (!image.OwnDC() || !gdi::GetObject(gdi::GetCurrentObject(m_target, gdi::OBJ_BITMAP), target))
         return false;
+    // The image starts on the target, or the display does not start: the load paints it at the end.
+    if (m_x < 0 || m_y < 0 || m_x >= target.bmWidth || m_y >= target.bmHeight)
+        return false;
     const BitmapView bits = image.Bits();
     m_width = std::min(bits.width, target.bmWidth - m_x);
     m_height = std::min(bits.height, target.bmHeight - m_y);
-    if (m_width < 1 || m_height < 1 || m_x < 0 || m_y < 0)
-        return false;
     if (bits.bitCount != 32)
         return true; // opaque rows are copied straight to the target
 
@@ -111,7 +120,7 @@ void ProgressiveDisplay::paintWhole(
     const stdPNGdata &image, qint32 targetDC, qint32 window, qint32 x, qint32 y, quint8 opacity)
 {
     const BitmapView bits = image.Bits();
-    if (!targetDC || !image.OwnDC())
+    if (!targetDC || !image.OwnDC() || !reachesTarget(targetDC, x, y, bits.width, bits.height))
         return;
     if (bits.bitCount == 32)
         blend(targetDC, x, y, bits.width, bits.height, image.OwnDC(), 0, 0, opacity);

@@ -8,6 +8,10 @@ class stdPNGdata;
 
 namespace png {
 
+// True when the rectangle has pixels on the bitmap selected into dc: drawing wholly beside
+// it (or into a DC without one) has nothing to do.
+bool reachesTarget(qint32 dc, qint64 x, qint64 y, qint64 width, qint64 height);
+
 // Shows an image on a caller's DC while it decodes, and repaints the caller's window as it
 // goes. 32-bit images are laid over the target's own pixels (or over a background colour),
 // which are kept aside, so rows and passes can be blended again as they arrive.

@@ -14,6 +14,7 @@
 #include <QPointer>
 #include <QScreen>
 
+#include <cstring>
 #include <new>
 #include <optional>
 
@@ -46,6 +47,19 @@ bool isAlphaImage(const png::Header &header, const png::FileInfo &info)
     return header.colorType == png::GreyAlpha || header.colorType == png::Rgba || info.transparentColor != -1;
 }
 
+// Moves the parts of the compressed stream together at the front of a file no one else
+// holds, so that it is inflated at once without a copy.
+QByteArrayView joinInPlace(QByteArray &file, const std::vector<QByteArrayView> &parts)
+{
+    char *bytes = file.data();
+    qsizetype end = 0;
+    for (const QByteArrayView part : parts) {
+        std::memmove(bytes + end, part.data(), size_t(part.size()));
+        end += part.size();
+    }
+    return QByteArrayView(bytes, end);
+}
+
 } // namespace
 
 class StdPNG::Private
@@ -55,10 +69,9 @@ public:
         : q(owner)
     { }
 
-    bool load(const QByteArray &file, bool validateAllData, bool make32, quint8 alphaBlendValue);
+    bool load(QByteArray file, bool validateAllData, bool make32, quint8 alphaBlendValue);
     void reset();
     bool fail(const char *reason);
-    bool promisesMoreThanItHolds() const;
     void chooseDisplay(qint32 destinationDC, qint32 destinationHwnd);
     void chooseBackground();
     bool hidden() const { return stateFlags & PropertiesHidden; }
@@ -89,11 +102,6 @@ bool StdPNG::Private::fail(const char *reason)
     reset();
     failure = QString::fromLatin1(reason);
     return false;
-}
-
-bool StdPNG::Private::promisesMoreThanItHolds() const
-{
-    return png::inflatedSize(header) > (info.imageData.size() + 1) * maximumInflateRatio;
 }
 
 void StdPNG::Private::chooseDisplay(qint32 destinationDC, qint32 destinationHwnd)
@@ -149,11 +157,11 @@ void StdPNG::Private::chooseBackground()
     }
 }
 
-bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool make32, quint8 alphaBlendValue)
+bool StdPNG::Private::load(QByteArray file, bool validateAllData, bool make32, quint8 alphaBlendValue)
 {
     reset();
     failure.clear();
-    const png::ReadResult read = png::readChunks(file, validateAllData, header, info);
+    png::ReadResult read = png::readChunks(file, validateAllData, header, info);
     if (!read.ok)
         return fail(read.reason);
 
@@ -162,8 +170,18 @@ bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool ma
     Q_EMIT q->Progress(0);
     if (!alive)
         return false;
-    if (promisesMoreThanItHolds())
+    const int64_t inflatedSize = png::inflatedSize(header);
+    if (inflatedSize > (read.imageDataSize + 1) * maximumInflateRatio)
         return fail(png::reason::Inflate);
+    const bool whole = inflatedSize <= png::ImageStream::WholeLimit;
+    if (whole && read.imageData.size() > 1 && file.isDetached())
+        read.imageData = { joinInPlace(file, read.imageData) };
+    png::ImageStream stream(std::move(read.imageData), inflatedSize,
+        whole ? png::ImageStream::Mode::Whole : png::ImageStream::Mode::Streaming);
+    if (stream.failed())
+        return fail(png::reason::Inflate);
+    if (whole)
+        file = QByteArray(); // the bitmap takes its place
 
     if (make32 || alphaBlendValue < 255)
         stateFlags |= Want32Bits;
@@ -172,7 +190,9 @@ bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool ma
     qint32 x = 0;
     qint32 y = 0;
     if (progressiveMode < pngNeverProgressive) {
-        const QScreen *screen = qGuiApp ? QGuiApplication::primaryScreen() : nullptr;
+        // Decoding needs no GUI application (the command line tool makes a core one).
+        const bool gui = qobject_cast<QGuiApplication *>(QCoreApplication::instance());
+        const QScreen *screen = gui ? QGuiApplication::primaryScreen() : nullptr;
         const QSize screenSize = screen ? screen->size() : QSize();
         const bool useProgression = header.interlaced()
             || (header.height / 100) * (header.width / 100)
@@ -216,7 +236,6 @@ bool StdPNG::Private::load(const QByteArray &file, bool validateAllData, bool ma
         const bool fade = stateFlags & FadeInDisplay;
         observer.passConverted = [&, fade](int pass) { display->showPass(imageData, pass, fade); };
     }
-    png::ImageStream stream(info.imageData);
     const bool decoded = png::decodeImage(header, info, options, stream, imageData.Bits(), observer);
     // A Progress handler may have deleted this object.
     if (!alive)
@@ -257,10 +276,10 @@ bool StdPNG::LoadFile(const QString &FileName, bool ValidateAllData, bool Make32
         d->failure = QString::fromLatin1(png::reason::Unreadable);
         return false;
     }
-    const QByteArray bytes = file.readAll();
+    QByteArray bytes = file.readAll();
     if (file.error() != QFileDevice::NoError)
         return d->fail(png::reason::Unreadable);
-    return d->load(bytes, ValidateAllData, Make32Bit, AlphaBlendValue);
+    return d->load(std::move(bytes), ValidateAllData, Make32Bit, AlphaBlendValue);
 }
 
 bool StdPNG::LoadData(const QByteArray &file, bool ValidateAllData, bool Make32Bit, quint8 AlphaBlendValue)
@@ -472,7 +491,7 @@ void StdPNG::Paint(qint32 hdc, qint32 destX, qint32 destY, qint32 destCx, qint32
     pngCx = pngCx < 1 ? bits.width : pngCx;
     pngCy = pngCy < 1 ? bits.height : pngCy;
     const qint32 source = PngDC ? PngDC : image.OwnDC();
-    if (!source)
+    if (!source || !png::reachesTarget(hdc, destX, destY, destCx, destCy))
         return;
     const bool borrowed = source != image.OwnDC();
     const gdi::HGDIOBJ previous = borrowed ? gdi::SelectObject(source, image.BitmapHandle()) : 0;

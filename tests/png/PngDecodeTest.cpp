@@ -1,9 +1,13 @@
 #include "PngPixels.h"
 #include "PngTestFiles.h"
 
+#include "png/PngChunkReader.h"
+#include "png/PngConverter.h"
+#include "png/PngImageStream.h"
 #include "support/TestSupport.h"
 
 #include <QDir>
+#include <QTemporaryDir>
 
 #include <gtest/gtest.h>
 
@@ -63,25 +67,139 @@ void expectSamePixels(const ImageRecipe &recipe, bool make32)
     expectSameFilePixels(writeWithLibpng(recipe), describe(recipe), make32);
 }
 
+// Runs body at every vector level the processor has, from none (the per-pixel rules) up.
+template <typename Body> void atEverySimdLevel(Body body)
+{
+    const png::Simd best = png::simdLevel();
+    for (const png::Simd level : { png::Simd::None, png::Simd::Ssse3 }) {
+        if (level <= best) {
+            png::setSimdLevel(level);
+            body(level);
+        }
+    }
+    png::setSimdLevel(best);
+}
+
+std::vector<uint8_t> bitmapBytes(const StdPNG &image)
+{
+    const png::BitmapView bits = image.ImageData().Bits();
+    return std::vector<uint8_t>(bits.bits, bits.bits + image.ImageData().ImageSize());
+}
+
+// What the decoder alone makes of a file with the stream inflated at once or streamed.
+struct Decoded
+{
+    bool ok = false;
+    std::vector<uint8_t> bits;
+    QList<int> progress;
+    QList<int> shown; // first rows of the blocks, or passes
+    bool operator==(const Decoded &) const = default;
+};
+
+Decoded decodeWith(const QByteArray &file, png::ImageStream::Mode mode)
+{
+    png::Header header;
+    png::FileInfo info;
+    const png::ReadResult read = png::readChunks(file, true, header, info);
+    Decoded result;
+    if (!read.ok)
+        return result;
+    const png::DecodeOptions options;
+    const int bitCount = png::outputBitCount(header, info, options);
+    const qsizetype stride = png::bitmapStride(header.width, bitCount);
+    result.bits.resize(size_t(stride * header.height));
+    const png::BitmapView bitmap { result.bits.data(), header.width, header.height, stride, bitCount };
+    png::DecodeObserver observer;
+    observer.progress = [&](int percentage) {
+        result.progress.append(percentage);
+        return true;
+    };
+    observer.rowsConverted = [&](int32_t first, int32_t) { result.shown.append(first); };
+    observer.passConverted = [&](int pass) { result.shown.append(pass); };
+    png::ImageStream stream(read.imageData, png::inflatedSize(header), mode);
+    result.ok = !stream.failed() && png::decodeImage(header, info, options, stream, bitmap, observer);
+    return result;
+}
+
 } // namespace
 
 TEST(PngDecode, matchesLibpngForEveryFormatSizeAndInterlacing)
 {
-    uint32_t seed = 1;
-    for (const Format &format : formats) {
-        for (const auto &[width, height] : sizes) {
-            for (const bool interlaced : { false, true }) {
-                ImageRecipe recipe { width, height, format.colorType, format.bitDepth, interlaced, false, seed++ };
-                expectSamePixels(recipe, false);
-                if (width == 7) // 32 bits asked for: every format at one size
-                    expectSamePixels(recipe, true);
-                if (format.colorType <= 3) {
-                    recipe.withTransparency = true;
+    atEverySimdLevel([](png::Simd) {
+        uint32_t seed = 1;
+        for (const Format &format : formats) {
+            for (const auto &[width, height] : sizes) {
+                for (const bool interlaced : { false, true }) {
+                    ImageRecipe recipe { width, height, format.colorType, format.bitDepth, interlaced, false, seed++ };
                     expectSamePixels(recipe, false);
+                    if (width == 7 || width == 33) // 32 bits asked for: every format at two sizes
+                        expectSamePixels(recipe, true);
+                    if (format.colorType <= 3) {
+                        recipe.withTransparency = true;
+                        expectSamePixels(recipe, false);
+                    }
+                }
+            }
+        }
+    });
+}
+
+TEST(PngDecode, laysAlphaOnItsBackgroundAlikeAtEveryVectorLevel)
+{
+    // The vector kernels against the per-pixel rules, for the styles libpng has no
+    // counterpart of: a background colour, and alpha dropped.
+    const qint32 styles[] = { 0x336699, StdPNG::alphaNoBkgNoAlpha, StdPNG::alphaTransparent };
+    for (const Format format : { Format { 2, 8 }, { 2, 16 }, { 4, 8 }, { 4, 16 }, { 6, 8 }, { 6, 16 } }) {
+        for (const bool interlaced : { false, true }) {
+            const ImageRecipe recipe { 37, 9, format.colorType, format.bitDepth, interlaced, false, 5 };
+            const QByteArray file = writeWithLibpng(recipe);
+            for (const qint32 style : styles) {
+                for (const bool make32 : { false, true }) {
+                    std::vector<std::vector<uint8_t>> results;
+                    atEverySimdLevel([&](png::Simd) {
+                        StdPNG image;
+                        image.setTransparentStyle(style);
+                        ASSERT_TRUE(image.LoadData(file, true, make32));
+                        results.push_back(bitmapBytes(image));
+                    });
+                    EXPECT_EQ(results.front(), results.back()) << describe(recipe) << " style " << style;
                 }
             }
         }
     }
+}
+
+TEST(PngDecode, inflatesAtOnceOrStreamedToTheSamePixelsAndEvents)
+{
+    using Mode = png::ImageStream::Mode;
+    uint32_t seed = 3;
+    for (const Format &format : formats) {
+        for (const auto &[width, height] : { std::pair { 33, 17 }, std::pair { 20, 40 } }) {
+            for (const bool interlaced : { false, true }) {
+                const ImageRecipe recipe { width, height, format.colorType, format.bitDepth, interlaced, true, seed++ };
+                for (const qsizetype part : { qsizetype(1) << 20, qsizetype(7) }) {
+                    const QByteArray file = withImageDataSplit(writeWithLibpng(recipe), part);
+                    const Decoded whole = decodeWith(file, Mode::Whole);
+                    ASSERT_TRUE(whole.ok) << describe(recipe);
+                    ASSERT_EQ(decodeWith(file, Mode::Streaming), whole) << describe(recipe) << " parts " << part;
+                }
+            }
+        }
+    }
+
+    // StdPNG joins the parts of a file it read itself in place, and copies those of a caller's.
+    const QByteArray file = withImageDataSplit(writeWithLibpng({ 40, 30, 6, 16, false, false, 8 }), 100);
+    QTemporaryDir folder;
+    const QString path = folder.filePath("parts.png");
+    QFile out(path);
+    ASSERT_TRUE(out.open(QIODevice::WriteOnly) && out.write(file) == file.size());
+    out.close();
+    StdPNG fromDisk;
+    StdPNG fromMemory;
+    ASSERT_TRUE(fromDisk.LoadFile(path));
+    ASSERT_TRUE(fromMemory.LoadData(file));
+    EXPECT_EQ(bitmapBytes(fromDisk), bitmapBytes(fromMemory));
+    expectSameFilePixels(file, "parts of 100 bytes", false);
 }
 
 TEST(PngDecode, matchesLibpngOnTheFuzzSeeds)
@@ -126,21 +244,6 @@ TEST(PngDecode, choosesTheBitmapFormatOfEachImage)
         EXPECT_EQ(image.ImageData().ColorTable().size(), row.tableSize) << describe(recipe);
         EXPECT_EQ(image.ScanLineWidth(), ((10 * row.bitCount + 31) & ~31) / 8) << describe(recipe);
     }
-}
-
-TEST(PngDecode, premultipliesSixteenBitRgbaFromTheFirstBytes)
-{
-    // One pixel R 0xFFFF, G 0x0000, B 0x8000, A 0x8000.
-    const QByteArray rows = QByteArray::fromHex("00"
-                                                "ffff"
-                                                "0000"
-                                                "8000"
-                                                "8000");
-    const QByteArray file = signature() + ihdr(1, 1, 16, 6) + chunk("IDAT", deflate(rows)) + chunk("IEND", {});
-    StdPNG image;
-    image.setTransparentStyle(StdPNG::alphaTransparent);
-    ASSERT_TRUE(image.LoadData(file));
-    EXPECT_EQ(bitmapPixel(image, 0, 0), (std::array<uint8_t, 4> { 0x40, 0x00, 0x80, 0x80 }));
 }
 
 TEST(PngDecode, restoresEveryFilterAtEveryPixelSize)
@@ -196,13 +299,21 @@ TEST(PngDecode, acceptsOnlyAWholeStreamOfTheHeadersLength)
     for (int y = 0; y < 4; ++y)
         rows += QByteArray(1, '\0') + QByteArray(4, char(y));
     const auto load = [](const QByteArray &stream) {
+        const QByteArray file = signature() + ihdr(4, 4, 8, 0) + chunk("IDAT", stream) + chunk("IEND", {});
         StdPNG image;
-        const bool loaded = image.LoadData(signature() + ihdr(4, 4, 8, 0) + chunk("IDAT", stream) + chunk("IEND", {}));
+        const bool loaded = image.LoadData(file);
         EXPECT_EQ(image.ImageData().HasBitmap(), loaded);
+        // Inflated at once or streamed, in one part or in parts of 3 bytes, the stream is
+        // taken or refused alike.
+        for (const QByteArray &parts : { file, withImageDataSplit(file, 3) }) {
+            EXPECT_EQ(decodeWith(parts, png::ImageStream::Mode::Whole).ok, loaded);
+            EXPECT_EQ(decodeWith(parts, png::ImageStream::Mode::Streaming).ok, loaded);
+        }
         return loaded ? QStringLiteral("loaded") : image.FailureReason();
     };
     const QString broken = QStringLiteral("Failed to decompress image data.");
     EXPECT_EQ(load(deflate(rows)), "loaded");
+    EXPECT_EQ(load(deflate(rows) + "after the end"), "loaded");
     EXPECT_EQ(load(deflate(rows.left(15))), broken); // short
     EXPECT_EQ(load(deflate(rows + QByteArray(5, '\0'))), broken); // a row too many
     QByteArray badChecksum = deflate(rows);
@@ -234,4 +345,9 @@ TEST(PngDecode, reportsProgressAfterEachSixteenRowsAndAtTheEnd)
     values.clear();
     ASSERT_TRUE(image.LoadData(writeWithLibpng({ 1, 8, 0, 8, true, false, 1 })));
     EXPECT_EQ(values, (QList<int> { 0, 1 * 100 / 7, 3 * 100 / 7, 5 * 100 / 7, 100 }));
+
+    // A one-row image has no pass 7 (nor 3 and 5); the decoding still ends at 100.
+    values.clear();
+    ASSERT_TRUE(image.LoadData(writeWithLibpng({ 9, 1, 0, 8, true, false, 1 })));
+    EXPECT_EQ(values, (QList<int> { 0, 1 * 100 / 7, 2 * 100 / 7, 4 * 100 / 7, 6 * 100 / 7, 100 }));
 }

@@ -10,6 +10,8 @@
 
 #include <gtest/gtest.h>
 
+#include <climits>
+
 using namespace zelctl;
 using namespace zelctl::test;
 using gdi::test::TestBitmap;
@@ -136,6 +138,51 @@ TEST(PngPaint, drawsNothingWithoutWhatItNeeds)
     QObject::connect(&image, &StdPNG::Progress, [&](qint32) { image.Paint(target.dc, 0, 0); });
     ASSERT_TRUE(image.LoadData(rgbFile(4, 4)));
     EXPECT_EQ(target.argb(3, 3), 0u);
+}
+
+TEST(PngPaint, drawsNothingWhollyBesideTheTarget)
+{
+    static constexpr quint32 untouched = 0xFF123456u;
+    const auto expectUntouched = [](const TestBitmap &target, const std::string &what) {
+        for (int y = 0; y < 10; ++y) {
+            for (int x = 0; x < 10; ++x)
+                ASSERT_EQ(target.argb(x, y), untouched) << what << " at " << x << "," << y;
+        }
+    };
+    // Left, right, above and below the 10 × 10 target, and at the ends of the coordinates.
+    const QPoint places[] = { { -40, 2 }, { 10, 2 }, { 2, -40 }, { 2, 10 }, { INT_MIN, 0 }, { INT_MAX, 0 },
+        { 0, INT_MIN }, { 0, INT_MAX } };
+    struct Bitmap
+    {
+        QByteArray file;
+        bool make32;
+        int bitCount;
+    };
+    const Bitmap bitmaps[] = { { greyFile(4, 4), false, 8 }, { rgbFile(4, 4), false, 24 }, { rgbFile(4, 4), true, 32 },
+        { rgbaFile(), false, 32 }, { writeWithLibpng({ 12, 12, 6, 8, true, false, 4 }), false, 32 } };
+    TestBitmap target(10, 10, 32);
+    RecordingWindow window;
+    for (const Bitmap &bitmap : bitmaps) {
+        for (const QPoint place : places) {
+            const std::string what = std::to_string(bitmap.bitCount) + " bits at " + std::to_string(place.x()) + ","
+                + std::to_string(place.y());
+            target.fill(untouched, 10, 32);
+            StdPNG image;
+            image.setTransparentStyle(StdPNG::alphaTransparent);
+            ASSERT_TRUE(image.LoadData(bitmap.file, true, bitmap.make32));
+            ASSERT_EQ(image.BitCount_BMP(), bitmap.bitCount);
+            image.Paint(target.dc, place.x(), place.y());
+            image.Paint(target.dc, place.x(), place.y(), 30, 30);
+            expectUntouched(target, what);
+
+            // The progressive display, started beside its target, shows nothing either.
+            StdPNG shown;
+            shown.setTransparentStyle(StdPNG::alphaTransparent);
+            drawProgressivelyInto(shown, &target, &window, place);
+            ASSERT_TRUE(shown.LoadData(bitmap.file, true, bitmap.make32)) << what;
+            expectUntouched(target, "progressive, " + what);
+        }
+    }
 }
 
 TEST(PngPaint, worksWithoutItsOwnDcThroughTheCallersDc)

@@ -51,6 +51,9 @@ QByteArray ihdr(
 QByteArray deflate(const QByteArray &rows);
 QByteArray be32(uint32_t value);
 
+// The same file with its image data in IDAT chunks of partSize bytes (the last one shorter).
+QByteArray withImageDataSplit(const QByteArray &file, qsizetype partSize);
+
 // A complete grey 8-bit file of width × height pixels whose row y holds the value y + x,
 // every row with filter type `filter` (0 gives the stored values).
 QByteArray greyFile(int width, int height, const QByteArray &extraChunks = {}, uint8_t filter = 0);
