@@ -6,8 +6,8 @@
 #include "platform/gdi/Pictures.h"
 #include "png/StdPNG.h"
 
+#include <QBuffer>
 #include <QPainter>
-#include <QTemporaryDir>
 
 namespace zelctl::snapshots {
 
@@ -31,12 +31,11 @@ QByteArray pngWithAlpha()
     painter.drawEllipse(QPointF(20, 20), 18, 18);
     painter.fillRect(QRect(24, 24, 20, 20), QColor(20, 60, 200, 128));
     painter.end();
-    QTemporaryDir dir;
-    const QString file = dir.filePath(QStringLiteral("alpha.png"));
-    image.save(file, "PNG");
-    QFile read(file);
-    read.open(QIODevice::ReadOnly);
-    return read.readAll();
+    QByteArray file;
+    QBuffer out(&file);
+    out.open(QIODevice::WriteOnly);
+    image.save(&out, "PNG");
+    return file;
 }
 
 // A checkerboard, so what the picture leaves see-through shows.

@@ -13,7 +13,7 @@ Stage::Stage(QSize size)
     m_form.resize(size);
 }
 
-void Stage::ensureShown()
+void Stage::show()
 {
     // Shown once the controls are on it, so they are shown with it.
     if (m_form.isVisible())
@@ -47,7 +47,7 @@ void Stage::settle()
 
 void Stage::hover(QWidget *control, QPoint at)
 {
-    ensureShown();
+    show();
     // Two moves: the first one enters, the second one is a move on the control.
     QTest::mouseMove(control, at - QPoint(1, 0));
     QTest::mouseMove(control, at);
@@ -74,7 +74,7 @@ QImage Stage::shoot(const QWidget *control, int margin)
 
 QImage Stage::shoot(const QRect &area)
 {
-    ensureShown();
+    show();
     settle();
     return m_form.grab(area & m_form.rect()).toImage().convertToFormat(QImage::Format_RGB32);
 }

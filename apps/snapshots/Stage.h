@@ -23,6 +23,9 @@ public:
 
     QWidget *form() { return &m_form; }
 
+    // Shows the form with the controls put on it so far (acting on them shows it too).
+    void show();
+
     // Lets pending events (layout, timers at 0, repaints) run.
     static void settle();
 
@@ -37,8 +40,6 @@ public:
     QImage shoot(const QRect &area);
 
 private:
-    void ensureShown();
-
     QWidget m_form;
     bool m_pressed = false;
 };

@@ -32,7 +32,7 @@ QImage balloon(const Balloon &shape)
     Stage stage(QSize(200, 60));
     auto *tool = new QWidget(stage.form());
     tool->setGeometry(20, 20, 24, 24);
-    stage.shoot(tool);
+    stage.show();
     clsBalloonTip tip;
     tip.setMvarParentControlhwnd(platform::handleOf(tool));
     tip.setStyle(shape.style);
