@@ -34,14 +34,19 @@ class ZELCTL_EXPORT CommandButton : public QPushButton
     Q_PROPERTY(int Width READ Width WRITE setWidth)
     Q_PROPERTY(int Height READ Height WRITE setHeight)
     Q_PROPERTY(quint32 ForeColor READ ForeColor WRITE setForeColor)
+    Q_PROPERTY(qint32 ButtonStyle READ ButtonStyle WRITE setButtonStyle)
+    Q_PROPERTY(qint32 BevelWidth READ BevelWidth WRITE setBevelWidth)
 
 public:
     explicit CommandButton(QWidget *parent = nullptr);
     ~CommandButton() override;
 
-    // The text; "&" marks the access key ("&OK" is pressed with Alt+O).
-    QString Caption() const { return text(); }
-    void setCaption(const QString &caption) { setText(caption); }
+    // The text; "&" marks the access key ("&OK" is pressed with Alt+O). A caption set in a
+    // symbol font the system lacks shows the symbols it stands for (platform::symbolFonts);
+    // one too long for the button is cut short with "…" and shown whole as the tooltip
+    // while the button has no tooltip of its own.
+    QString Caption() const;
+    void setCaption(const QString &caption);
 
     QString ToolTip() const { return toolTip(); }
 
@@ -76,6 +81,17 @@ public:
     quint32 ForeColor() const;
     void setForeColor(quint32 color);
 
+    // How the button is drawn: FlatStyle without a frame until pressed, any other value as
+    // a raised push button (the default, 0).
+    static constexpr qint32 FlatStyle = 5;
+    qint32 ButtonStyle() const;
+    void setButtonStyle(qint32 style);
+
+    // Width in pixels of a raised edge drawn just inside the button's border, light on the
+    // top and left, dark on the bottom and right; 0 (the default) for none.
+    qint32 BevelWidth() const;
+    void setBevelWidth(qint32 pixels);
+
     int Left() const;
     int Top() const;
     int Width() const;
@@ -90,6 +106,9 @@ public:
     // Redraws the button now.
     Q_INVOKABLE void Refresh();
 
+    // Room for the whole caption, whether it is shown cut short or not.
+    QSize sizeHint() const override;
+
 Q_SIGNALS:
     void Click(int Index);
     void DblClick(int Index);
@@ -100,6 +119,10 @@ Q_SIGNALS:
     void MouseHover(bool Hovering);
 
 protected:
+    bool event(QEvent *event) override;
+    void changeEvent(QEvent *event) override;
+    void resizeEvent(QResizeEvent *event) override;
+    void paintEvent(QPaintEvent *event) override;
     void enterEvent(QEnterEvent *event) override;
     void leaveEvent(QEvent *event) override;
     void mouseDoubleClickEvent(QMouseEvent *event) override;
@@ -108,6 +131,11 @@ protected:
 private:
     friend class CommandButtonArray;
     void setIndex(int index);
+    // The caption as drawn, symbols mapped; and the size a push button takes for a text.
+    QString wholeCaption() const;
+    QSize sizeFor(const QString &text) const;
+    // Puts the caption as shown (mapped, cut to the width) on the push button.
+    void showCaption();
 
     std::unique_ptr<class CommandButtonPrivate> const d;
 };

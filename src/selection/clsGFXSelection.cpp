@@ -10,6 +10,8 @@
 #include "platform/ModalPresenter.h"
 #include "platform/OleColor.h"
 #include "platform/WindowHandles.h"
+#include "platform/gdi/Gdi.h"
+#include "platform/gdi/Pictures.h"
 #include "png/StdPNG.h"
 
 #include <QGuiApplication>
@@ -84,23 +86,30 @@ QRect keptOnScreen(QRect place, const modFuncs::RECT &parent)
     return place;
 }
 
-// The item's image painted at its own size on the form's off-screen surface; null when there
-// is no image or the file is not a PNG that can be read.
-Picture itemPicture(frmSelector &form, const QString &path)
+// The item's image at its own size, with its transparency, so it shows on the button's
+// own background whatever that is; null when there is no image or the file is not a PNG
+// that can be read.
+Picture itemPicture(const QString &path)
 {
     if (path.isEmpty())
         return {};
     StdPNG png;
-    if (!png.LoadFile(path, true, false, 255) || png.Width() < 1 || png.Height() < 1)
+    png.setTransparentStyle(StdPNG::alphaTransparent);
+    if (!png.LoadFile(path, true, true, 255) || png.Width() < 1 || png.Height() < 1)
         return {};
-    gdi::SurfaceWidget &tmpPic = form.tmpPic();
-    tmpPic.resize(png.Width(), png.Height());
-    // The surface cannot always grow that large; then the image is not shown.
-    if (tmpPic.surface().size() != QSize(png.Width(), png.Height()))
+    QImage clear(png.Width(), png.Height(), QImage::Format_ARGB32_Premultiplied);
+    if (clear.isNull())
         return {};
-    tmpPic.surface().clear(0xFFFFFF);
-    png.Paint(tmpPic.surface().hdc(), 0, 0);
-    return Picture(tmpPic.surface().image());
+    clear.fill(Qt::transparent);
+    const gdi::HBITMAP bitmap = gdi::createBitmapFromImage(clear);
+    const gdi::HDC dc = gdi::CreateCompatibleDC(0);
+    const gdi::HGDIOBJ previous = gdi::SelectObject(dc, bitmap);
+    png.Paint(dc, 0, 0);
+    gdi::SelectObject(dc, previous);
+    gdi::DeleteDC(dc);
+    const QImage image = gdi::imageFromBitmap(bitmap);
+    gdi::DeleteObject(bitmap);
+    return image.isNull() ? Picture() : Picture(image);
 }
 
 void setBackground(QWidget &form, const QColor &color)
@@ -164,6 +173,8 @@ GFXResult clsGFXSelection::SelectFrom(const GFXSelection &s, const QList<GFXItem
     }
 
     if (session.form) {
+        if (!s.Title.isEmpty())
+            form.setWindowTitle(s.Title);
         auto *title = form.findChild<QLabel *>(QStringLiteral("lblTITLE"));
         title->setText(s.Title);
         title->setVisible(!s.Title.isEmpty());
@@ -171,6 +182,7 @@ GFXResult clsGFXSelection::SelectFrom(const GFXSelection &s, const QList<GFXItem
         subtitle->setText(s.Subtitle);
         subtitle->setVisible(!s.Subtitle.isEmpty());
 
+        bool focused = false;
         for (int index = 0; index < Items.size(); ++index) {
             const GFXItem &item = Items.at(index);
             CommandButton *button = index == 0 ? form.btnSelector()(0) : form.btnSelector().Load(index);
@@ -181,11 +193,16 @@ GFXResult clsGFXSelection::SelectFrom(const GFXSelection &s, const QList<GFXItem
             button->setValue(pressed);
             if (pressed)
                 session.pressed = index;
-            button->setDefault(item.Default);
             button->setEnabled(!item.Disabled);
             button->setTag(QString::number(index));
-            button->setPicture(itemPicture(form, item.Image.toString()));
+            button->setPicture(itemPicture(item.Image.toString()));
             button->show();
+            // OK stays the default button: the default item starts with the focus, so Enter
+            // chooses it.
+            if (item.Default && !focused) {
+                button->setFocus(Qt::OtherFocusReason);
+                focused = true;
+            }
         }
         form.btn_Handle()(0)->show();
         form.btn_Handle()(1)->setVisible(!s.DisableCancel);
@@ -234,10 +251,14 @@ void clsGFXSelection::OnSelectorEvent(QObject *source, const QString &eventName,
     }
 
     const bool click = eventName == QLatin1String("Click");
-    const bool doubleClick = eventName == QLatin1String("DoubleClick");
+    // Enter on an item chooses it and accepts, as a double click does.
+    const bool enter = eventName == QLatin1String("KeyDown")
+        && value.toString().section(QLatin1Char(','), 0, 0) == QLatin1String("13");
+    const bool doubleClick = eventName == QLatin1String("DoubleClick") || enter;
     if (!click && !doubleClick)
         return;
-    const int index = value.toInt();
+    auto *sourceButton = qobject_cast<CommandButton *>(source);
+    const int index = enter ? (sourceButton ? sourceButton->Tag().toInt() : -1) : value.toInt();
     CommandButton *button = form.btnSelector()(index);
     if (!button || index >= session->items.size() || !button->isEnabled())
         return;

@@ -27,10 +27,12 @@ public:
     explicit clsGFXSelection(QObject *parent = nullptr);
     ~clsGFXSelection() override;
 
-    // Shows one button per item and returns the user's choice: OK gives Accepted with the
-    // pressed item (none when nothing was pressed), a double click on an item chooses it and
-    // accepts, Cancel, Escape or the close box give Canceled. With no items no dialog is
-    // shown and every field of the result is empty.
+    // Shows one button per item, with its image (a PNG, drawn with its transparency), and
+    // returns the user's choice: OK (or Enter) gives Accepted with the pressed item (none
+    // when nothing was pressed), a double click or Enter on an item chooses it and accepts,
+    // Cancel, Escape or the close box give Canceled. s.Title is also the window's title. The
+    // item marked Default starts with the focus. With no items no dialog is shown and every
+    // field of the result is empty.
     Q_INVOKABLE zelctl::GFXResult SelectFrom(const zelctl::GFXSelection &s, const QList<zelctl::GFXItem> &Items);
 
     // How the items would be shown: always as buttons.

@@ -28,7 +28,8 @@ enum Column { NameColumn = 0, CodeColumn = 1, NumberColumn = 2 };
 // The list item's tag: the country's numeric code.
 constexpr int NumberRole = Qt::UserRole;
 
-constexpr int ListBottomGap = platform::pixelsFromTwips(15);
+// Between the list, the buttons and the form's edges.
+constexpr int Gap = platform::pixelsFromTwips(90);
 
 bool listNames(const QString &list, const QString &code)
 {
@@ -108,15 +109,15 @@ frmSelectCountry::frmSelectCountry(QWidget *parent)
     d->cList->setColumnWidth(NumberColumn, 60);
     connect(d->cList, &QTreeWidget::itemDoubleClicked, this, [this] { acceptSelected(); });
 
-    // The list covers the form; the buttons lie under it, out of sight, and serve Enter and
-    // Escape.
+    // OK and Cancel under the list, at the bottom right; Enter and Escape press them.
     d->buttons = new CommandButtonArray(QStringLiteral("TRU_CommandButton1"), this, 2);
     (*d->buttons)(0)->setCaption(QStringLiteral("&OK"));
     (*d->buttons)(0)->setDefault(true);
     (*d->buttons)(1)->setCaption(QStringLiteral("&Cancelar"));
-    // Tab must not move the focus out of sight.
-    (*d->buttons)(0)->setFocusPolicy(Qt::NoFocus);
-    (*d->buttons)(1)->setFocusPolicy(Qt::NoFocus);
+    for (int index = 0; index < 2; ++index) {
+        (*d->buttons)(index)->setWidth(1215);
+        (*d->buttons)(index)->setHeight(375);
+    }
     connect(d->buttons, &CommandButtonArray::Click, this, [this](int index) {
         if (index == 0)
             acceptSelected();
@@ -260,12 +261,12 @@ void frmSelectCountry::Unload()
 void frmSelectCountry::resizeEvent(QResizeEvent *event)
 {
     QDialog::resizeEvent(event);
-    d->cList->setGeometry(0, 0, width(), std::max(height() - ListBottomGap, 0));
-    // Out of sight below the list, where Enter and Escape still reach them.
     CommandButton *ok = (*d->buttons)(0);
     CommandButton *cancelButton = (*d->buttons)(1);
-    ok->move(width() - 2 * ok->width(), height());
-    cancelButton->move(ok->x() + ok->width(), height());
+    const int buttonsTop = height() - Gap - ok->height();
+    d->cList->setGeometry(0, 0, width(), std::max(buttonsTop - Gap, 0));
+    cancelButton->move(width() - Gap - cancelButton->width(), buttonsTop);
+    ok->move(cancelButton->x() - Gap / 2 - ok->width(), buttonsTop);
 }
 
 } // namespace zelctl

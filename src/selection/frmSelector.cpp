@@ -10,8 +10,13 @@
 
 #include <QApplication>
 #include <QEventLoop>
+#include <QKeyEvent>
 #include <QLabel>
+#include <QLineEdit>
 #include <QPointer>
+#include <QScrollArea>
+#include <QScrollBar>
+#include <QStyle>
 #include <QTimer>
 
 #include <algorithm>
@@ -34,6 +39,28 @@ QRect pixelsOf(const QRect &twips)
 {
     return { pixelsFromTwips(twips.left()), pixelsFromTwips(twips.top()), pixelsFromTwips(twips.width()),
         pixelsFromTwips(twips.height()) };
+}
+
+// A title folded for a search: lower case, without accents ("Federação" → "federacao").
+QString folded(const QString &text)
+{
+    QString plain;
+    for (const QChar c : text.normalized(QString::NormalizationForm_D))
+        if (c.category() != QChar::Mark_NonSpacing)
+            plain.append(c);
+    return plain.toCaseFolded();
+}
+
+// The width that shows nine captions in ten whole; the longest few are cut short.
+int captionWidth(const QList<CommandButton *> &buttons)
+{
+    if (buttons.isEmpty())
+        return 0;
+    QList<int> widths;
+    for (const CommandButton *button : buttons)
+        widths.append(button->sizeHint().width());
+    std::sort(widths.begin(), widths.end());
+    return twipsFromPixels(widths.at(int(std::ceil(widths.size() * 0.9)) - 1));
 }
 
 QLabel *makeLabel(const QString &name, QWidget *form, int heightTwips, double pointScale, bool bold)
@@ -60,9 +87,20 @@ public:
     QString tag;
     QLabel *lblTITLE = nullptr;
     QLabel *lblSUBTITLE = nullptr;
+    QLineEdit *txtFilter = nullptr;
+    QScrollArea *grid = nullptr;
     CommandButtonArray *btnSelector = nullptr;
     CommandButtonArray *btn_Handle = nullptr;
-    gdi::SurfaceWidget *tmpPic = nullptr;
+
+    // The item buttons the filter lets through, in index order.
+    QList<CommandButton *> shownItems() const
+    {
+        QList<CommandButton *> shown;
+        for (int index = 0; index <= btnSelector->UBound(); ++index)
+            if (CommandButton *button = (*btnSelector)(index); button && !button->isHidden())
+                shown.append(button);
+        return shown;
+    }
 };
 
 frmSelector::frmSelector(QWidget *parent)
@@ -77,7 +115,25 @@ frmSelector::frmSelector(QWidget *parent)
     d->lblTITLE = makeLabel(QStringLiteral("lblTITLE"), this, 450, 1.3, true);
     d->lblSUBTITLE = makeLabel(QStringLiteral("lblSUBTITLE"), this, 300, 1.0, false);
 
-    d->btnSelector = new CommandButtonArray(QStringLiteral("btnSelector"), this, 1);
+    d->txtFilter = new QLineEdit(this);
+    d->txtFilter->setObjectName(QStringLiteral("txtFilter"));
+    d->txtFilter->setPlaceholderText(QStringLiteral("Escreva para procurar"));
+    d->txtFilter->setClearButtonEnabled(true);
+    d->txtFilter->hide();
+    d->txtFilter->installEventFilter(this);
+    connect(d->txtFilter, &QLineEdit::textChanged, this, &frmSelector::applyFilter);
+
+    // The item buttons lie on a pane that scrolls when they do not all fit.
+    d->grid = new QScrollArea(this);
+    d->grid->setObjectName(QStringLiteral("grid"));
+    d->grid->setFrameShape(QFrame::NoFrame);
+    d->grid->setHorizontalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
+    d->grid->viewport()->setAutoFillBackground(false);
+    auto *pane = new QWidget;
+    pane->setObjectName(QStringLiteral("gridPane"));
+    d->grid->setWidget(pane);
+
+    d->btnSelector = new CommandButtonArray(QStringLiteral("btnSelector"), pane, 1);
     CommandButton *model = (*d->btnSelector)(0);
     model->setCaption(QStringLiteral("lblButton"));
     // Items are a single choice; a pressed button shows the current one.
@@ -92,11 +148,16 @@ frmSelector::frmSelector(QWidget *parent)
         send(button, QStringLiteral("DoubleClick"), button ? button->Tag().toInt() : 0);
     });
     connect(d->btnSelector, &CommandButtonArray::KeyDown, this, [this](int index, int &keyCode, int shift) {
+        const QPointer<frmSelector> alive(this);
         send((*d->btnSelector)(index), QStringLiteral("KeyDown"), QStringLiteral("%1,%2").arg(keyCode).arg(shift));
+        // A key that closed the dialog has done its work; the button must not act on it too.
+        if (!alive || !isVisible())
+            keyCode = 0;
     });
 
     d->btn_Handle = new CommandButtonArray(QStringLiteral("btn_Handle"), this, 2);
     (*d->btn_Handle)(0)->setCaption(QStringLiteral("&OK"));
+    (*d->btn_Handle)(0)->setDefault(true);
     (*d->btn_Handle)(1)->setCaption(QStringLiteral("&Cancelar"));
     for (int index = 0; index < 2; ++index) {
         CommandButton *button = (*d->btn_Handle)(index);
@@ -108,10 +169,7 @@ frmSelector::frmSelector(QWidget *parent)
         send((*d->btn_Handle)(index), index == 0 ? QStringLiteral("OK") : QStringLiteral("CANCEL"));
     });
 
-    d->tmpPic = new gdi::SurfaceWidget(this);
-    d->tmpPic->setObjectName(QStringLiteral("tmpPic"));
-    d->tmpPic->hide();
-
+    setWindowTitle(QStringLiteral("Seleção"));
     resize(pixelsFromTwips(7500), pixelsFromTwips(5400));
 }
 
@@ -152,43 +210,57 @@ CommandButtonArray &frmSelector::btn_Handle() const
     return *d->btn_Handle;
 }
 
-gdi::SurfaceWidget &frmSelector::tmpPic() const
-{
-    return *d->tmpPic;
-}
-
 void frmSelector::ReArrange()
 {
     if (d->tag == DisableEvents)
         return;
     CommandButton *ok = (*d->btn_Handle)(0);
     CommandButton *cancel = (*d->btn_Handle)(1);
+    const QList<CommandButton *> items = d->shownItems();
+    d->txtFilter->setVisible(d->btnSelector->Count() > FilterThreshold);
+
     selectorLayout::Metrics metrics;
     metrics.innerWidth = twipsFromPixels(width());
     metrics.innerHeight = twipsFromPixels(height());
     metrics.okWidth = ok->Width();
     metrics.okHeight = ok->Height();
+    metrics.cancelVisible = !cancel->isHidden();
     metrics.titleVisible = !d->lblTITLE->isHidden();
     metrics.titleHeight = twipsFromPixels(d->lblTITLE->height());
     metrics.subtitleVisible = !d->lblSUBTITLE->isHidden();
     metrics.subtitleHeight = twipsFromPixels(d->lblSUBTITLE->height());
-    metrics.itemCount = d->btnSelector->UBound() + 1;
+    metrics.filterVisible = !d->txtFilter->isHidden();
+    metrics.itemCount = int(items.size());
+    metrics.captionWidth = captionWidth(items);
+    metrics.scrollBarWidth = twipsFromPixels(style()->pixelMetric(QStyle::PM_ScrollBarExtent, nullptr, d->grid));
 
     const selectorLayout::Layout layout = selectorLayout::arrange(metrics);
     d->lblTITLE->setGeometry(pixelsOf(layout.title));
     d->lblSUBTITLE->setGeometry(pixelsOf(layout.subtitle));
+    d->txtFilter->setGeometry(pixelsOf(layout.filter));
     ok->Move(layout.ok.left(), layout.ok.top());
     cancel->Move(layout.cancel.left(), layout.cancel.top());
+    d->grid->setGeometry(pixelsOf(layout.grid));
+    d->grid->setVerticalScrollBarPolicy(layout.scrolls ? Qt::ScrollBarAlwaysOn : Qt::ScrollBarAlwaysOff);
     if (!layout.itemsPlaced)
         return;
-    for (int index = 0; index < layout.items.size(); ++index) {
-        CommandButton *button = (*d->btnSelector)(index);
-        if (!button)
-            continue;
-        const QRect &place = layout.items.at(index);
-        button->Move(place.left(), place.top(), place.width(), place.height());
-        button->Refresh();
+    d->grid->widget()->resize(pixelsFromTwips(layout.content.width()), pixelsFromTwips(layout.content.height()));
+    const QPoint origin = layout.grid.topLeft();
+    for (int i = 0; i < items.size(); ++i) {
+        const QRect place = layout.items.at(i).translated(-origin);
+        items[i]->Move(place.left(), place.top(), place.width(), place.height());
+        items[i]->Refresh();
     }
+}
+
+void frmSelector::applyFilter(const QString &text)
+{
+    const QString wanted = folded(text.trimmed());
+    for (int index = 0; index <= d->btnSelector->UBound(); ++index)
+        if (CommandButton *button = (*d->btnSelector)(index))
+            button->setVisible(folded(button->Caption()).contains(wanted));
+    d->grid->verticalScrollBar()->setValue(0);
+    ReArrange();
 }
 
 void frmSelector::ZoomForm(const modFuncs::RECT &from, const modFuncs::RECT &to)
@@ -243,6 +315,38 @@ void frmSelector::reject()
         send((*d->btn_Handle)(1), QStringLiteral("CANCEL"));
     else
         QDialog::reject();
+}
+
+bool frmSelector::eventFilter(QObject *watched, QEvent *event)
+{
+    if (watched != d->txtFilter || event->type() != QEvent::KeyPress)
+        return QDialog::eventFilter(watched, event);
+    const auto *key = static_cast<QKeyEvent *>(event);
+    const QList<CommandButton *> items = d->shownItems();
+    if ((key->key() == Qt::Key_Return || key->key() == Qt::Key_Enter) && items.size() == 1
+        && items.first()->isEnabled()) {
+        // The only item left is the one wanted.
+        send(items.first(), QStringLiteral("DoubleClick"), items.first()->Tag().toInt());
+        return true;
+    }
+    if (key->key() == Qt::Key_Down && !items.isEmpty()) {
+        items.first()->setFocus(Qt::TabFocusReason);
+        return true;
+    }
+    return QDialog::eventFilter(watched, event);
+}
+
+void frmSelector::keyPressEvent(QKeyEvent *event)
+{
+    // Typing on an item searches the list, when it has a filter box.
+    const QString text = event->text();
+    if (!d->txtFilter->isHidden() && !text.isEmpty() && text.at(0).isPrint()
+        && !(event->modifiers() & (Qt::ControlModifier | Qt::AltModifier))) {
+        d->txtFilter->setFocus(Qt::ShortcutFocusReason);
+        d->txtFilter->insert(text);
+        return;
+    }
+    QDialog::keyPressEvent(event);
 }
 
 void frmSelector::resizeEvent(QResizeEvent *event)

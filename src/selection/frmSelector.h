@@ -3,7 +3,6 @@
 #include "zelctl_export.h"
 
 #include "common/modFuncs.h"
-#include "platform/gdi/PersistentSurface.h"
 
 #include <QDialog>
 #include <QString>
@@ -20,6 +19,12 @@ class CommandButtonArray;
 // a grid of item buttons (btnSelector), and "&OK" and "&Cancelar" (btn_Handle) at the bottom
 // right. What the user does is reported to the owner, which decides whether the dialog
 // closes: it sets Tag and the close request, and the form then hides itself.
+//
+// Every item stays within reach: items that do not fit the grid scroll, and a long list
+// gets a filter box (txtFilter) above the grid that keeps the items whose title holds the
+// typed text, whatever its case and accents; typing on an item types there. OK is the
+// default button, Enter on an item is reported as a key down (the owner chooses the item
+// and accepts, as for a double click), and Escape cancels.
 class ZELCTL_EXPORT frmSelector : public QDialog
 {
     Q_OBJECT
@@ -46,11 +51,11 @@ public:
     CommandButtonArray &btnSelector() const;
     CommandButtonArray &btn_Handle() const;
 
-    // The hidden surface item images are painted on.
-    gdi::SurfaceWidget &tmpPic() const;
+    // Lists with more items than this get the filter box.
+    static constexpr int FilterThreshold = 20;
 
-    // Lays the labels, the item buttons and OK and Cancel out for the form's inner size;
-    // does nothing while Tag is "DISABLE_EVENTS".
+    // Lays the labels, the filter box, the item buttons and OK and Cancel out for the form's
+    // inner size; does nothing while Tag is "DISABLE_EVENTS".
     Q_INVOKABLE void ReArrange();
 
     // Grows the form's inner area from one screen rectangle (pixels) to another in eight
@@ -66,10 +71,13 @@ public:
     void reject() override;
 
 protected:
+    bool eventFilter(QObject *watched, QEvent *event) override;
+    void keyPressEvent(QKeyEvent *event) override;
     void resizeEvent(QResizeEvent *event) override;
 
 private:
     void send(QObject *source, const QString &name, const QVariant &value = {});
+    void applyFilter(const QString &text);
 
     std::unique_ptr<class frmSelectorPrivate> const d;
 };

@@ -14,12 +14,20 @@ namespace {
 constexpr int OpenGap = 300;
 constexpr int ButtonWidth = 240;
 
-// The arrow symbols of the button's symbol font.
+// The arrows of the button's symbol font, left (close) and right (open); where the font is
+// missing the button shows the Unicode arrows they stand for.
 const QString OpenGlyph = QStringLiteral("ç");
 const QString ClosedGlyph = QStringLiteral("è");
 
-constexpr quint32 HoverCaptionColor = 0xC00000;
-constexpr quint32 CaptionColor = 0x404040;
+// The button's look: raised with a frame and a blue arrow under the pointer, flat otherwise.
+struct ButtonLook
+{
+    qint32 style;
+    qint32 bevelWidth;
+    quint32 captionColor;
+};
+constexpr ButtonLook HoverLook { 2, 3, 0xC00000 };
+constexpr ButtonLook RestingLook { CommandButton::FlatStyle, 0, 0x404040 };
 
 } // namespace
 
@@ -115,7 +123,10 @@ void cSlider::placeButton()
 
 void cSlider::styleButton(bool hovering)
 {
-    d->cc->setForeColor(hovering ? HoverCaptionColor : CaptionColor);
+    const ButtonLook &look = hovering ? HoverLook : RestingLook;
+    d->cc->setButtonStyle(look.style);
+    d->cc->setBevelWidth(look.bevelWidth);
+    d->cc->setForeColor(look.captionColor);
 }
 
 ZELCTL_REGISTER_CLASS(cSlider)

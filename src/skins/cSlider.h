@@ -14,9 +14,12 @@ class cSliderPrivate;
 // A container that slides open and closed. The host places its own controls inside; the
 // toggle button cc on the slider's edge opens it wide enough to show them all (button on
 // the right edge, caption "ç") or closes it to the button alone (button on the left edge,
-// caption "è"). Every change of SlideOpen raises Slided. A new slider is closed; the
-// Slided of that first closing arrives once the event loop runs, so a host that connects
-// right after creating the slider hears it. Lengths are twips.
+// caption "è"); the captions are the left and right arrows of the symbol font "Wingdings",
+// drawn as Unicode arrows where that font is missing. The button is flat with a grey arrow,
+// and raised with a frame and a blue arrow while the pointer is on it. Every change of
+// SlideOpen raises Slided. A new slider is closed; the Slided of that first closing arrives
+// once the event loop runs, so a host that connects right after creating the slider hears
+// it. Lengths are twips.
 class ZELCTL_EXPORT cSlider : public UserControl
 {
     Q_OBJECT

@@ -129,12 +129,18 @@ void skGrowth::Repaint()
     const gdi::HDC dc = surface().hdc();
     const int w = width();
     const int h = height();
-    // Corners over the ends of the top edge, the bottom edge over the end of the background.
-    if (const QImage top = slice(d->paths[TopEdge]); !top.isNull())
-        gdi::drawPicture(dc, top, 0, 0, w, HeaderHeight);
-    if (const QImage left = slice(d->paths[TopLeft]); !left.isNull())
+    // The rounding of the corners shows the container.
+    surface().clear(platform::fromQColor(palette().color(QPalette::Window)));
+    // The top edge runs between the corners: under them it would fill their rounding.
+    const QImage left = slice(d->paths[TopLeft]);
+    const QImage right = slice(d->paths[TopRight]);
+    const int edgeLeft = left.isNull() ? 0 : left.width();
+    const int edgeRight = right.isNull() ? w : w - CornerWidth;
+    if (const QImage top = slice(d->paths[TopEdge]); !top.isNull() && edgeRight > edgeLeft)
+        gdi::drawPicture(dc, top, edgeLeft, 0, edgeRight - edgeLeft, HeaderHeight);
+    if (!left.isNull())
         gdi::drawPicture(dc, left, 0, 0, left.width(), HeaderHeight);
-    if (const QImage right = slice(d->paths[TopRight]); !right.isNull())
+    if (!right.isNull())
         gdi::drawPicture(dc, right, w - CornerWidth, 0, right.width(), HeaderHeight);
     if (const QImage background = slice(d->paths[Background]); !background.isNull())
         gdi::drawPicture(dc, background, 0, HeaderHeight, w, h - BottomHeight);

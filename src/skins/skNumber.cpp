@@ -18,6 +18,7 @@ constexpr platform::OleColor DefaultBackground = 0x404040;
 constexpr platform::OleColor DefaultForeground = 0xFFFFFF;
 constexpr platform::OleColor DefaultBackgroundActive = 0x5652B8;
 constexpr platform::OleColor DefaultForegroundActive = 0xFFFFFF;
+constexpr qint32 DefaultBackStyle = skNumber::Transparent;
 
 // Sets one point as a dot of the given diameter, in copy or XOR pen mode.
 void dot(gdi::HDC dc, int x, int y, int diameter, platform::OleColor color, int penMode)
@@ -42,6 +43,7 @@ public:
     platform::OleColor backgroundActive = DefaultBackgroundActive;
     platform::OleColor foregroundActive = DefaultForegroundActive;
     bool active = false;
+    qint32 backStyle = DefaultBackStyle;
     QString caption;
     QString skinId;
     std::optional<skinCommon::HoverTracker> hover;
@@ -142,6 +144,21 @@ void skNumber::setActive(bool active)
     redraw();
 }
 
+qint32 skNumber::BackStyle() const
+{
+    return d->backStyle;
+}
+
+void skNumber::setBackStyle(qint32 style)
+{
+    style = style == Opaque ? Opaque : Transparent;
+    if (style == d->backStyle)
+        return;
+    d->backStyle = style;
+    PropertyChanged(QStringLiteral("BackStyle"));
+    redraw();
+}
+
 QString skNumber::SkinID() const
 {
     return d->skinId;
@@ -177,6 +194,8 @@ void skNumber::ReadProperties(const PropertyBag &bag)
     d->foregroundActive = color("ForegroundActive", DefaultForegroundActive);
     d->active = bag.ReadProperty(QStringLiteral("Active"), false).toBool();
     d->skinId = bag.ReadProperty(QStringLiteral("SkinID"), QString()).toString();
+    d->backStyle
+        = bag.ReadProperty(QStringLiteral("BackStyle"), DefaultBackStyle).toInt() == Opaque ? Opaque : Transparent;
     setBackColor(color("BackColor", DefaultBackColor));
 }
 
@@ -190,6 +209,7 @@ void skNumber::WriteProperties(PropertyBag &bag)
     bag.WriteProperty(QStringLiteral("ForegroundActive"), d->foregroundActive, DefaultForegroundActive);
     bag.WriteProperty(QStringLiteral("Active"), d->active);
     bag.WriteProperty(QStringLiteral("SkinID"), d->skinId, QString());
+    bag.WriteProperty(QStringLiteral("BackStyle"), d->backStyle, DefaultBackStyle);
 }
 
 void skNumber::redraw()
@@ -209,6 +229,12 @@ void skNumber::redraw()
     // The XOR pass leaves a one-pixel ring of mixed colour round the solid disc.
     dot(dc, w / 2, h / 2, w - 1, disc, gdi::R2_XORPEN);
     dot(dc, w / 2, h / 2, w - 2, disc, gdi::R2_COPYPEN);
+    // The see-through part is what lies round the disc: taken before the caption is
+    // printed, so a caption in the background's colour stays part of the badge.
+    if (d->backStyle == Transparent)
+        surface().setMaskColor(d->backColor);
+    else
+        surface().clearMask();
 
     if (!d->caption.isEmpty()) {
         const skinCommon::SelectedFont selected(dc, captionFont);
@@ -216,7 +242,6 @@ void skNumber::redraw()
         gdi::SetTextColor(dc, text);
         gdi::TextOut(dc, int(std::floor((w - extent.cx) / 2.0)), int(std::floor((h - extent.cy) / 2.0)), d->caption);
     }
-    surface().setMaskColor(d->backColor);
     update();
 }
 

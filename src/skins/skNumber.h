@@ -14,11 +14,12 @@ class skNumberPrivate;
 
 // A round badge with a centred caption (a step number): a disc in Background with the
 // caption in Foreground, or BackgroundActive and ForegroundActive while Active, which the
-// pointer resting on the badge also sets. Only the disc and caption show; the rest
-// (BackColor) lets the container through. The badge keeps itself square.
+// pointer resting on the badge also sets. With a transparent BackStyle (the default) only
+// the disc and caption show and the rest lets the container through; an opaque badge
+// shows BackColor round the disc. The badge keeps itself square.
 //
 // Persisted as "Caption" (read default "1"), "BackColor", "Background", "Foreground",
-// "BackgroundActive", "ForegroundActive", "Active" and "SkinID".
+// "BackgroundActive", "ForegroundActive", "Active", "SkinID" and "BackStyle".
 class ZELCTL_EXPORT skNumber : public gdi::SurfaceHost<UserControl>
 {
     Q_OBJECT
@@ -30,15 +31,19 @@ class ZELCTL_EXPORT skNumber : public gdi::SurfaceHost<UserControl>
     Q_PROPERTY(quint32 ForegroundActive READ ForegroundActive WRITE setForegroundActive)
     Q_PROPERTY(bool Active READ Active WRITE setActive)
     Q_PROPERTY(QString SkinID READ SkinID WRITE setSkinID)
+    Q_PROPERTY(qint32 BackStyle READ BackStyle WRITE setBackStyle)
 
 public:
+    enum BackStyles { Transparent = 0, Opaque = 1 };
+    Q_ENUM(BackStyles)
+
     explicit skNumber(QWidget *parent = nullptr);
     ~skNumber() override;
 
     QString Caption() const;
     void setCaption(const QString &caption);
 
-    // Colour round the disc, which the mask makes see-through.
+    // Colour round the disc, see-through while BackStyle is Transparent.
     platform::OleColor BackColor() const;
     void setBackColor(platform::OleColor color);
 
@@ -53,6 +58,10 @@ public:
 
     bool Active() const;
     void setActive(bool active);
+
+    // Transparent (0) or Opaque (1); any other value is taken as Transparent.
+    qint32 BackStyle() const;
+    void setBackStyle(qint32 style);
 
     // Name of the skin; a new value raises RequestSkinRepait.
     QString SkinID() const;

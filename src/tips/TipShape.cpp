@@ -26,9 +26,14 @@ constexpr int AnchorGap = 2;
 
 const QColor BorderColour(0x64, 0x64, 0x64);
 
+bool hasIcon(const Content &content)
+{
+    return !iconPixmap(content.icon).isNull();
+}
+
 bool hasHeader(const Content &content)
 {
-    return !content.title.isEmpty() || !iconPixmap(content.icon).isNull();
+    return !content.title.isEmpty() || hasIcon(content);
 }
 
 QFont titleFont(const QFont &font)
@@ -38,9 +43,17 @@ QFont titleFont(const QFont &font)
     return bold;
 }
 
-int headerHeight(const QFont &font)
+// The row of the icon and the title; an icon's place is kept only for an icon.
+int headerHeight(const Content &content, const QFont &font)
 {
-    return std::max(IconSize, QFontMetrics(titleFont(font)).height());
+    const int title = QFontMetrics(titleFont(font)).height();
+    return hasIcon(content) ? std::max(IconSize, title) : title;
+}
+
+int headerWidth(const Content &content, const QFont &font)
+{
+    const int title = QFontMetrics(titleFont(font)).horizontalAdvance(content.title);
+    return hasIcon(content) ? IconSize + IconGap + title : title;
 }
 
 QRect textBounds(const QString &text, const QFont &font)
@@ -66,8 +79,8 @@ QSize contentSize(const Content &content, const QFont &font)
     int width = 0;
     int height = 0;
     if (hasHeader(content)) {
-        width = IconSize + IconGap + QFontMetrics(titleFont(font)).horizontalAdvance(content.title);
-        height = headerHeight(font);
+        width = headerWidth(content, font);
+        height = headerHeight(content, font);
     }
     const QRect text = textBounds(content.text, font);
     if (!text.isEmpty()) {
@@ -139,7 +152,7 @@ void paint(QPainter &painter, const Placement &placement, const Content &content
 
     QRect area = placement.content;
     if (hasHeader(content)) {
-        const int rowHeight = headerHeight(font);
+        const int rowHeight = headerHeight(content, font);
         int x = area.left();
         const QPixmap icon = iconPixmap(content.icon);
         if (!icon.isNull()) {

@@ -2,9 +2,13 @@
 #include "companion/CommandButtonArray.h"
 #include "companion/KeyCodes.h"
 
+#include <QApplication>
+
 #include <QDialog>
+#include <QHelpEvent>
 #include <QSignalSpy>
 #include <QTest>
+#include <QToolTip>
 
 #include <gtest/gtest.h>
 
@@ -134,6 +138,58 @@ TEST(CommandButton, reportsThePointerComingAndGoingAndTakesACaptionColour)
     button->setForeColor(0xC00000);
     EXPECT_EQ(button->ForeColor(), 0xC00000u);
     EXPECT_EQ(button->palette().color(QPalette::ButtonText), QColor(0, 0, 0xC0));
+}
+
+TEST(CommandButton, aCaptionTooLongIsCutShortAndShownWholeInTheTooltip)
+{
+    QWidget form;
+    form.resize(300, 100);
+    auto *button = new CommandButton(&form);
+    const QString name = QStringLiteral("Ilhas Geórgia do Sul e Sandwich do Sul");
+    button->setCaption(name);
+    button->setGeometry(10, 10, 90, 25);
+    form.show();
+    EXPECT_EQ(button->Caption(), name);
+    EXPECT_TRUE(button->text().endsWith(QChar(0x2026))) << button->text().toStdString();
+    EXPECT_LE(button->fontMetrics().horizontalAdvance(button->text()), 90);
+    EXPECT_GT(button->sizeHint().width(), button->fontMetrics().horizontalAdvance(name))
+        << "a layout is asked for room for the whole caption";
+    QHelpEvent help(QEvent::ToolTip, QPoint(5, 5), button->mapToGlobal(QPoint(5, 5)));
+    QApplication::sendEvent(button, &help);
+    EXPECT_EQ(QToolTip::text(), name);
+    QToolTip::hideText();
+
+    button->resize(290, 25);
+    EXPECT_EQ(button->text(), name) << "whole again once there is room";
+    button->setCaption(QStringLiteral("&Cancelar"));
+    button->resize(20, 25);
+    EXPECT_EQ(button->text(), QStringLiteral("&Cancelar")) << "an access key is never cut";
+}
+
+TEST(CommandButton, aSymbolFontCaptionShowsItsSymbolsAndTheStyleValuesTakeEffect)
+{
+    CommandButton button;
+    button.setFont(QFont(QStringLiteral("Wingdings"), 10));
+    button.setCaption(QStringLiteral("ç"));
+    EXPECT_EQ(button.Caption(), QStringLiteral("ç"));
+    EXPECT_EQ(button.text(), QString(QChar(0x2B05)));
+    button.setFont(QFont(QStringLiteral("DejaVu Sans"), 10));
+    EXPECT_EQ(button.text(), QStringLiteral("ç")) << "in an ordinary font the letter is the letter";
+
+    EXPECT_FALSE(button.isFlat());
+    button.setButtonStyle(CommandButton::FlatStyle);
+    EXPECT_TRUE(button.isFlat());
+    EXPECT_TRUE(button.autoFillBackground()) << "a flat button still covers what lies under it";
+    button.setBevelWidth(-2);
+    EXPECT_EQ(button.BevelWidth(), 0);
+    button.setProperty("BevelWidth", 3);
+    EXPECT_EQ(button.BevelWidth(), 3);
+
+    button.setForeColor(0xC00000);
+    button.setEnabled(false);
+    EXPECT_EQ(button.ForeColor(), 0xC00000u);
+    EXPECT_NE(button.palette().color(QPalette::Disabled, QPalette::ButtonText), QColor(0, 0, 0xC0))
+        << "a disabled caption stays greyed";
 }
 
 TEST(KeyCodes, qtKeysMapToVirtualKeyCodes)

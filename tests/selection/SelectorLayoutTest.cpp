@@ -15,6 +15,7 @@ Metrics gridOf(int width, int height, int items)
     m.innerWidth = width + 2 * Gap;
     m.innerHeight = height + Gap + m.okHeight + BottomReserve;
     m.itemCount = items;
+    m.scrollBarWidth = 240;
     return m;
 }
 
@@ -25,6 +26,7 @@ TEST(SelectorLayout, fourItemsFillOneColumnAboveOkAndCancel)
     const Metrics m = gridOf(5880, 3000, 4);
     const Layout layout = arrange(m);
     ASSERT_TRUE(layout.itemsPlaced);
+    EXPECT_FALSE(layout.scrolls);
     EXPECT_EQ(layout.columns, 1);
     EXPECT_EQ(layout.rows, 4);
     ASSERT_EQ(layout.items.size(), 4);
@@ -34,25 +36,76 @@ TEST(SelectorLayout, fourItemsFillOneColumnAboveOkAndCancel)
     EXPECT_EQ(layout.cancel, layout.ok.translated(1215, 0));
 }
 
-TEST(SelectorLayout, manyItemsTakeWholeRowsOverSeveralColumns)
+TEST(SelectorLayout, okTakesThePlaceOfAHiddenCancel)
+{
+    Metrics m = gridOf(5880, 3000, 4);
+    m.cancelVisible = false;
+    const Layout layout = arrange(m);
+    EXPECT_EQ(layout.ok, QRect(m.innerWidth - 1215, m.innerHeight - 375, 1215, 375));
+}
+
+TEST(SelectorLayout, columnsShareTheGridWithTheGapsBetweenThem)
 {
     // Nine items need two columns; with whole rows the ninth gets a fifth row.
     const Layout layout = arrange(gridOf(5880, 3000, 9));
     EXPECT_EQ(layout.columns, 2);
     EXPECT_EQ(layout.rows, 5);
-    EXPECT_EQ(layout.buttonWidth, 2940);
+    EXPECT_EQ(layout.buttonWidth, (5880 - 60) / 2);
     ASSERT_EQ(layout.items.size(), 9);
-    EXPECT_EQ(layout.items[1].left(), 2940 + 60 + 60);
+    EXPECT_EQ(layout.items[1].left(), 2910 + 60 + 60);
+    EXPECT_EQ(layout.items[1].right() + 1, 60 + 5880);
     EXPECT_EQ(layout.items[8].topLeft(), QPoint(60, 60 + 4 * (528 + 60)));
+
+    // Whatever the count and size, no button reaches past the grid (or its scroll bar).
+    for (const int width : { 2500, 3000, 5880, 7380, 11000 })
+        for (const int height : { 375, 1000, 4845 })
+            for (int count = 1; count <= 260; count += 7) {
+                Metrics m = gridOf(width, height, count);
+                m.captionWidth = 1800;
+                const Layout l = arrange(m);
+                ASSERT_TRUE(l.itemsPlaced);
+                const int right = 60 + width - (l.scrolls ? m.scrollBarWidth : 0);
+                for (const QRect &item : l.items)
+                    ASSERT_LE(item.right() + 1, right) << width << "x" << height << ", " << count << " items";
+                EXPECT_GE(l.buttonWidth, MinimumButtonWidth);
+            }
 }
 
-TEST(SelectorLayout, narrowAndLowGrids)
+TEST(SelectorLayout, itemsThatDoNotFitScrollInRowsOfTheSmallestHeight)
 {
-    const Layout narrow = arrange(gridOf(3000, 1000, 6));
-    EXPECT_EQ(narrow.columns, 3);
-    EXPECT_EQ(narrow.rows, 2);
-    EXPECT_EQ(narrow.buttonWidth, MinimumButtonWidth);
+    // All the countries in the default form: more columns than fit, so the rows scroll.
+    Metrics m = gridOf(7380, 4845, 249);
+    m.captionWidth = 2400;
+    const Layout layout = arrange(m);
+    ASSERT_TRUE(layout.itemsPlaced);
+    EXPECT_TRUE(layout.scrolls);
+    EXPECT_EQ(layout.columns, 2) << "as wide as the captions ask";
+    EXPECT_EQ(layout.rows, 125);
+    EXPECT_EQ(layout.buttonHeight, MinimumButtonHeight);
+    EXPECT_EQ(layout.content, QSize(7380, 125 * 435 - 60));
+    EXPECT_EQ(layout.items.last().bottom() + 1 - layout.grid.top(), layout.content.height());
 
+    // Three items in a grid too narrow for three columns side by side.
+    const Layout narrow = arrange(gridOf(3000, 1000, 6));
+    EXPECT_TRUE(narrow.scrolls);
+    EXPECT_EQ(narrow.columns, 2);
+    EXPECT_EQ(narrow.rows, 3);
+}
+
+TEST(SelectorLayout, theFilterBoxComesBeforeTheGrid)
+{
+    Metrics m = gridOf(5880, 3000, 30);
+    m.titleVisible = true;
+    m.titleHeight = 450;
+    m.filterVisible = true;
+    const Layout layout = arrange(m);
+    EXPECT_EQ(layout.filter, QRect(60, 510, 5880, FilterHeight));
+    EXPECT_EQ(layout.grid.top(), 510 + FilterHeight + 60);
+    EXPECT_EQ(layout.items.first().top(), layout.grid.top());
+}
+
+TEST(SelectorLayout, gridsTooSmallLeaveTheItemsWhereTheyAre)
+{
     const Layout low = arrange(gridOf(9000, 400, 5));
     EXPECT_EQ(low.columns, 5);
     EXPECT_EQ(low.rows, 1);

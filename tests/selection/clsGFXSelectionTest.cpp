@@ -3,11 +3,14 @@
 
 #include "common/modFuncs.h"
 #include "companion/CommandButton.h"
+#include "platform/Twips.h"
 #include "platform/WindowHandles.h"
 #include "support/TestSupport.h"
 
 #include <QGuiApplication>
+#include <QLineEdit>
 #include <QScreen>
+#include <QScrollArea>
 #include <QTemporaryDir>
 #include <QTest>
 
@@ -58,6 +61,46 @@ CommandButton *okButton(QDialog &dialog)
 CommandButton *cancelButton(QDialog &dialog)
 {
     return element(dialog, "btn_Handle", [](CommandButton *b) { return b->Index() == 1; });
+}
+
+// The same pixels, colours premultiplied as drawn, within rounding.
+void expectSamePicture(const QImage &shown, const QImage &file)
+{
+    ASSERT_FALSE(file.isNull());
+    const QImage a = shown.convertToFormat(QImage::Format_ARGB32_Premultiplied);
+    const QImage b = file.convertToFormat(QImage::Format_ARGB32_Premultiplied);
+    ASSERT_EQ(a.size(), b.size());
+    for (int y = 0; y < a.height(); ++y)
+        for (int x = 0; x < a.width(); ++x) {
+            const QRgb p = a.pixel(x, y);
+            const QRgb q = b.pixel(x, y);
+            ASSERT_EQ(qAlpha(p), qAlpha(q)) << x << "," << y;
+            ASSERT_NEAR(qRed(p), qRed(q), 1) << x << "," << y;
+            ASSERT_NEAR(qGreen(p), qGreen(q), 1) << x << "," << y;
+            ASSERT_NEAR(qBlue(p), qBlue(q), 1) << x << "," << y;
+        }
+}
+
+QList<CommandButton *> shownItems(QDialog &dialog)
+{
+    QList<CommandButton *> shown;
+    for (CommandButton *button : dialog.findChildren<CommandButton *>(QStringLiteral("btnSelector")))
+        if (!button->isHidden())
+            shown.append(button);
+    return shown;
+}
+
+// Each item can be scrolled to and then lies wholly in sight, none cut by the grid's edge.
+void expectEveryItemInSight(QDialog &dialog)
+{
+    auto *grid = dialog.findChild<QScrollArea *>(QStringLiteral("grid"));
+    ASSERT_NE(grid, nullptr);
+    for (CommandButton *button : shownItems(dialog)) {
+        grid->ensureWidgetVisible(button, 0, 0);
+        const QRect place(button->mapTo(grid->viewport(), QPoint()), button->size());
+        ASSERT_TRUE(grid->viewport()->rect().contains(place)) << button->Caption().toStdString();
+        ASSERT_TRUE(dialog.rect().contains(QRect(button->mapTo(&dialog, QPoint()), button->size())));
+    }
 }
 
 // Every event of the class, in the order raised.
@@ -170,14 +213,25 @@ TEST_F(SelectionTest, cancelEscapeAndTheCloseBoxCancel)
     }
 }
 
-TEST_F(SelectionTest, aDoubleClickChoosesAndAccepts)
+TEST_F(SelectionTest, aDoubleClickOrEnterOnAnItemChoosesItAndAccepts)
 {
-    const GFXResult result
-        = select({}, numberedItems(3), [](QDialog &dialog) { QTest::mouseDClick(item(dialog, 2), Qt::LeftButton); });
-    EXPECT_TRUE(result.Accepted);
-    EXPECT_EQ(result.SelectedItem.Title, "Item 2");
-    EXPECT_EQ(log->count(QStringLiteral("Closing 1 Item 2")), 1);
-    EXPECT_EQ(log->last(), "Closed");
+    const std::function<void(QDialog &)> ways[] = {
+        [](QDialog &dialog) { QTest::mouseDClick(item(dialog, 2), Qt::LeftButton); },
+        [](QDialog &dialog) { QTest::keyClick(item(dialog, 2), Qt::Key_Return); },
+        // Enter elsewhere presses OK, the default button.
+        [](QDialog &dialog) {
+            QTest::mouseClick(item(dialog, 2), Qt::LeftButton);
+            QTest::keyClick(&dialog, Qt::Key_Enter);
+        },
+    };
+    for (const auto &way : ways) {
+        log->clear();
+        const GFXResult result = select({}, numberedItems(3), way);
+        EXPECT_TRUE(result.Accepted);
+        EXPECT_EQ(result.SelectedItem.Title, "Item 2");
+        EXPECT_EQ(log->count(QStringLiteral("Closing 1 Item 2")), 1);
+        EXPECT_EQ(log->last(), "Closed");
+    }
 }
 
 TEST_F(SelectionTest, cancelCloseKeepsTheDialogOpen)
@@ -202,25 +256,40 @@ TEST_F(SelectionTest, theFormShowsTheItemsAsGivenInTheLaidOutGrid)
     items[1].Disabled = true;
     items[1].Selected = true;
     items[2].Selected = true;
-    items[3].Image = test::sourcePath(QStringLiteral("data/images/flags_iso/16/PT.png"));
+    const QString flag = test::sourcePath(QStringLiteral("data/images/flags_iso/16/PT.png"));
+    items[3].Image = flag;
     items[0].Image = QStringLiteral("/no/such/flag.png");
+    QTemporaryDir folder;
+    const QString hostPicture = folder.filePath(QStringLiteral("half.png"));
+    QImage half(8, 6, QImage::Format_ARGB32);
+    half.fill(QColor(0, 120, 255, 128));
+    half.setPixelColor(0, 0, Qt::transparent);
+    ASSERT_TRUE(half.save(hostPicture));
+    items[2].Image = hostPicture;
+    items[3].Default = true;
     GFXSelection s;
     s.Subtitle = QStringLiteral("Escolha um");
     s.DisableCancel = true;
-    const GFXResult result = select(s, items, [](QDialog &dialog) {
+    const GFXResult result = select(s, items, [&](QDialog &dialog) {
+        EXPECT_EQ(dialog.windowTitle(), QStringLiteral("Seleção"));
         EXPECT_FALSE(cancelButton(dialog)->isVisible());
+        EXPECT_EQ(dialog.focusWidget(), item(dialog, 3)) << "the default item starts with the focus";
         EXPECT_FALSE(item(dialog, 1)->isEnabled());
         // Only the first item marked selected starts pressed.
         EXPECT_TRUE(item(dialog, 1)->Value());
         EXPECT_FALSE(item(dialog, 2)->Value());
         EXPECT_TRUE(item(dialog, 0)->Picture().isNull());
-        EXPECT_EQ(item(dialog, 3)->Picture().image().size(), QSize(16, 16));
+        // The pictures keep their transparency (the flag's border, the host's half-clear
+        // pixels) and so show on the button's own background, not on black.
+        expectSamePicture(item(dialog, 3)->Picture().image(), QImage(flag));
+        expectSamePicture(item(dialog, 2)->Picture().image(), QImage(hostPicture));
 
         // 6000 x 3855 twips inside, less the subtitle: the four items fill one column of 5880 x 675.
         dialog.resize(400, 257);
         EXPECT_EQ(item(dialog, 0)->Width(), 5880);
         EXPECT_EQ(item(dialog, 0)->Height(), 675);
-        EXPECT_EQ(item(dialog, 3)->Top(), 60 + 300 + 3 * 735);
+        EXPECT_EQ(platform::twipsFromPixels(item(dialog, 3)->mapTo(&dialog, QPoint()).y()), 60 + 300 + 3 * 735);
+        EXPECT_EQ(okButton(dialog)->geometry().right(), dialog.width() - 1) << "OK takes the hidden Cancel's place";
         okButton(dialog)->click();
     });
     EXPECT_EQ(result.SelectedItem.Title, "Item 1");
@@ -292,17 +361,23 @@ TEST_F(SelectCountryTest, onlyPortugalNeedsNoDialog)
     EXPECT_EQ(shown, 0);
 }
 
-TEST_F(SelectCountryTest, theEuropeanUnionOffersItsMembersWithFlags)
+TEST_F(SelectCountryTest, theEuropeanUnionOffersItsMembersWithTheirFlagsWhole)
 {
     QString filter;
-    const QString code = selectCountry(GSEL_OnlyEU, filter, [](QDialog &dialog) {
-        const auto buttons = dialog.findChildren<CommandButton *>(QStringLiteral("btnSelector"));
-        EXPECT_EQ(buttons.size(), 27);
-        for (const CommandButton *button : buttons)
-            EXPECT_FALSE(button->Picture().isNull()) << button->Caption().toStdString();
-        itemTitled(dialog, QStringLiteral("Espanha"))->click();
-        okButton(dialog)->click();
-    });
+    GFXSelection s;
+    s.Title = QStringLiteral("País de residência");
+    const QString code = driven(
+        [](QDialog &dialog) {
+            EXPECT_EQ(dialog.windowTitle(), QStringLiteral("País de residência"));
+            const auto buttons = dialog.findChildren<CommandButton *>(QStringLiteral("btnSelector"));
+            EXPECT_EQ(buttons.size(), 27);
+            expectEveryItemInSight(dialog);
+            for (const CommandButton *button : buttons)
+                EXPECT_FALSE(button->Picture().isNull()) << button->Caption().toStdString();
+            itemTitled(dialog, QStringLiteral("Espanha"))->click();
+            okButton(dialog)->click();
+        },
+        [&] { return selection.SelectCountry(s, GSEL_OnlyEU, filter); });
     EXPECT_EQ(code, "ES");
     EXPECT_EQ(filter, selection.EU_CountryList());
 }
@@ -326,6 +401,42 @@ TEST_F(SelectCountryTest, allCountriesAndCustomLists)
     });
     EXPECT_EQ(code, "ES");
     EXPECT_EQ(filter, "PT,ES");
+}
+
+TEST_F(SelectCountryTest, everyCountryIsInReachAndFoundByTyping)
+{
+    QString filter;
+    const QString code = selectCountry(GSEL_All, filter, [](QDialog &dialog) {
+        // The form as it opens fits a screen of 800 x 600.
+        EXPECT_LE(dialog.width(), 800);
+        EXPECT_LE(dialog.height(), 600);
+        EXPECT_GT(shownItems(dialog).size(), 240);
+        expectEveryItemInSight(dialog);
+
+        // Typing on an item searches the names, whatever their accents and case.
+        auto *box = dialog.findChild<QLineEdit *>(QStringLiteral("txtFilter"));
+        ASSERT_TRUE(box && box->isVisible());
+        QTest::keyClicks(shownItems(dialog).first(), QStringLiteral("FEDERACAO"));
+        EXPECT_EQ(box->text(), QStringLiteral("FEDERACAO"));
+        ASSERT_EQ(shownItems(dialog).size(), 1);
+        EXPECT_EQ(shownItems(dialog).first()->Caption(), QStringLiteral("Federação Russa"));
+        expectEveryItemInSight(dialog);
+        // Enter takes the only one left.
+        QTest::keyClick(box, Qt::Key_Return);
+    });
+    EXPECT_EQ(code, "RU");
+
+    const QString none = selectCountry(GSEL_All, filter, [](QDialog &dialog) {
+        auto *box = dialog.findChild<QLineEdit *>(QStringLiteral("txtFilter"));
+        QTest::keyClicks(box, QStringLiteral("ilha"));
+        EXPECT_GT(shownItems(dialog).size(), 5);
+        QTest::keyClick(box, Qt::Key_Down);
+        EXPECT_EQ(dialog.focusWidget(), shownItems(dialog).first()) << "Down goes from the box to the items";
+        box->clear();
+        EXPECT_GT(shownItems(dialog).size(), 240);
+        QTest::keyClick(box, Qt::Key_Escape);
+    });
+    EXPECT_EQ(none, "");
 }
 
 TEST_F(SelectCountryTest, fewerThanTwoCountriesShowNoDialog)

@@ -187,8 +187,17 @@ TEST(CountryDialog, okAndEnterChooseTheSelectedItem)
     relist(form, GSEL_OnlyEU);
     QTreeWidget *list = listOf(form);
     test::ModalDriver ok([&](QDialog &) {
+        form.show();
+        // OK and Cancel are in sight, beside each other under the list.
+        for (int index : { 0, 1 }) {
+            const QRect place = button(form, index)->geometry();
+            EXPECT_TRUE(button(form, index)->isVisible());
+            EXPECT_TRUE(form.rect().contains(place)) << index;
+            EXPECT_FALSE(list->geometry().intersects(place)) << index;
+        }
+        EXPECT_LT(button(form, 0)->x(), button(form, 1)->x());
         list->setCurrentItem(list->findItems(QStringLiteral("ES"), Qt::MatchExactly, 1).value(0));
-        button(form, 0)->click();
+        QTest::mouseClick(button(form, 0), Qt::LeftButton);
         return form.result();
     });
     EXPECT_EQ(platform::showModal(form), QDialog::Accepted);
@@ -231,7 +240,8 @@ TEST(CountryDialog, cancelAndEscapeChooseNothing)
     QTreeWidget *list = listOf(form);
     list->setCurrentItem(list->topLevelItem(3));
     form.setTag(QStringLiteral("DE"));
-    button(form, 1)->click();
+    form.show();
+    QTest::mouseClick(button(form, 1), Qt::LeftButton);
     EXPECT_EQ(form.Tag(), QString());
     EXPECT_EQ(form.result(), QDialog::Rejected);
 

@@ -46,20 +46,6 @@ protected:
 
 } // namespace
 
-TEST_F(GoButton, showsTheNormalHoverAndPressedPicturesWithTheBlackBorderMasked)
-{
-    EXPECT_EQ(centre(), Normal);
-    EXPECT_EQ(pixel(*button, 1, 1), 0x000000u);
-    EXPECT_TRUE(button->mask().contains(QPoint(20, 20)));
-    EXPECT_FALSE(button->mask().contains(QPoint(1, 1)));
-
-    button->setHovering(true);
-    button->Repaint();
-    EXPECT_EQ(centre(), Hover);
-    button->setActive(true);
-    EXPECT_EQ(centre(), Pressed) << "pressed wins over hover";
-}
-
 TEST_F(GoButton, disabledShowsTheNormalPictureAndedOnGreyWhateverItsState)
 {
     button->setHovering(true);

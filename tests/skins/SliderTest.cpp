@@ -89,18 +89,29 @@ TEST_F(Slider, resizeKeepsTheButtonOnTheRightEdgeWhenOpen)
     EXPECT_EQ(cc->Height(), 450);
 }
 
-TEST_F(Slider, theButtonTogglesAndItsHoverRestylesIt)
+TEST_F(Slider, theButtonTogglesShowsArrowsAndItsHoverRestylesIt)
 {
     QSignalSpy slided(slider, &cSlider::Slided);
     QTest::mouseClick(cc, Qt::LeftButton);
     EXPECT_TRUE(slider->SlideOpen());
+    // The symbol font's arrow left, as Unicode where the font is missing.
+    EXPECT_EQ(cc->text(), QString(QChar(0x2B05)));
     QTest::mouseClick(cc, Qt::LeftButton);
     EXPECT_FALSE(slider->SlideOpen());
+    EXPECT_EQ(cc->text(), QString(QChar(0x27A1)));
     EXPECT_EQ(slided.count(), 2);
 
-    EXPECT_EQ(cc->ForeColor(), 0x404040u);
+    struct Look
+    {
+        qint32 style;
+        qint32 bevel;
+        quint32 caption;
+        bool operator==(const Look &) const = default;
+    };
+    const auto look = [this] { return Look { cc->ButtonStyle(), cc->BevelWidth(), cc->ForeColor() }; };
+    EXPECT_EQ(look(), (Look { CommandButton::FlatStyle, 0, 0x404040u }));
     Q_EMIT cc->MouseHover(true);
-    EXPECT_EQ(cc->ForeColor(), 0xC00000u);
+    EXPECT_EQ(look(), (Look { 2, 3, 0xC00000u }));
     Q_EMIT cc->MouseHover(false);
-    EXPECT_EQ(cc->ForeColor(), 0x404040u);
+    EXPECT_EQ(look(), (Look { CommandButton::FlatStyle, 0, 0x404040u }));
 }

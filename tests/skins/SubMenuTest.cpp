@@ -9,7 +9,6 @@ using zelctl::test::pixel;
 
 namespace {
 
-constexpr platform::OleColor Clear = 0xFFFFFF;
 constexpr platform::OleColor Fill = 0xC3AB00;
 
 class SubMenu : public zelctl::test::SkinForm
@@ -33,19 +32,6 @@ protected:
 };
 
 } // namespace
-
-TEST_F(SubMenu, arrowBoxHasANotchOnTheLeftAndAPointOnTheRight)
-{
-    item->Redraw();
-    // The notch's tip reaches x = 10 at mid height; the box ends at 190 and its point
-    // narrows to x = 199.
-    zelctl::test::expectPixels(*item,
-        { { 100, 10, Fill }, { 0, 0, Clear }, { 0, 19, Clear }, { 9, 10, Clear }, { 5, 2, Fill }, { 11, 10, Fill },
-            { 195, 10, Fill }, { 195, 2, Clear }, { 199, 10, Fill }, { 199, 8, Clear }, { 189, 0, Fill } });
-    EXPECT_FALSE(item->mask().contains(QPoint(0, 10)));
-    EXPECT_FALSE(item->mask().contains(QPoint(195, 2)));
-    EXPECT_TRUE(item->mask().contains(QPoint(100, 10)));
-}
 
 TEST_F(SubMenu, backgroundPrefersActiveOverHover)
 {

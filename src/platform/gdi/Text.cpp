@@ -2,6 +2,8 @@
 
 #include "GdiObjects.h"
 
+#include "platform/SymbolFonts.h"
+
 #include <QFontMetricsF>
 #include <QGuiApplication>
 #include <QImage>
@@ -77,7 +79,7 @@ bool TextOut(HDC hdc, int x, int y, const QString &text)
         painter.setFont(font);
         painter.setPen(platform::toQColor(dc->textColor));
         const QFontMetricsF metrics(font, &image);
-        painter.drawText(QPointF(x, y + metrics.ascent()), text);
+        painter.drawText(QPointF(x, y + metrics.ascent()), platform::symbolFonts::shownText(font, text));
     }
     if (!surface.topDown)
         for (int row = 0; row < surface.height; ++row)
@@ -91,8 +93,9 @@ bool GetTextExtentPoint32(HDC hdc, const QString &text, SIZE &size)
     if (!dc || !fontsAvailable())
         return false;
     const QImage device = metricsDevice();
-    const QFontMetricsF metrics(qFont(*dc->font.object), &device);
-    size.cx = qint32(std::ceil(metrics.horizontalAdvance(text)));
+    const QFont font = qFont(*dc->font.object);
+    const QFontMetricsF metrics(font, &device);
+    size.cx = qint32(std::ceil(metrics.horizontalAdvance(platform::symbolFonts::shownText(font, text))));
     size.cy = qint32(std::ceil(metrics.height()));
     return true;
 }
