@@ -134,6 +134,7 @@ TEST_F(EntryAccessibility, nibIsOneEntryWhoseBoxesAreItsPartsAndItsErrorMarkIsAT
     EXPECT_TRUE(spy.changedStates(nib).invalid);
     QWidget *mark = nib->findChild<QWidget *>("Image1");
     EXPECT_EQ(mark->focusPolicy(), Qt::TabFocus);
+    EXPECT_EQ(accessible(mark)->role(), QAccessible::Graphic);
     MessageBoxRecorder boxes;
     QTest::keyClick(mark, Qt::Key_Space);
     EXPECT_EQ(boxes.shown().size(), 1) << "Space explains the mark, as a click does";
