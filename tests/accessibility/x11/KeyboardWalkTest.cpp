@@ -179,6 +179,10 @@ TEST_F(KeyboardWalk, selectionDialogAnsweredWithArrowsSpaceAndEnter)
             key(Qt::Key_Right);
             key(Qt::Key_Right);
             visited << qobject_cast<CommandButton *>(focus())->Caption();
+            const int row = focus()->y();
+            key(Qt::Key_Down);
+            EXPECT_GT(focus()->y(), row) << "Down goes to the next row";
+            key(Qt::Key_Up);
             key(Qt::Key_Left);
             visited << qobject_cast<CommandButton *>(focus())->Caption();
             key(Qt::Key_Space);
