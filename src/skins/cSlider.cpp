@@ -3,7 +3,9 @@
 #include "skinCommon.h"
 
 #include "companion/CommandButton.h"
+#include "platform/Accessibility.h"
 
+#include <QApplication>
 #include <QResizeEvent>
 
 namespace zelctl {
@@ -34,21 +36,33 @@ constexpr ButtonLook RestingLook { CommandButton::FlatStyle, 0, 0x404040 };
 class cSliderPrivate
 {
 public:
+    explicit cSliderPrivate(cSlider *q)
+        : echo(q)
+        , cc(new CommandButton(q))
+        , toggleEcho(cc)
+    { }
+
     bool open = false;
-    CommandButton *cc = nullptr;
+    platform::AccessibleEcho echo;
+    CommandButton *cc;
+    platform::AccessibleEcho toggleEcho;
 };
 
 cSlider::cSlider(QWidget *parent)
     : UserControl(parent)
-    , d(std::make_unique<cSliderPrivate>())
+    , d(std::make_unique<cSliderPrivate>(this))
 {
-    d->cc = new CommandButton(this);
     d->cc->setObjectName(QStringLiteral("cc"));
     d->cc->setFont(QFont(QStringLiteral("Wingdings"), 10));
     d->cc->setWidth(ButtonWidth);
     styleButton(false);
     connect(d->cc, &CommandButton::Click, this, [this] { setSlideOpen(!d->open); });
     connect(d->cc, &CommandButton::MouseHover, this, [this](bool hovering) { styleButton(hovering); });
+    // The keyboard reaching a control hidden in the closed slider opens it, so the focus shows.
+    connect(qApp, &QApplication::focusChanged, this, [this](QWidget *, QWidget *now) {
+        if (!d->open && now && now != d->cc && isAncestorOf(now))
+            setSlideOpen(true);
+    });
 
     // Every slider starts closed; its Slided waits for the event loop, when a host can hear it.
     close();
@@ -71,6 +85,8 @@ void cSlider::setSlideOpen(bool open)
         this->open();
     else
         close();
+    d->echo.refresh();
+    d->toggleEcho.refresh();
     Q_EMIT Slided();
 }
 
