@@ -2,11 +2,20 @@
 #include "frame/ClassRegistry.h"
 #include "frame/UserControl.h"
 
+#include "support/TestSupport.h"
+
 #include <QFile>
+#include <QFileInfo>
+#include <QImage>
 #include <QJsonArray>
+#include <QJsonDocument>
 #include <QTemporaryDir>
 
 #include <gtest/gtest.h>
+
+#include <limits>
+
+#include <sys/stat.h>
 
 using namespace zelctl;
 
@@ -90,21 +99,134 @@ TEST(FormFile, applyLoadsSavedValuesIntoControlsOfTheSameNameAndClass)
     EXPECT_EQ(FormFile::apply(saved, controls), controls.size() - 1);
 }
 
-TEST(FormFile, rejectsWhatIsNotAFormAndSkipsUnknownClasses)
+TEST(FormFile, unnamedControlsOfOneClassKeepTheirOwnProperties)
+{
+    QJsonObject form;
+    QString error;
+    ASSERT_TRUE(FormFile::load(test::testDataPath("forms/unnamed-numbers.json"), &form, &error)) << error.toStdString();
+    QWidget parent;
+    QList<UserControl *> numbers;
+    for (int i = 0; i < 3; ++i) {
+        numbers << qobject_cast<UserControl *>(CreateObject("skNumber", &parent));
+        ASSERT_NE(numbers.last(), nullptr);
+        numbers.last()->InitNew();
+    }
+    EXPECT_EQ(FormFile::apply(form, numbers), 3);
+    QStringList captions;
+    for (UserControl *number : numbers)
+        captions << number->property("Caption").toString();
+    EXPECT_EQ(captions, QStringList({ "1", "2", "3" }));
+}
+
+TEST(FormFile, refusesWhatIsNotAFormWithAReasonAndWithoutWaiting)
 {
     QTemporaryDir dir;
-    QJsonObject form;
-    EXPECT_FALSE(FormFile::load(dir.filePath("missing.json"), &form));
-    QFile file(dir.filePath("bad.json"));
-    ASSERT_TRUE(file.open(QIODevice::WriteOnly));
-    file.write(R"({"controls": 3})");
-    file.close();
-    EXPECT_FALSE(FormFile::load(file.fileName(), &form));
+    const auto write = [&dir](const QString &name, const QByteArray &bytes) {
+        QFile file(dir.filePath(name));
+        EXPECT_TRUE(file.open(QIODevice::WriteOnly));
+        file.write(bytes);
+        return file.fileName();
+    };
+    const QString fifo = dir.filePath("fifo.json");
+    ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
+    QFile large(dir.filePath("large.json"));
+    ASSERT_TRUE(large.open(QIODevice::WriteOnly));
+    ASSERT_TRUE(large.resize(FormFile::MaxFileBytes + 1));
+    large.close();
+    const QByteArray manyControls = "{\"controls\": [" + QByteArray("{},").repeated(FormFile::MaxControls) + "{}]}";
+    QJsonArray properties;
+    for (int i = 0; i <= PropertyBag::MaxEntries; ++i)
+        properties.append(QJsonObject { { "name", QStringLiteral("P%1").arg(i) }, { "value", i } });
+    const QByteArray manyProperties
+        = QJsonDocument(QJsonObject { { "controls", QJsonArray { QJsonObject { { "properties", properties } } } } })
+              .toJson();
 
+    const struct
+    {
+        QString path;
+        const char *reason;
+    } cases[] = {
+        { dir.filePath("missing.json"), "Não foi possível ler" },
+        { dir.path(), "não é um ficheiro comum" },
+        { fifo, "não é um ficheiro comum" },
+        { "/dev/zero", "não é um ficheiro comum" },
+        { large.fileName(), "o máximo de um formulário" },
+        { write("number.json", R"({"controls": 3})"), "não é um formulário" },
+        { write("text.json", "controls"), "não é um formulário" },
+        { write("controls.json", manyControls), "controlos, o máximo" },
+        { write("properties.json", manyProperties), "propriedades, o máximo" },
+    };
+    for (const auto &c : cases) {
+        QJsonObject form { { "kept", true } };
+        QString error;
+        EXPECT_FALSE(FormFile::load(c.path, &form, &error)) << c.path.toStdString();
+        EXPECT_TRUE(error.contains(QString::fromUtf8(c.reason))) << error.toStdString();
+        EXPECT_TRUE(error.contains(c.path)) << error.toStdString();
+        EXPECT_EQ(form, QJsonObject({ { "kept", true } }));
+    }
+}
+
+TEST(FormFile, createSkipsUnknownClasses)
+{
     QWidget parent;
     QStringList skipped;
     const QJsonObject unknown { { "controls", QJsonArray { QJsonObject { { "class", "cNothing" } } } } };
     EXPECT_TRUE(FormFile::create(unknown, &parent, &skipped).isEmpty());
     EXPECT_EQ(skipped, QStringList({ "cNothing" }));
     EXPECT_TRUE(parent.children().isEmpty());
+}
+
+TEST(FormFile, saveNeverReplacesASpecialFileAndWritesThroughALink)
+{
+    QTemporaryDir dir;
+    QWidget form;
+    const QList<UserControl *> controls = everyControl(&form);
+    const QString fifo = dir.filePath("fifo");
+    ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
+    const QString toFifo = dir.filePath("to-fifo.json");
+    ASSERT_TRUE(QFile::link(fifo, toFifo));
+    for (const QString &path : { fifo, toFifo }) {
+        QString error;
+        EXPECT_FALSE(FormFile::save(path, controls, &error)) << path.toStdString();
+        EXPECT_TRUE(error.contains(u"não é um ficheiro comum")) << error.toStdString();
+    }
+    EXPECT_TRUE(QFileInfo(fifo).exists() && !QFileInfo(fifo).isFile()) << "the FIFO is still there";
+    EXPECT_TRUE(QFileInfo(toFifo).isSymLink());
+
+    const QString target = dir.filePath("target.json");
+    const QString link = dir.filePath("link.json");
+    ASSERT_TRUE(QFile::link(target, link));
+    QString error;
+    ASSERT_TRUE(FormFile::save(link, controls, &error)) << error.toStdString();
+    EXPECT_TRUE(QFileInfo(link).isSymLink()) << "the link stays a link";
+    QJsonObject saved;
+    EXPECT_TRUE(FormFile::load(target, &saved));
+}
+
+// Numbers at and beyond the ends of a Long reach no arithmetic unchecked: the form loads,
+// every control draws, and each value is in its property's range.
+TEST(FormFile, extremeNumbersLoadAndDraw)
+{
+    QJsonObject saved;
+    ASSERT_TRUE(FormFile::load(test::testDataPath("forms/extreme-numbers.json"), &saved));
+    QWidget form;
+    form.resize(200, 200);
+    const QList<UserControl *> controls = FormFile::create(saved, &form);
+    ASSERT_EQ(controls.size(), 5);
+    form.show();
+    for (UserControl *control : controls) {
+        control->resize(40, 20);
+        QImage image(control->size(), QImage::Format_ARGB32);
+        control->render(&image);
+    }
+    const auto value = [&](int i, const char *name) { return controls[i]->property(name).toLongLong(); };
+    EXPECT_EQ(value(0, "OffsetX"), std::numeric_limits<qint32>::min());
+    EXPECT_EQ(value(0, "OffsetY"), std::numeric_limits<qint32>::max());
+    EXPECT_EQ(value(0, "Loops"), 0) << "1e300 is refused: the GIF's own count";
+    EXPECT_EQ(value(1, "Loops"), std::numeric_limits<qint32>::max());
+    EXPECT_EQ(value(2, "OffsetX"), 0);
+    EXPECT_EQ(value(2, "OffsetY"), 0);
+    EXPECT_EQ(value(2, "Loops"), 0);
+    EXPECT_EQ(value(3, "Margin"), 251658225) << "clamped to the widest a control can be";
+    EXPECT_EQ(value(4, "Margin"), -251658225);
 }
