@@ -11,6 +11,17 @@
 
 namespace zelctl::FormFile {
 
+namespace {
+
+bool fail(QString *error, const QString &reason)
+{
+    if (error)
+        *error = reason;
+    return false;
+}
+
+} // namespace
+
 QString className(const UserControl *control)
 {
     QString name = QString::fromLatin1(control->metaObject()->className());
@@ -75,58 +86,57 @@ int apply(const QJsonObject &form, const QList<UserControl *> &controls)
 
 bool save(const QString &path, const QList<UserControl *> &controls, QString *error)
 {
-    const auto fail = [error](const QString &reason) {
-        if (error)
-            *error = reason;
-        return false;
-    };
     // A new file renamed over a FIFO or a device node would replace it.
     if (platform::isSpecialFile(path))
-        return fail(QStringLiteral("%1 não é um ficheiro comum: o formulário não foi gravado.").arg(path));
+        return fail(error, QStringLiteral("%1 não é um ficheiro comum: o formulário não foi gravado.").arg(path));
     const QByteArray json = QJsonDocument(write(controls)).toJson();
     if (json.size() > MaxFileBytes) {
-        return fail(QStringLiteral("O formulário tem mais de %1 bytes, que não se poderiam ler de novo: não foi "
-                                   "gravado em %2.")
-                        .arg(MaxFileBytes)
-                        .arg(path));
+        return fail(error,
+            QStringLiteral("O formulário tem mais de %1 bytes, que não se poderiam ler de novo: não foi "
+                           "gravado em %2.")
+                .arg(MaxFileBytes)
+                .arg(path));
     }
     QSaveFile file(path);
     if (!file.open(QIODevice::WriteOnly) || file.write(json) != json.size() || !file.commit())
-        return fail(QStringLiteral("Não foi possível gravar o formulário em %1.").arg(path));
+        return fail(error, QStringLiteral("Não foi possível gravar o formulário em %1.").arg(path));
     return true;
 }
 
 bool load(const QString &path, QJsonObject *form, QString *error)
 {
-    const auto fail = [error](const QString &reason) {
-        if (error)
-            *error = reason;
-        return false;
-    };
     const platform::FileRead file = platform::readFile(path, MaxFileBytes);
     switch (file.status) {
     case platform::FileRead::Ok:
-        break;
+        return parse(file.bytes, path, form, error);
     case platform::FileRead::Unreadable:
-        return fail(QStringLiteral("Não foi possível ler %1: %2.").arg(path, file.reason));
+        return fail(error, QStringLiteral("Não foi possível ler %1: %2.").arg(path, file.reason));
     case platform::FileRead::NotRegularFile:
-        return fail(QStringLiteral("%1 não é um ficheiro comum.").arg(path));
+        return fail(error, QStringLiteral("%1 não é um ficheiro comum.").arg(path));
     case platform::FileRead::TooLarge:
-        return fail(QStringLiteral("%1 tem mais de %2 bytes, o máximo de um formulário.").arg(path).arg(MaxFileBytes));
+        break;
     }
+    return fail(
+        error, QStringLiteral("%1 tem mais de %2 bytes, o máximo de um formulário.").arg(path).arg(MaxFileBytes));
+}
+
+bool parse(const QByteArray &bytes, const QString &path, QJsonObject *form, QString *error)
+{
     QJsonParseError parsed;
-    const QJsonDocument doc = QJsonDocument::fromJson(file.bytes, &parsed);
+    const QJsonDocument doc = QJsonDocument::fromJson(bytes, &parsed);
     if (parsed.error != QJsonParseError::NoError || !doc.isObject() || !doc.object().value("controls").isArray())
-        return fail(QStringLiteral("%1 não é um formulário que se possa ler.").arg(path));
+        return fail(error, QStringLiteral("%1 não é um formulário que se possa ler.").arg(path));
     const QJsonArray controls = doc.object().value("controls").toArray();
-    if (controls.size() > MaxControls)
-        return fail(
+    if (controls.size() > MaxControls) {
+        return fail(error,
             QStringLiteral("%1 tem mais de %2 controlos, o máximo de um formulário.").arg(path).arg(MaxControls));
+    }
     for (const QJsonValue &control : controls) {
         if (control.toObject().value("properties").toArray().size() > PropertyBag::MaxEntries) {
-            return fail(QStringLiteral("%1: um controlo tem mais de %2 propriedades, o máximo de um controlo.")
-                            .arg(path)
-                            .arg(PropertyBag::MaxEntries));
+            return fail(error,
+                QStringLiteral("%1: um controlo tem mais de %2 propriedades, o máximo de um controlo.")
+                    .arg(path)
+                    .arg(PropertyBag::MaxEntries));
         }
     }
     *form = doc.object();

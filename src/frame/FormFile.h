@@ -51,6 +51,8 @@ ZELCTL_EXPORT bool save(const QString &path, const QList<UserControl *> &control
 // be read, is not a regular file, is larger than MaxFileBytes, is not a form, or holds more
 // controls or properties than allowed.
 ZELCTL_EXPORT bool load(const QString &path, QJsonObject *form, QString *error = nullptr);
+// The form in the bytes of a form file named `path`, as load() reads it.
+ZELCTL_EXPORT bool parse(const QByteArray &bytes, const QString &path, QJsonObject *form, QString *error = nullptr);
 
 } // namespace FormFile
 
