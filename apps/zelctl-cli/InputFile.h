@@ -6,9 +6,6 @@
 
 #include <optional>
 
-// A PNG file the png commands read at most; the decoder bounds the image it inflates.
-inline constexpr qint64 MaxPngFileBytes = qint64(256) << 20;
-
 // The whole input file of a command: a regular file, or a pipe such as /dev/stdin, of at
 // most maxBytes. A device, a directory, a larger file or an endless pipe gives a one-line
 // error on err ("zelctl COMMAND: PATH: why") and nothing.

@@ -1,6 +1,7 @@
 #include "Command.h"
 #include "InputFile.h"
 
+#include "png/PngChunkReader.h"
 #include "png/PngDecoder.h"
 #include "png/StdPNG.h"
 #include "png/stdPNGdata.h"
@@ -108,7 +109,7 @@ int runPngInfo(const QStringList &args, QTextStream &out, QTextStream &err)
         err << "usage: zelctl png-info FILE\n";
         return 2;
     }
-    const std::optional<QByteArray> file = readInputFile(args.first(), MaxPngFileBytes, "png-info", err);
+    const std::optional<QByteArray> file = readInputFile(args.first(), zelctl::png::MaxFileBytes, "png-info", err);
     if (!file)
         return 1;
     zelctl::StdPNG image;
@@ -176,7 +177,7 @@ int runPngDecode(const QStringList &args, QTextStream &, QTextStream &err)
         err << usage;
         return 2;
     }
-    const std::optional<QByteArray> file = readInputFile(files[0], MaxPngFileBytes, "png-decode", err);
+    const std::optional<QByteArray> file = readInputFile(files[0], zelctl::png::MaxFileBytes, "png-decode", err);
     if (!file)
         return 1;
     if (!image.LoadData(*file, true, make32, quint8(alpha))) {
