@@ -419,6 +419,7 @@ TEST(NifPersistence, savesAndLoadsItsProperties)
     EXPECT_EQ(old.CountryID(), "FR");
     EXPECT_EQ(old.Countries(), GSEL_OnlyPT) << "an unknown filter falls back";
     EXPECT_EQ(old.BackColor(), 0x00FF00u) << "a colour written as a literal";
+    EXPECT_EQ(old.palette().color(QPalette::Window), QColor(0, 255, 0));
 }
 
 TEST(NifHost, drivesTheControlByNameAndCountsIt)
