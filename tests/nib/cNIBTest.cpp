@@ -16,31 +16,7 @@ using namespace zelctl;
 
 namespace {
 
-// Independent oracle: "PT50" followed by a NIB is a valid IBAN (ISO 13616 mod 97 = 1)
-// exactly when the NIB's check digits are right.
-bool ibanValid(const QString &iban)
-{
-    const QString rearranged = iban.mid(4) + iban.left(4);
-    int remainder = 0;
-    for (const QChar c : rearranged) {
-        const int value = c.isDigit() ? c.digitValue() : c.toLatin1() - 'A' + 10;
-        remainder = (value >= 10 ? remainder * 100 : remainder * 10) + value;
-        remainder %= 97;
-    }
-    return remainder == 1;
-}
-
-QString randomDigits(QRandomGenerator &random, int count)
-{
-    QString digits;
-    for (int i = 0; i < count; ++i)
-        digits += QChar(u'0' + random.bounded(10));
-    return digits;
-}
-
-const QString bankBranchAccount = "0035"
-                                  "0651"
-                                  "00000012345"; // 19 characters
+const QString bankBranchAccount = "0035065100000012345"; // 19 characters
 const QString number = bankBranchAccount + CalculateNibCheckDigits(bankBranchAccount);
 
 } // namespace
@@ -56,14 +32,29 @@ TEST(NibCheckDigits, workedExamples)
     EXPECT_EQ(CalculateNibCheckDigits(u"1234567890123456789١"), "68") << "only ASCII digits count";
 }
 
-TEST(NibCheckDigits, agreeWithTheIbanRuleOnRandomNumbers)
+// The control's verdict agrees with an independent rule, both ways: "PT50" and a NIB make a
+// valid IBAN (ISO 13616, mod 97) exactly when the NIB's check digits are right.
+TEST(NibCheckDigits, controlAgreesWithTheIbanRuleOnRandomNumbers)
 {
+    const auto ibanValid = [](const QString &nib) {
+        int remainder = 0;
+        for (const QChar c : nib + "252950") // "PT50", letters as numbers, moved to the end
+            remainder = (remainder * 10 + c.digitValue()) % 97;
+        return remainder == 1;
+    };
+    cNIB nib;
     QRandomGenerator random(20261206);
-    for (int i = 0; i < 2000; ++i) {
-        const QString body = randomDigits(random, 19);
-        const QString digits = CalculateNibCheckDigits(body);
-        ASSERT_EQ(digits.size(), 2);
-        EXPECT_TRUE(ibanValid("PT50" + body + digits)) << body.toStdString();
+    for (int i = 0; i < 500; ++i) {
+        QString body;
+        for (int k = 0; k < 19; ++k)
+            body += QChar(u'0' + random.bounded(10));
+        const QString right = CalculateNibCheckDigits(body);
+        // Any other pair that is not the same number mod 97.
+        const QString wrong = QString::number((right.toInt() + 1 + random.bounded(96)) % 97).rightJustified(2, u'0');
+        for (const QString &digits : { right, wrong }) {
+            nib.setText(body + digits);
+            EXPECT_EQ(nib.Valid(), ibanValid(body + digits)) << (body + digits).toStdString();
+        }
     }
 }
 
@@ -84,11 +75,15 @@ protected:
     QLabel *validMark() const { return nib->findChild<QLabel *>("validpic"); }
     QLabel *errorMark() const { return nib->findChild<QLabel *>("Image1"); }
 
-    // Types into whichever box has the focus, one key at a time, as a user would.
+    // Keys into whichever box has the focus, one at a time ('\b' is Backspace), while the
+    // control lives.
     void type(const QString &text)
     {
-        for (const QChar c : text)
-            QTest::keyClick(QApplication::focusWidget(), c.toLatin1());
+        const QPointer<cNIB> alive = nib;
+        for (const QChar c : text) {
+            if (alive)
+                QTest::keyClick(QApplication::focusWidget(), c == u'\b' ? Qt::Key_Backspace : Qt::Key(c.toLatin1()));
+        }
     }
 
     QWidget form;
@@ -96,7 +91,7 @@ protected:
     QLineEdit *other = nullptr;
 };
 
-TEST_F(NibControl, typingAllCharactersHopsBoxesAndRaisesChangedOnceAtTheEnd)
+TEST_F(NibControl, typingHopsBoxesForwardAndBackspaceErasesBack)
 {
     QSignalSpy changed(nib, &cNIB::Changed);
     box(0)->setFocus();
@@ -104,29 +99,22 @@ TEST_F(NibControl, typingAllCharactersHopsBoxesAndRaisesChangedOnceAtTheEnd)
     EXPECT_EQ(changed.count(), 0);
     EXPECT_EQ(QApplication::focusWidget(), box(3));
     type(number.right(1));
-    EXPECT_EQ(changed.count(), 1);
+    EXPECT_EQ(changed.count(), 1) << "raised once, at the last character";
     EXPECT_EQ(nib->Text(), number);
+    EXPECT_EQ(box(2)->text(), "00000012345");
     EXPECT_TRUE(nib->Valid());
     EXPECT_TRUE(validMark()->isVisible());
     EXPECT_FALSE(errorMark()->isVisible());
-    EXPECT_EQ(box(2)->text(), "00000012345");
-}
 
-TEST_F(NibControl, backspaceInAnEmptyBoxErasesBackAcrossBoxes)
-{
-    nib->setText(number);
-    QSignalSpy changed(nib, &cNIB::Changed);
-    box(3)->setFocus();
-    for (int i = 0; i < 21 + 3; ++i)
-        QTest::keyClick(QApplication::focusWidget(), Qt::Key_Backspace);
+    type(QString(21 + 3, u'\b'));
     EXPECT_EQ(nib->Text(), "");
     EXPECT_EQ(QApplication::focusWidget(), box(0));
-    EXPECT_EQ(changed.count(), 1) << "raised when the last character is erased";
+    EXPECT_EQ(changed.count(), 2) << "raised when the last character is erased";
 
     nib->setText(number);
     box(2)->setText("");
     box(2)->setFocus();
-    QTest::keyClick(box(2), Qt::Key_Backspace);
+    type("\b");
     EXPECT_EQ(box(1)->text(), "065");
     EXPECT_EQ(QApplication::focusWidget(), box(1));
     EXPECT_EQ(box(1)->cursorPosition(), 3);
@@ -159,16 +147,17 @@ TEST_F(NibControl, leavingTheControlRefreshesTheMarks)
 
 TEST_F(NibControl, wrongCheckDigitsShowTheErrorMarkWhichExplainsItself)
 {
-    const QString wrong = bankBranchAccount + (number.right(2) == "11" ? "12" : "11");
-    nib->setText(wrong);
+    nib->setText(bankBranchAccount + (number.right(2) == "11" ? "12" : "11"));
     EXPECT_FALSE(nib->Valid());
     EXPECT_TRUE(errorMark()->isVisible());
     EXPECT_FALSE(validMark()->isVisible());
 
-    form.setEnabled(false);
-    QTest::mouseClick(errorMark(), Qt::LeftButton); // a disabled control explains nothing (no box)
-    form.setEnabled(true);
     test::MessageBoxRecorder boxes;
+    form.setEnabled(false);
+    QTest::mouseClick(errorMark(), Qt::LeftButton);
+    form.setEnabled(true);
+    QTest::mouseClick(errorMark(), Qt::RightButton);
+    EXPECT_TRUE(boxes.shown().isEmpty()) << "a disabled control, or another button, explains nothing";
     QTest::mouseClick(errorMark(), Qt::LeftButton);
     ASSERT_EQ(boxes.shown().size(), 1);
     EXPECT_EQ(boxes.shown().first().icon, platform::MsgIcon::Information);
@@ -185,87 +174,53 @@ TEST_F(NibControl, writingTextDistributesOnlyWholeNumbers)
     nib->setText(number.left(20));
     EXPECT_EQ(nib->Text(), "") << "a partial value is never distributed";
     EXPECT_EQ(changed.count(), 1);
-    nib->setText(number + "9");
+    ASSERT_TRUE(nib->setProperty("Text", number + "9")) << "a host writes by name";
     EXPECT_EQ(nib->Text(), number) << "characters after the 21st are ignored";
     EXPECT_EQ(changed.count(), 2);
-    EXPECT_TRUE(nib->Valid());
 }
 
 TEST_F(NibControl, keepsItsSizeAndPersistsItsBackColour)
 {
-    EXPECT_EQ(nib->size(), QSize(179, 22));
     nib->resize(400, 100);
     EXPECT_EQ(nib->size(), QSize(179, 22));
     EXPECT_EQ(nib->extender().Width(), 2685);
-    EXPECT_EQ(nib->extender().Height(), 330);
 
     QSignalSpy changes(nib, &UserControl::propertyChanged);
     nib->setBackColor(nib->BackColor());
     EXPECT_EQ(changes.count(), 0) << "the same colour is no change";
     nib->setBackColor(platform::rgb(255, 0, 0));
-    const PropertyBag bag = nib->Save();
-    EXPECT_EQ(bag.ReadProperty("BackColor").toUInt(), platform::rgb(255, 0, 0));
     cNIB loaded;
-    loaded.Load(bag);
-    EXPECT_EQ(loaded.BackColor(), platform::rgb(255, 0, 0));
+    loaded.Load(nib->Save());
     EXPECT_EQ(loaded.palette().color(QPalette::Window), QColor(255, 0, 0));
     EXPECT_TRUE(cNIB().Save().contains("BackColor")) << "always written";
     PropertyBag literal;
     literal.WriteProperty("BackColor", "&HFF00&");
     loaded.Load(literal);
     EXPECT_EQ(loaded.BackColor(), 0x00FF00u) << "a colour written as a literal";
-
-    // A host reaches every member by name.
-    ASSERT_TRUE(nib->setProperty("Text", number));
-    bool valid = false;
-    ASSERT_TRUE(QMetaObject::invokeMethod(nib, "Valid", Q_RETURN_ARG(bool, valid)));
-    EXPECT_TRUE(valid);
-    QString digits;
-    ASSERT_TRUE(QMetaObject::invokeMethod(
-        nib, "CalculateCheckDigits", Q_RETURN_ARG(QString, digits), Q_ARG(QString, QString(19, '0'))));
-    EXPECT_EQ(digits, "98");
 }
 
 // A host may delete the control from its Changed event, wherever the user's editing raised
 // it: the last character typed, the check digits filled in on leaving, the last one erased.
 TEST_F(NibControl, survivesBeingDeletedFromItsChangedEvent)
 {
-    QPointer<cNIB> alive;
-    const auto keys = [&](const QString &text) {
-        for (const QChar c : text) {
-            if (alive && c == u'\b')
-                QTest::keyClick(QApplication::focusWidget(), Qt::Key_Backspace);
-            else if (alive)
-                QTest::keyClick(QApplication::focusWidget(), c.toLatin1());
-        }
-    };
     const struct
     {
-        std::function<void()> prepare;
-        std::function<void()> act;
-    } raisers[] = {
-        { [&] { box(0)->setFocus(); }, [&] { keys(number); } },
-        { [&] {
-             box(0)->setFocus();
-             keys(bankBranchAccount);
-         },
-            [&] { other->setFocus(); } },
-        { [&] {
-             nib->setText(number);
-             box(3)->setFocus();
-             QTest::keyClick(box(3), Qt::Key_End);
-         },
-            [&] { keys(QString(24, u'\b')); } },
+        QString before, after;
+        bool leave;
+    } paths[] = {
+        { "", number, false },
+        { bankBranchAccount, "", true },
+        { number, QString(24, u'\b'), false },
     };
-    for (const auto &raiser : raisers) {
-        if (!nib)
-            nib = new cNIB(&form);
-        alive = nib;
-        raiser.prepare();
-        QObject::connect(nib, &cNIB::Changed, nib, [&alive] { delete alive.data(); });
-        raiser.act();
+    for (const auto &path : paths) {
+        const QPointer<cNIB> alive = nib = new cNIB(&form);
+        box(0)->setFocus();
+        type(path.before);
+        QObject::connect(nib, &cNIB::Changed, nib, [alive] { delete alive.data(); });
+        type(path.after);
+        if (path.leave)
+            other->setFocus();
         QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
-        EXPECT_TRUE(alive.isNull());
-        nib = nullptr;
+        EXPECT_TRUE(alive.isNull()) << path.after.size();
     }
 }

@@ -40,14 +40,12 @@ public:
         SetUp();
     }
 
-    template <typename Event> void deleteOn(Event event, bool wholeWindow = false)
+    void goAway(bool wholeWindow)
     {
-        QObject::connect(control, event, [this, wholeWindow] {
-            if (wholeWindow)
-                delete window.data();
-            else
-                delete control.data();
-        });
+        if (wholeWindow)
+            delete window.data();
+        else
+            delete control.data();
     }
 
     QLineEdit *box() const { return entryBox(*control); }
@@ -90,26 +88,17 @@ public:
 
 TEST_F(NifLifetime, deletedFromInsideEachOfItsEvents)
 {
-    const struct
-    {
-        const char *event;
-        std::function<void(NifLifetime &, bool)> hook;
-    } events[] = {
-        { "Changed", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::Changed, w); } },
-        { "Validated", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::Validated, w); } },
-        { "NIFIndicated", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::NIFIndicated, w); } },
-        { "UpdatedInformation", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::UpdatedInformation, w); } },
-        { "NameUpdated", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::NameUpdated, w); } },
-        { "DataFinished", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::DataFinished, w); } },
-        { "Cleared", [](NifLifetime &t, bool w) { t.deleteOn(&cNIF::Cleared, w); } },
-    };
     for (const bool wholeWindow : { false, true }) {
-        for (const auto &event : events) {
+        for (const QString event : { "Changed", "Validated", "NIFIndicated", "UpdatedInformation", "NameUpdated",
+                 "DataFinished", "Cleared" }) {
             reset();
-            event.hook(*this, wholeWindow);
+            onEveryEvent(*control, [this, event, wholeWindow](const QString &raised) {
+                if (raised.section(':', 0, 0) == event)
+                    goAway(wholeWindow);
+            });
             walkUntilDeleted();
-            EXPECT_TRUE(control.isNull()) << event.event << " was raised on the user's path";
-            EXPECT_EQ(window.isNull(), wholeWindow) << event.event;
+            EXPECT_TRUE(control.isNull()) << event.toStdString() << " was raised on the user's path";
+            EXPECT_EQ(window.isNull(), wholeWindow) << event.toStdString();
         }
     }
 }
@@ -138,15 +127,9 @@ TEST_F(NifLifetime, deletedWhileSomethingOfItsOwnIsPending)
     for (const bool wholeWindow : { false, true }) {
         for (const auto &c : cases) {
             reset();
-            const auto goAway = [&] {
-                if (wholeWindow)
-                    delete window.data();
-                else
-                    delete control.data();
-            };
-            MenuChooser menu({}, goAway);
+            MenuChooser menu({}, [&] { goAway(wholeWindow); });
             ModalDriver dialogs([&](QDialog &) {
-                goAway();
+                goAway(wholeWindow);
                 return int(QDialog::Rejected);
             });
             c.open();
@@ -161,7 +144,10 @@ TEST_F(NifLifetime, deletedWhileSomethingOfItsOwnIsPending)
     auto *fetching = new cNIF(window);
     fetching->setValue("PT" + AnaNif);
     delete fetching;
-    QTest::qWait(20);
+    auto *later = new cNIF(window);
+    EventLog log(*later);
+    later->setValue("PT" + OtherNif);
+    ASSERT_TRUE(QTest::qWaitFor([&log] { return log.count("DataFinished") == 1; })) << "a later fetch answered";
 }
 
 TEST_F(NifLifetime, recordFormSurvivesItsHostsEvents)

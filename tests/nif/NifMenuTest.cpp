@@ -129,6 +129,7 @@ TEST_F(NifMenu, pasteReadsTheCountryCode)
         { "the first 100 characters", longNumber, "US", QString(98, '7') },
         { "an empty clipboard", "", "PT", "" },
         { "text without a code", "abc", "PT", "abc" },
+        { "another country's code only before a number", "US1A", "PT", "US1A" },
     };
     for (const Case &c : cases) {
         control->setCountryID("FR");

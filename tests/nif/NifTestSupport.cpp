@@ -61,17 +61,16 @@ bool MenuChooser::offered(const QString &name) const
     return entries.filter(QRegularExpression("^" + name + "\\|.*\\|on$")).size() == 1;
 }
 
-EventLog::EventLog(cNIF &control)
+void onEveryEvent(cNIF &control, const std::function<void(const QString &)> &heard)
 {
-    const auto plain = [this](const char *name) { return [this, name] { events << QString::fromLatin1(name); }; };
-    QObject::connect(&control, &cNIF::Changed, plain("Changed"));
-    QObject::connect(&control, &cNIF::Validated, plain("Validated"));
-    QObject::connect(&control, &cNIF::NIFIndicated, plain("NIFIndicated"));
-    QObject::connect(&control, &cNIF::Cleared, plain("Cleared"));
-    QObject::connect(&control, &cNIF::DataFinished, plain("DataFinished"));
+    const std::pair<const char *, void (cNIF::*)()> plain[]
+        = { { "Changed", &cNIF::Changed }, { "Validated", &cNIF::Validated }, { "NIFIndicated", &cNIF::NIFIndicated },
+              { "Cleared", &cNIF::Cleared }, { "DataFinished", &cNIF::DataFinished } };
+    for (const auto &[name, signal] : plain)
+        QObject::connect(&control, signal, [heard, name] { heard(QString::fromLatin1(name)); });
     QObject::connect(
-        &control, &cNIF::UpdatedInformation, [this](const QString &id) { events << "UpdatedInformation:" + id; });
-    QObject::connect(&control, &cNIF::NameUpdated, [this](const QString &name) { events << "NameUpdated:" + name; });
+        &control, &cNIF::UpdatedInformation, [heard](const QString &id) { heard("UpdatedInformation:" + id); });
+    QObject::connect(&control, &cNIF::NameUpdated, [heard](const QString &name) { heard("NameUpdated:" + name); });
 }
 
 void NifFixture::SetUp()

@@ -66,11 +66,17 @@ private:
     companion::NIFGrabberFactory m_previous;
 };
 
-// Every event of a control, as "Name" or "Name:argument", in the order raised.
+// Calls `heard` with every event of a control, as "Name" or "Name:argument", in the order raised.
+void onEveryEvent(cNIF &control, const std::function<void(const QString &)> &heard);
+
+// Every event of a control, in the order raised.
 class EventLog
 {
 public:
-    explicit EventLog(cNIF &control);
+    explicit EventLog(cNIF &control)
+    {
+        onEveryEvent(control, [this](const QString &event) { events << event; });
+    }
     QStringList events;
     int count(const QString &event) const { return int(events.count(event)); }
     void clear() { events.clear(); }

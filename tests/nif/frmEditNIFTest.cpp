@@ -121,10 +121,7 @@ TEST_F(RecordForm, loadsTheRecordIntoItsRows)
     EXPECT_EQ(row<cNIF>("conjuge")->Value(), "PT198765436");
     EXPECT_TRUE(row<QLineEdit>("status")->isReadOnly());
     EXPECT_FALSE(row<QLineEdit>("email")->isReadOnly());
-}
 
-TEST_F(RecordForm, maritalStatusRulesTheSpouseRow)
-{
     EXPECT_TRUE(row<cNIF>("conjuge")->Enabled()) << "a married holder's spouse can be given";
     for (const auto &[status, spouse] : std::map<int, bool> { { 0, false }, { 2, true }, { 5, false } }) {
         row<QComboBox>("estadocivil")->setCurrentIndex(status);

@@ -115,22 +115,12 @@ protected:
 
 TEST_F(SubjectSelector, possibleKeepsTheKindsInButtonOrder)
 {
-    const struct
-    {
-        const char *rule;
-        const char *written;
-        const char *stored;
-    } cases[] = {
-        { "all kinds", "*", "ABDSFCH" },
-        { "C only with B", "HCA", "AH" },
-        { "button order", "HBCA", "ABCH" },
-        { "case-sensitive letters, others ignored", "xSd-D", "DS" },
-    };
-    for (const auto &c : cases) {
-        selector->setPossible(QString::fromLatin1(c.written));
-        EXPECT_EQ(selector->Possible(), c.stored) << c.rule;
+    // All kinds; C only with B; button order; case-sensitive letters, others ignored.
+    for (const auto &[written, stored] :
+        { std::pair { "*", "ABDSFCH" }, { "HCA", "AH" }, { "HBCA", "ABCH" }, { "xSd-D", "DS" } }) {
+        selector->setPossible(QString::fromLatin1(written));
+        EXPECT_EQ(selector->Possible(), stored) << written;
     }
-
     QString empty;
     selector->setPossible(empty);
     EXPECT_EQ(selector->Possible(), "ABD");
@@ -206,7 +196,7 @@ TEST_F(SubjectSelector, selectingByEachPropertyAndReadingBack)
     EXPECT_TRUE(events.isEmpty()) << "writing raises no event";
 }
 
-TEST_F(SubjectSelector, clicksRaiseClickedThenChanged)
+TEST_F(SubjectSelector, clicksRaiseClickedThenChangedAndASecondClickMayEmpty)
 {
     selector->setPossible("*");
     selector->setSujeitoValueType("A");
@@ -226,10 +216,8 @@ TEST_F(SubjectSelector, clicksRaiseClickedThenChanged)
     EXPECT_EQ(pressed(), "C");
     click(u"B");
     EXPECT_EQ(pressed(), "B") << "B does not keep C";
-}
 
-TEST_F(SubjectSelector, secondClickEmptiesTheChoiceWithCanSelectNone)
-{
+    // With CanSelectNone a second click on the same button empties the choice.
     selector->setCanSelectNone(true);
     selector->setSujeitoValueType("A");
     click(u"A");

@@ -95,28 +95,18 @@ TEST(Helpers, roundUpGoesToTheNextWholeNumber)
     EXPECT_EQ(RoundUp(-1e300), std::numeric_limits<qint32>::min());
 }
 
-TEST(Helpers, bigModIsExactForFifteenDigits)
+// Their arithmetic is driven through the numbers that use them (French keys, Slovak and
+// Cypriot numbers); here only their answers outside it.
+TEST(Helpers, refuseWhatTheyCannotAnswer)
 {
-    EXPECT_EQ(BigMod(999999999999999LL, 97), 999999999999999LL % 97);
-    EXPECT_EQ(BigMod(99999999999999LL * 97, 97), 0);
     EXPECT_EQ(BigMod(5, 0), -1);
     EXPECT_EQ(BigMod(-5, 11), -1);
-}
-
-TEST(Helpers, letters)
-{
-    EXPECT_TRUE(IsLetter(u"a"));
-    EXPECT_TRUE(IsLetter(u"Z"));
-    for (const char16_t *text : { u"É", u"AB", u"", u"1", u"@", u"[" })
-        EXPECT_FALSE(IsLetter(text));
-
     EXPECT_EQ(AlphabetLetter(25), u'Z');
     EXPECT_EQ(AlphabetLetter(26), u'?');
     EXPECT_EQ(AlphabetLetter(-1), u'?');
-
-    const int oddValues[] = { 1, 0, 5, 7, 9, 13, 15, 17, 19, 21 };
-    for (int d = 0; d <= 9; ++d)
-        EXPECT_EQ(CyprusOddValue(d), oddValues[d]) << d;
     EXPECT_EQ(CyprusOddValue(10), -1);
     EXPECT_EQ(CyprusOddValue(-1), -1);
+    EXPECT_TRUE(IsLetter(u"a"));
+    for (const char16_t *text : { u"É", u"AB", u"", u"1", u"@", u"[" })
+        EXPECT_FALSE(IsLetter(text));
 }
