@@ -3,7 +3,10 @@
 #include "platform/Settings.h"
 #include "support/TestSupport.h"
 
+#include <QFile>
 #include <QTest>
+
+#include <sys/stat.h>
 
 namespace zelctl::test {
 
@@ -39,7 +42,7 @@ companion::LookupSettings LookupFixture::settings() const
     return settings;
 }
 
-QStringList LookupFixture::fetch(companion::ChainedNIFGrabber &grabber, const QString &number)
+QStringList fetch(companion::NIFGrabber &grabber, const QString &number, const QString &meanwhile)
 {
     QStringList events;
     QObject context;
@@ -49,8 +52,15 @@ QStringList LookupFixture::fetch(companion::ChainedNIFGrabber &grabber, const QS
     QObject::connect(&grabber, &companion::NIFGrabber::Finished, &context, [&] { events << "Finished"; });
     grabber.Fetch(number);
     EXPECT_TRUE(grabber.IsBusy() && events.isEmpty()) << "Fetch returns before anything is answered";
+    if (!meanwhile.isEmpty())
+        grabber.Fetch(meanwhile);
     EXPECT_TRUE(QTest::qWaitFor([&] { return !grabber.IsBusy(); }, 10000));
     return events;
+}
+
+void makeFifo(const QString &path)
+{
+    ASSERT_EQ(::mkfifo(QFile::encodeName(path).constData(), 0600), 0);
 }
 
 } // namespace zelctl::test

@@ -18,6 +18,12 @@ inline const QString UnknownHolder = QStringLiteral("PT123456789");
 inline const QString TimeoutSeconds = QStringLiteral("1.5");
 inline const QString TimedOut = QStringLiteral("O serviço não respondeu em 1.5 s");
 
+// Runs one fetch to its end (with a second one asked for meanwhile, if given) and gives
+// its events: "Starting", "ReceivedInformation:<id>", "Finished".
+QStringList fetch(companion::NIFGrabber &grabber, const QString &number, const QString &meanwhile = {});
+// Makes a FIFO at `path`, which a reader must refuse rather than wait on.
+void makeFifo(const QString &path);
+
 // Points the user's lookup settings at a fake service on 127.0.0.1, with remote lookups
 // allowed and a short timeout, and takes them back afterwards.
 class LookupFixture : public ::testing::Test
@@ -29,10 +35,6 @@ protected:
 
     // Settings for a fetcher the test makes: the fake service and a cache file of its own.
     companion::LookupSettings settings() const;
-    // Runs one fetch to its end and gives its events: "Starting", "ReceivedInformation:<id>",
-    // "Finished".
-    QStringList fetch(companion::ChainedNIFGrabber &grabber, const QString &number);
-
     FakeVatService service;
     QTemporaryDir folder;
 };

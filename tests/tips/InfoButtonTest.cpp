@@ -59,33 +59,19 @@ struct PlacedButton : ::testing::Test
     }
 };
 
-QImage iconOn(const QString &name, const QColor &background)
-{
-    QImage expected(16, 16, QImage::Format_RGB32);
-    expected.fill(background);
-    QPainter painter(&expected);
-    painter.drawImage(0, 0, QImage(":/zelctl/icons/" + name + ".png"));
-    return expected;
-}
-
 } // namespace
 
-TEST_F(PlacedButton, keepsItsSizeOf240Twips)
+TEST_F(PlacedButton, keepsItsSizeOf240TwipsAndBreaksTheTipTextIntoLines)
 {
     button->extender().Move(0, 0, 1000, 3000);
-    EXPECT_EQ(button->extender().Width(), 240);
-    EXPECT_EQ(button->extender().Height(), 240);
-}
-
-TEST_F(PlacedButton, lineBreaksInTheTipText)
-{
+    EXPECT_EQ(QSize(button->extender().Width(), button->extender().Height()), QSize(240, 240));
     int x = 1;
     for (const QString &text : { QString("um||dois"), QString("um\\ndois"), QString("  um||dois  ") }) {
+        SCOPED_TRACE(text.toStdString());
         button->setTipText(text);
         hover(QPoint(++x, 5));
-        ASSERT_NE(button->GetTooltipClass(), nullptr) << text.toStdString();
-        EXPECT_EQ(button->GetTooltipClass()->TipText(), "um\r\ndois") << text.toStdString();
         ASSERT_NE(tipWindow(), nullptr);
+        EXPECT_EQ(button->GetTooltipClass()->TipText(), "um\r\ndois");
         EXPECT_EQ(tipWindow()->text(), "um\ndois");
     }
 }
@@ -129,32 +115,22 @@ TEST_F(PlacedButton, blankTextRemovesTheTip)
     EXPECT_EQ(tipWindow()->text(), "de volta");
 }
 
-TEST_F(PlacedButton, clickDependsOnTheAction)
+TEST_F(PlacedButton, clickDependsOnTheActionWhichIsKeptTrimmed)
 {
-    struct Row
-    {
-        QString action;
-        QString stored;
-        int clicks;
-        QStringList opened;
-    };
-    const QList<Row> rows = {
-        { " Click ", "Click", 1, {} },
-        { "NOTHING", "NOTHING", 0, {} },
-        { "nothing ", "nothing", 0, {} },
-        { "https://www.example.pt/ajuda", "https://www.example.pt/ajuda", 1, { "https://www.example.pt/ajuda" } },
-        { "/sem/tal/ficheiro.pdf", "/sem/tal/ficheiro.pdf", 1, { "/sem/tal/ficheiro.pdf" } },
-        { "README.md", "README.md", 1, { modFuncs::GetRootPath() + "README.md" } },
-    };
-    for (const Row &row : rows) {
+    const std::tuple<QString, int, QString> rows[] = { { " Click ", 1, "" }, { "NOTHING", 0, "" },
+        { "nothing ", 0, "" }, { "https://www.example.pt/ajuda", 1, "https://www.example.pt/ajuda" },
+        { "/sem/tal/ficheiro.pdf", 1, "/sem/tal/ficheiro.pdf" },
+        { "README.md", 1, modFuncs::GetRootPath() + "README.md" } };
+    for (const auto &[action, clicks, opened] : rows) {
+        SCOPED_TRACE(action.toStdString());
         ShellRecorder shell(false);
-        button->setAction(row.action);
-        EXPECT_EQ(button->Action(), row.stored);
+        button->setAction(action);
+        EXPECT_EQ(button->Action(), action.trimmed());
         EXPECT_EQ(button->cursor().shape(), Qt::PointingHandCursor);
-        QSignalSpy clicks(button, &InfoButton::Click);
+        QSignalSpy clicked(button, &InfoButton::Click);
         QTest::mouseClick(button, Qt::LeftButton, {}, QPoint(8, 8));
-        EXPECT_EQ(clicks.count(), row.clicks) << row.action.toStdString();
-        EXPECT_EQ(shell.opened, row.opened) << row.action.toStdString();
+        EXPECT_EQ(clicked.count(), clicks);
+        EXPECT_EQ(shell.opened.join('|'), opened);
     }
 }
 
@@ -177,26 +153,23 @@ TEST_F(PlacedButton, clickWithoutActionPopsTheTipUp)
     EXPECT_TRUE(shell.opened.isEmpty());
 }
 
-TEST_F(PlacedButton, iconFollowsStyleAndEnabledState)
+TEST_F(PlacedButton, iconFollowsStyleAndEnabledStateOnTheAmbientBackColour)
 {
     const QColor back = platform::toQColor(button->ambient().BackColor);
-    struct Row
-    {
-        InfoButton::IB_STYLE_ENUM style;
-        bool enabled;
-        const char *icon;
-    };
-    for (const Row &row :
-        { Row { InfoButton::IB_INFO, true, "INFO" }, Row { InfoButton::IB_INFO, false, "INFO_DISABLED" },
-            Row { InfoButton::IB_WARNING, true, "WARNING" }, Row { InfoButton::IB_WARNING, false, "WARNING_DISABLED" },
-            Row { InfoButton::IB_ERROR, true, "ERROR" }, Row { InfoButton::IB_ERROR, false, "WARNING_DISABLED" } }) {
-        button->setStyle(row.style);
-        button->setEnabled(row.enabled);
-        EXPECT_EQ(button->grab().toImage().convertToFormat(QImage::Format_RGB32), iconOn(row.icon, back)) << row.icon;
+    const std::tuple<InfoButton::IB_STYLE_ENUM, bool, const char *> rows[]
+        = { { InfoButton::IB_INFO, true, "INFO" }, { InfoButton::IB_INFO, false, "INFO_DISABLED" },
+              { InfoButton::IB_ERROR, true, "ERROR" }, { InfoButton::IB_ERROR, false, "WARNING_DISABLED" } };
+    for (const auto &[style, enabled, icon] : rows) {
+        button->setStyle(style);
+        button->setEnabled(enabled);
+        QImage expected(16, 16, QImage::Format_RGB32);
+        expected.fill(back);
+        QPainter(&expected).drawImage(0, 0, QImage(QStringLiteral(":/zelctl/icons/%1.png").arg(icon)));
+        EXPECT_EQ(button->grab().toImage().convertToFormat(QImage::Format_RGB32), expected) << icon;
     }
 }
 
-TEST(InfoButtonPersistence, roundTripKeepsEveryProperty)
+TEST(InfoButtonPersistence, roundTripKeepsEveryPropertyAndAbsentNamesGiveTheDefaults)
 {
     InfoButton saved;
     saved.InitNew();
@@ -208,37 +181,25 @@ TEST(InfoButtonPersistence, roundTripKeepsEveryProperty)
     saved.setTipText("linha um||linha dois");
     saved.setTransparent(true);
     const PropertyBag bag = saved.Save();
+    InfoButton loaded;
+    loaded.Load(bag);
+    const auto properties = [](const InfoButton &b) {
+        return QStringList { b.Action(), QString::number(b.Style()), QString::number(b.ToolTipStyle()),
+            b.ToolTipTitle(), QString::number(b.Enabled()), b.TipText(), QString::number(b.Transparent()) };
+    };
+    EXPECT_EQ(properties(loaded),
+        QStringList({ "https://www.example.pt", "2", "0", "Erro", "0", "linha um||linha dois", "1" }));
+    EXPECT_EQ(loaded.Save(), bag);
     EXPECT_EQ(bag.names(),
         QStringList({ "ibutton.action", "ibutton.enabled", "ibutton.bstyle", "ibutton.style", "ibutton.title",
             "ibutton.tiptext", "ibutton.transparent" }));
 
-    InfoButton loaded;
-    loaded.Load(bag);
-    EXPECT_EQ(loaded.Action(), "https://www.example.pt");
-    EXPECT_EQ(loaded.Style(), InfoButton::IB_ERROR);
-    EXPECT_EQ(loaded.ToolTipStyle(), InfoButton::TTS_DEFAULT);
-    EXPECT_EQ(loaded.ToolTipTitle(), "Erro");
-    EXPECT_FALSE(loaded.Enabled());
-    EXPECT_EQ(loaded.TipText(), "linha um||linha dois");
-    EXPECT_TRUE(loaded.Transparent());
-    EXPECT_EQ(loaded.Save(), bag);
-}
-
-TEST(InfoButtonPersistence, absentNamesGiveTheDefaults)
-{
     PropertyBag old;
     old.WriteProperty("ToolTipText", "texto antigo");
-    InfoButton loaded;
-    loaded.Load(old);
-    EXPECT_EQ(loaded.TipText(), "texto antigo");
-    EXPECT_EQ(loaded.Style(), InfoButton::IB_INFO);
-    EXPECT_EQ(loaded.ToolTipStyle(), InfoButton::TTS_BALLOON);
-    EXPECT_EQ(loaded.ToolTipTitle(), "Informação");
-    EXPECT_TRUE(loaded.Enabled());
-
-    PropertyBag both;
-    both.WriteProperty("ToolTipText", "antigo");
-    both.WriteProperty("ibutton.tiptext", "novo");
-    loaded.Load(both);
-    EXPECT_EQ(loaded.TipText(), "novo");
+    InfoButton fresh;
+    fresh.Load(old);
+    EXPECT_EQ(properties(fresh), QStringList({ "", "0", "1", "Informação", "1", "texto antigo", "0" }));
+    old.WriteProperty("ibutton.tiptext", "novo");
+    fresh.Load(old);
+    EXPECT_EQ(fresh.TipText(), "novo");
 }

@@ -2,22 +2,13 @@
 
 #include "tips/TooltipControl.h"
 
-#include <QList>
-#include <QString>
+#include <QStringList>
 
 namespace zelctl::test {
 
-// One message sent to a tooltip window, with what its pointer argument named at the time.
-struct SentMessage
-{
-    tooltipControl::UINT message = 0;
-    tooltipControl::WPARAM wParam = 0;
-    tooltipControl::LPARAM lParam = 0;
-    tooltipControl::TOOLINFOA tool; // for TTM_ADDTOOLA and TTM_UPDATETIPTEXTA
-    QString text; // the tool's text, or the title of TTM_SETTITLEA
-};
-
-// Records every message sent to tooltip windows while it lives.
+// Records every message sent to tooltip windows while it lives, each as one line:
+// "add <text>", "title <icon> <title>", "text <text>", "delay <kind> <ms>", "fore <colour>",
+// "back <colour>", "activate <wParam>"; the last tool record sent is kept whole.
 class MessageSpy
 {
 public:
@@ -26,13 +17,13 @@ public:
     MessageSpy(const MessageSpy &) = delete;
     MessageSpy &operator=(const MessageSpy &) = delete;
 
-    const QList<SentMessage> &sent() const { return m_sent; }
-    // The message numbers alone, in order.
-    QList<tooltipControl::UINT> messages() const;
+    const QStringList &sent() const { return m_sent; }
+    const tooltipControl::TOOLINFOA &tool() const { return m_tool; }
     void clear() { m_sent.clear(); }
 
 private:
-    QList<SentMessage> m_sent;
+    QStringList m_sent;
+    tooltipControl::TOOLINFOA m_tool;
     tooltipControl::MessageHook m_previous;
 };
 
