@@ -3,12 +3,16 @@
 #include "platform/OleColor.h"
 #include "platform/Pointer.h"
 
+#include <QApplication>
 #include <QImage>
+#include <QSignalSpy>
 #include <QTemporaryDir>
 #include <QTest>
 #include <QWidget>
 
 #include <gtest/gtest.h>
+
+#include <functional>
 
 namespace zelctl::test {
 
@@ -18,27 +22,11 @@ template <typename Control> platform::OleColor pixel(Control &control, int x, in
     return platform::fromQColor(QColor(control.surface().image().pixel(x, y)));
 }
 
-struct PixelAt
-{
-    int x;
-    int y;
-    platform::OleColor colour;
-};
-
-// Checks the colours at the given positions, naming each position that differs.
-template <typename Control> void expectPixels(Control &control, std::initializer_list<PixelAt> expected)
-{
-    for (const PixelAt &p : expected)
-        EXPECT_EQ(pixel(control, p.x, p.y), p.colour) << "at " << p.x << "," << p.y;
-}
-
 // Pictures written for one test: solid blocks of colour, optionally with a transparent
 // border, saved as PNG files in a private folder.
 class PictureFolder
 {
 public:
-    PictureFolder() { EXPECT_TRUE(m_dir.isValid()); }
-
     QString write(const QString &name, QSize size, QColor fill, int transparentBorder = 0)
     {
         QImage image(size, QImage::Format_ARGB32);
@@ -46,9 +34,8 @@ public:
         for (int y = transparentBorder; y < size.height() - transparentBorder; ++y)
             for (int x = transparentBorder; x < size.width() - transparentBorder; ++x)
                 image.setPixelColor(x, y, fill);
-        const QString path = m_dir.filePath(name);
-        EXPECT_TRUE(image.save(path, "PNG"));
-        return path;
+        EXPECT_TRUE(image.save(path(name), "PNG"));
+        return path(name);
     }
 
     QString path(const QString &name) const { return m_dir.filePath(name); }
@@ -62,6 +49,7 @@ class SkinForm : public ::testing::Test
 {
 protected:
     QWidget form;
+    PictureFolder pictures;
 
     void showForm()
     {
@@ -69,6 +57,40 @@ protected:
         form.show();
         ASSERT_TRUE(QTest::qWaitForWindowExposed(&form));
         QTest::mouseMove(&form, QPoint(390, 290));
+    }
+    // Out of the control and on, as a pointer leaving it moves.
+    void moveAway()
+    {
+        QTest::mouseMove(&form, QPoint(300, 200));
+        QTest::mouseMove(&form, QPoint(301, 201));
+    }
+    // The pointer resting on `control` raises MouseIn once; leaving it, by moving away or by
+    // the window's Leave where the pointer cannot be captured, raises MouseOut once and frees
+    // the pointer. `whileIn` and `afterwards` check the looks.
+    template <typename Control>
+    void expectHoverInAndOut(
+        Control *control, QPoint at, const std::function<void()> &whileIn, const std::function<void()> &afterwards)
+    {
+        for (const bool byLeave : { false, true }) {
+            SCOPED_TRACE(byLeave ? "Leave" : "moved away");
+            QSignalSpy in(control, &Control::MouseIn);
+            QSignalSpy out(control, &Control::MouseOut);
+            QTest::mouseMove(control, at);
+            QTest::mouseMove(control, at + QPoint(1, 1));
+            EXPECT_EQ(in.count(), 1);
+            EXPECT_EQ(platform::capturedWidget(), control);
+            whileIn();
+            if (byLeave) {
+                QEvent leave(QEvent::Leave);
+                QApplication::sendEvent(control, &leave);
+            } else {
+                moveAway();
+            }
+            EXPECT_EQ(in.count(), 1);
+            EXPECT_EQ(out.count(), 1);
+            EXPECT_EQ(platform::capturedWidget(), nullptr);
+            afterwards();
+        }
     }
     void TearDown() override { platform::releaseCapture(); }
 };

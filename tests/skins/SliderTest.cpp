@@ -4,7 +4,6 @@
 #include "skins/cSlider.h"
 
 #include <QLabel>
-#include <QSignalSpy>
 
 using namespace zelctl;
 
@@ -12,6 +11,7 @@ namespace {
 
 constexpr int ButtonWidth = 240;
 
+// How the slider looks open and closed is in the golden pictures.
 class Slider : public zelctl::test::SkinForm
 {
 protected:
@@ -41,49 +41,31 @@ TEST(SliderCreation, raisesSlidedOnceAndStartsClosed)
     EXPECT_EQ(slided.count(), 1);
     EXPECT_FALSE(slider->SlideOpen());
     EXPECT_EQ(slider->extender().Width(), ButtonWidth);
-    EXPECT_EQ(slider->button()->Caption(), QStringLiteral("è"));
 }
 
-TEST_F(Slider, anEmptySliderOpensToButtonWidthPlus300)
+TEST_F(Slider, opensWideEnoughForItsContentsAndKeepsTheButtonAtTheRightEdge)
 {
     QSignalSpy slided(slider, &cSlider::Slided);
     slider->setSlideOpen(true);
-    EXPECT_EQ(slided.count(), 1);
-    EXPECT_EQ(width(), ButtonWidth + 300);
-    EXPECT_EQ(cc->Left(), 300);
-    EXPECT_EQ(cc->Caption(), QStringLiteral("ç"));
-
     slider->setSlideOpen(true);
     EXPECT_EQ(slided.count(), 1) << "setting the current value does nothing";
-}
+    EXPECT_EQ(width(), ButtonWidth + 300) << "an empty slider";
+    slider->setSlideOpen(false);
 
-TEST_F(Slider, opensWideEnoughForItsContentsAndClosesToTheButton)
-{
     auto *field = new QLabel(QStringLiteral("NIF"), slider);
     field->setGeometry(30, 5, 104, 20); // ends at 134 px, 2010 twips
-    auto *other = new QLabel(QStringLiteral("Nome"), slider);
-    other->setGeometry(20, 25, 50, 20);
+    (new QLabel(QStringLiteral("Nome"), slider))->setGeometry(20, 25, 50, 20);
     slider->setSlideOpen(true);
     EXPECT_EQ(width(), 2010 + ButtonWidth + 300);
     EXPECT_EQ(cc->Left(), width() - ButtonWidth);
-    EXPECT_EQ(cc->Top(), 0);
     EXPECT_EQ(cc->Height(), 600) << "the button spans the full height";
-
-    slider->setSlideOpen(false);
-    EXPECT_EQ(width(), ButtonWidth);
-    EXPECT_EQ(cc->Left(), 0);
-    EXPECT_EQ(cc->Caption(), QStringLiteral("è"));
-}
-
-TEST_F(Slider, resizeKeepsTheButtonOnTheRightEdgeWhenOpen)
-{
-    slider->setSlideOpen(true);
     slider->extender().setHeight(900);
     slider->extender().setWidth(3000);
     EXPECT_EQ(cc->Left(), 3000 - ButtonWidth);
     EXPECT_EQ(cc->Height(), 900);
-    EXPECT_EQ(cc->Width(), ButtonWidth);
+
     slider->setSlideOpen(false);
+    EXPECT_EQ(width(), ButtonWidth);
     slider->extender().setHeight(450);
     EXPECT_EQ(cc->Left(), 0);
     EXPECT_EQ(cc->Height(), 450);
@@ -101,17 +83,11 @@ TEST_F(Slider, theButtonTogglesShowsArrowsAndItsHoverRestylesIt)
     EXPECT_EQ(cc->text(), QString(QChar(0x27A1)));
     EXPECT_EQ(slided.count(), 2);
 
-    struct Look
-    {
-        qint32 style;
-        qint32 bevel;
-        quint32 caption;
-        bool operator==(const Look &) const = default;
-    };
-    const auto look = [this] { return Look { cc->ButtonStyle(), cc->BevelWidth(), cc->ForeColor() }; };
-    EXPECT_EQ(look(), (Look { CommandButton::FlatStyle, 0, 0x404040u }));
+    const auto look = [this] { return QList<qint64> { cc->ButtonStyle(), cc->BevelWidth(), cc->ForeColor() }; };
+    const QList<qint64> plain { CommandButton::FlatStyle, 0, 0x404040 };
+    EXPECT_EQ(look(), plain);
     Q_EMIT cc->MouseHover(true);
-    EXPECT_EQ(look(), (Look { 2, 3, 0xC00000u }));
+    EXPECT_EQ(look(), (QList<qint64> { 2, 3, 0xC00000 }));
     Q_EMIT cc->MouseHover(false);
-    EXPECT_EQ(look(), (Look { CommandButton::FlatStyle, 0, 0x404040u }));
+    EXPECT_EQ(look(), plain);
 }

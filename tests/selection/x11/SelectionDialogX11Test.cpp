@@ -34,23 +34,3 @@ TEST(SelectionDialogOnScreen, aCountryIsFoundByTypingAndTakenWithEnter)
     EXPECT_EQ(selection.SelectCountry({}, GSEL_All, filter), QStringLiteral("RU"));
     EXPECT_EQ(visibleItems, 1);
 }
-
-TEST(SelectionDialogOnScreen, enterOnTheItemWithTheFocusChoosesIt)
-{
-    frmSelector::setZoomStepInterval(0);
-    clsGFXSelection selection;
-    QList<GFXItem> items(3);
-    for (int i = 0; i < items.size(); ++i)
-        items[i].Title = QStringLiteral("Opção %1").arg(i);
-    items[1].Default = true;
-    test::ModalDriver user([](QDialog &dialog) {
-        dialog.show();
-        EXPECT_TRUE(QTest::qWaitForWindowActive(&dialog));
-        EXPECT_EQ(QApplication::focusWidget()->objectName(), QStringLiteral("btnSelector"));
-        QTest::keyClick(QApplication::focusWidget(), Qt::Key_Return);
-        return dialog.result();
-    });
-    const GFXResult result = selection.SelectFrom({}, items);
-    EXPECT_TRUE(result.Accepted);
-    EXPECT_EQ(result.SelectedItem.Title, QStringLiteral("Opção 1"));
-}
