@@ -253,8 +253,9 @@ TEST_F(SelectionTest, theFormShowsTheItemsAsGivenInTheLaidOutGrid)
     QImage half(8, 6, QImage::Format_ARGB32);
     half.fill(QColor(0, 120, 255, 128));
     half.setPixelColor(0, 0, Qt::transparent);
-    items[2].Image = folder.filePath(QStringLiteral("half.png"));
-    ASSERT_TRUE(half.save(items[2].Image));
+    const QString halfFile = folder.filePath(QStringLiteral("half.png"));
+    ASSERT_TRUE(half.save(halfFile));
+    items[2].Image = halfFile;
     GFXSelection s;
     s.Subtitle = QStringLiteral("Escolha um");
     s.DisableCancel = true;

@@ -61,7 +61,7 @@ TEST_F(Frame, raisesPointerEventsButTracksNoHover)
         events << QStringLiteral("down %1 %2 %3 %4").arg(button).arg(shift).arg(x).arg(y);
     });
     QObject::connect(frame, &skQuadro::MouseIn, [&] { events << "in"; });
-    QTest::mouseMove(frame, QPoint(5, 5));
+    QTest::mouseMove(frame, QPoint(6, 8));
     QTest::mouseClick(frame, Qt::RightButton, Qt::ShiftModifier, QPoint(5, 6));
     EXPECT_EQ(events, (QStringList { "move", "down 2 1 75 90" })) << "right button, shift, position in twips";
     EXPECT_EQ(platform::capturedWidget(), nullptr);
