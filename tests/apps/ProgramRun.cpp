@@ -1,7 +1,9 @@
 #include "ProgramRun.h"
 
 #include <QFile>
+#include <QProcess>
 #include <QTemporaryDir>
+#include <QTest>
 
 #include <gtest/gtest.h>
 
@@ -106,6 +108,21 @@ ProgramRun runShellLimited(const QString &commandLine)
 {
     return runLimited(
         QStringLiteral("/bin/sh"), { QStringLiteral("-c"), commandLine, QStringLiteral(ZELCTL_CLI_FILE) });
+}
+
+ProgramRun runCli(const QStringList &args, const QByteArray &input)
+{
+    QProcess process;
+    process.start(QStringLiteral(ZELCTL_CLI_FILE), args);
+    EXPECT_TRUE(process.waitForStarted());
+    process.write(input);
+    process.closeWriteChannel();
+    EXPECT_TRUE(QTest::qWaitFor([&] { return process.state() == QProcess::NotRunning; }, 60000));
+    ProgramRun run;
+    run.exitCode = process.exitStatus() == QProcess::NormalExit ? process.exitCode() : -1;
+    run.out = process.readAllStandardOutput();
+    run.err = process.readAllStandardError();
+    return run;
 }
 
 } // namespace zelctl::test

@@ -30,4 +30,8 @@ ProgramRun runLimited(const QString &program, const QStringList &args, const QSt
 // Runs a shell command line the same way; "$0" in it is the zelctl tool.
 ProgramRun runShellLimited(const QString &commandLine);
 
+// Runs the zelctl tool with args and input on its standard input while this process's event
+// loop turns (a test may serve the tool from it). No peak memory is measured.
+ProgramRun runCli(const QStringList &args, const QByteArray &input = {});
+
 } // namespace zelctl::test
