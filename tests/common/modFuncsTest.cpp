@@ -13,20 +13,10 @@
 
 #include <thread>
 
-#include <sys/stat.h>
-
 using namespace zelctl;
 using namespace zelctl::modFuncs;
 
 namespace {
-
-// The root folder is cached per thread, so each case asks from a thread of its own.
-QString rootPathOnFreshThread()
-{
-    QString root;
-    std::thread([&] { root = GetRootPath(); }).join();
-    return root;
-}
 
 class RootPath : public ::testing::Test
 {
@@ -38,43 +28,37 @@ protected:
 
 } // namespace
 
-TEST_F(RootPath, withNoStoredValueTheCurrentFolderBecomesTheRootAndIsStored)
+// With no stored value the current folder becomes the root and is stored (in the
+// case-folded store); a stored one gets a trailing slash but is not rewritten; once computed
+// it is kept.
+TEST_F(RootPath, comesFromTheSettingsOrTheCurrentFolderAndIsKept)
 {
     platform::DeleteSetting("ZEL", "Setup", "RootPath");
-    const QString expected = QDir::currentPath() + "/";
-    EXPECT_EQ(rootPathOnFreshThread(), expected);
-    EXPECT_EQ(platform::GetSetting("zel", "Setup", "RootPath"), expected) << "stored, in the case-folded store";
-}
+    const QString current = QDir::currentPath() + "/";
+    QString root; // cached per thread: each case asks from a thread of its own
+    std::thread([&] { root = GetRootPath(); }).join();
+    EXPECT_EQ(root, current);
+    EXPECT_EQ(platform::GetSetting("zel", "Setup", "RootPath"), current);
 
-TEST_F(RootPath, aStoredValueGetsATrailingSlashButIsNotRewritten)
-{
     platform::SaveSetting("zEL", "Setup", "RootPath", "/opt/zel");
-    EXPECT_EQ(rootPathOnFreshThread(), "/opt/zel/");
-    EXPECT_EQ(platform::GetSetting("zEL", "Setup", "RootPath"), "/opt/zel");
-}
-
-TEST_F(RootPath, isKeptOnceComputed)
-{
-    platform::SaveSetting("zEL", "Setup", "RootPath", "/first/");
-    QString first, second;
+    QString first, stored, second;
     std::thread([&] {
         first = GetRootPath();
+        stored = platform::GetSetting("zEL", "Setup", "RootPath");
         platform::SaveSetting("zEL", "Setup", "RootPath", "/second/");
         second = GetDataPath();
     }).join();
-    EXPECT_EQ(first, "/first/");
-    EXPECT_EQ(second, "/first/data/");
+    EXPECT_EQ(first, "/opt/zel/");
+    EXPECT_EQ(stored, "/opt/zel") << "not rewritten";
+    EXPECT_EQ(second, "/opt/zel/data/");
 }
 
 TEST(ReadWholeFile, decodesWindows1252)
 {
     QTemporaryDir dir;
-    QFile file(dir.filePath("pt.txt"));
-    ASSERT_TRUE(file.open(QIODevice::WriteOnly));
-    file.write("Jo\xe3o\t\x80\x93\x9f\r\n");
-    file.close();
-    EXPECT_EQ(ReadWholeFile(file.fileName()), QString::fromUtf8("João\t€“Ÿ\r\n"));
-    EXPECT_EQ(SafeFileLength(file.fileName()), 10);
+    const QString file = test::writeFile(dir.filePath("pt.txt"), "Jo\xe3o\t\x80\x93\x9f\r\n");
+    EXPECT_EQ(ReadWholeFile(file), QString::fromUtf8("João\t€“Ÿ\r\n"));
+    EXPECT_EQ(SafeFileLength(file), 10);
 }
 
 TEST(ReadWholeFile, missingOrEmptyFileShowsTheMessageUnlessQuiet)
@@ -96,20 +80,13 @@ TEST(ReadWholeFile, missingOrEmptyFileShowsTheMessageUnlessQuiet)
         QString::fromUtf8("Não foi possível aceder ao ficheiro:\n") + missing
             + QString::fromUtf8("\n\nPor favor verifique se existe uma nova versão desta aplicação"));
 
-    QFile empty(dir.filePath("empty.txt"));
-    ASSERT_TRUE(empty.open(QIODevice::WriteOnly));
-    empty.close();
-    EXPECT_EQ(ReadWholeFile(empty.fileName()), "");
+    EXPECT_EQ(ReadWholeFile(test::writeFile(dir.filePath("empty.txt"), "")), "");
     EXPECT_EQ(boxes.shown().size(), 2) << "an empty file is treated as a missing one";
     EXPECT_EQ(SafeFileLength(dir.path()), 0) << "a folder has no length";
 
     // A FIFO would make the reader wait for a writer; a huge file would fill the memory.
-    const QString fifo = dir.filePath("fifo.txt");
-    ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
-    QFile huge(dir.filePath("huge.txt"));
-    ASSERT_TRUE(huge.open(QIODevice::WriteOnly) && huge.resize(MaxDataFileBytes + 1));
-    huge.close();
-    for (const QString &path : { fifo, huge.fileName(), QStringLiteral("/dev/zero") })
+    for (const QString &path : { test::makeFifo(dir.filePath("fifo.txt")),
+             test::sizedFile(dir.filePath("huge.txt"), MaxDataFileBytes + 1), QStringLiteral("/dev/zero") })
         EXPECT_EQ(ReadWholeFile(path), "") << path.toStdString();
     EXPECT_EQ(boxes.shown().size(), 5);
 }
@@ -167,6 +144,11 @@ TEST(WindowOperations, objectWindowRectComesFromTheHwndProperty)
     EXPECT_EQ(rect.right - rect.left, window.frameGeometry().width());
     EXPECT_EQ(rect.bottom - rect.top, window.frameGeometry().height());
     EXPECT_EQ(rect.left, window.frameGeometry().left());
+    QWidget child(&window); // a control: its own rectangle, in screen coordinates
+    child.setGeometry(5, 6, 20, 10);
+    child.setProperty("hWnd", platform::handleOf(&child));
+    const QPoint origin = child.mapToGlobal(QPoint());
+    EXPECT_EQ(GetObjectWindowRect(&child), (RECT { origin.x(), origin.y(), origin.x() + 20, origin.y() + 10 }));
 
     QObject noWindow;
     EXPECT_EQ(GetObjectWindowRect(&noWindow), RECT {});

@@ -14,8 +14,6 @@
 
 #include <gtest/gtest.h>
 
-#include <sys/stat.h>
-
 using namespace zelctl;
 
 namespace {
@@ -120,18 +118,8 @@ TEST(FormFile, unnamedControlsOfOneClassKeepTheirOwnProperties)
 TEST(FormFile, refusesWhatIsNotAFormWithAReasonAndWithoutWaiting)
 {
     QTemporaryDir dir;
-    const auto write = [&dir](const QString &name, const QByteArray &bytes) {
-        QFile file(dir.filePath(name));
-        EXPECT_TRUE(file.open(QIODevice::WriteOnly));
-        file.write(bytes);
-        return file.fileName();
-    };
-    const QString fifo = dir.filePath("fifo.json");
-    ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
-    QFile large(dir.filePath("large.json"));
-    ASSERT_TRUE(large.open(QIODevice::WriteOnly));
-    ASSERT_TRUE(large.resize(FormFile::MaxFileBytes + 1));
-    large.close();
+    const auto write
+        = [&dir](const QString &name, const QByteArray &bytes) { return test::writeFile(dir.filePath(name), bytes); };
     const QByteArray manyControls = "{\"controls\": [" + QByteArray("{},").repeated(FormFile::MaxControls) + "{}]}";
     QJsonArray properties;
     for (int i = 0; i <= PropertyBag::MaxEntries; ++i)
@@ -147,9 +135,9 @@ TEST(FormFile, refusesWhatIsNotAFormWithAReasonAndWithoutWaiting)
     } cases[] = {
         { dir.filePath("missing.json"), "Não foi possível ler" },
         { dir.path(), "não é um ficheiro comum" },
-        { fifo, "não é um ficheiro comum" },
+        { test::makeFifo(dir.filePath("fifo.json")), "não é um ficheiro comum" },
         { "/dev/zero", "não é um ficheiro comum" },
-        { large.fileName(), "o máximo de um formulário" },
+        { test::sizedFile(dir.filePath("large.json"), FormFile::MaxFileBytes + 1), "o máximo de um formulário" },
         { write("number.json", R"({"controls": 3})"), "não é um formulário" },
         { write("text.json", "controls"), "não é um formulário" },
         { write("controls.json", manyControls), "controlos, o máximo" },
@@ -180,8 +168,7 @@ TEST(FormFile, saveNeverReplacesASpecialFileAndWritesThroughALink)
     QTemporaryDir dir;
     QWidget form;
     const QList<UserControl *> controls = everyControl(&form);
-    const QString fifo = dir.filePath("fifo");
-    ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
+    const QString fifo = test::makeFifo(dir.filePath("fifo"));
     const QString toFifo = dir.filePath("to-fifo.json");
     ASSERT_TRUE(QFile::link(fifo, toFifo));
     for (const QString &path : { fifo, toFifo }) {

@@ -7,32 +7,15 @@
 
 using zelctl::PropertyBag;
 
-TEST(PropertyBag, readsTheDefaultForAnAbsentName)
+// Defaults are not written, and writing one drops the earlier value; names keep the order
+// of their first write, even when others come and go.
+TEST(PropertyBag, skipsDefaultsAndKeepsTheOrderOfFirstWrites)
 {
     PropertyBag bag;
     EXPECT_EQ(bag.ReadProperty("BackColor", 0x80000005u).toUInt(), 0x80000005u);
     EXPECT_FALSE(bag.ReadProperty("Nothing").isValid());
-}
-
-TEST(PropertyBag, skipsValuesEqualToTheWriteDefault)
-{
-    PropertyBag bag;
     bag.WriteProperty("Locked", false, false);
-    bag.WriteProperty("Text", "", "");
-    bag.WriteProperty("Filter", 1, 0);
-    EXPECT_EQ(bag.names(), QStringList({ "Filter" }));
-
-    bag.WriteProperty("Filter", 0, 0);
-    EXPECT_TRUE(bag.isEmpty()) << "writing the default drops the earlier value";
-
-    bag.WriteProperty("Always", 0);
-    EXPECT_TRUE(bag.contains("Always")) << "without a default every value is written";
-}
-
-TEST(PropertyBag, keepsTheOrderOfFirstWritesWhenNamesComeAndGo)
-{
-    PropertyBag bag;
-    bag.WriteProperty("Zeta", 1);
+    bag.WriteProperty("Zeta", 1, 0);
     bag.WriteProperty("Alpha", 2);
     bag.WriteProperty("Beta", 3);
     bag.WriteProperty("Zeta", 4);
@@ -43,9 +26,8 @@ TEST(PropertyBag, keepsTheOrderOfFirstWritesWhenNamesComeAndGo)
     bag.WriteProperty("Beta", 5);
     bag.WriteProperty("Gamma", 6);
     EXPECT_EQ(bag.names(), QStringList({ "Alpha", "Beta", "Gamma" }));
-    EXPECT_EQ(bag.ReadProperty("Alpha").toInt(), 2);
-    EXPECT_EQ(bag.ReadProperty("Beta").toInt(), 5);
-    EXPECT_EQ(bag.ReadProperty("Gamma").toInt(), 6);
+    for (const auto &[name, value] : { std::pair { "Alpha", 2 }, { "Beta", 5 }, { "Gamma", 6 } })
+        EXPECT_EQ(bag.ReadProperty(name).toInt(), value) << name;
     EXPECT_FALSE(bag.contains("Zeta"));
 }
 
@@ -63,6 +45,7 @@ TEST(PropertyBag, holdsAtMostItsCapOfNames)
     EXPECT_FALSE(bag.contains(QStringLiteral("P%1").arg(PropertyBag::MaxEntries)));
 }
 
+// Every kind of value comes back equal; entries that are not a name with a value are skipped.
 TEST(PropertyBag, survivesAJsonRoundTripWithEveryValueKind)
 {
     PropertyBag bag;
@@ -77,18 +60,11 @@ TEST(PropertyBag, survivesAJsonRoundTripWithEveryValueKind)
     const QByteArray text = QJsonDocument(bag.toJson()).toJson();
     const PropertyBag back = PropertyBag::fromJson(QJsonDocument::fromJson(text).array());
     EXPECT_EQ(back.names(), bag.names());
-    EXPECT_EQ(back.ReadProperty("GIF").toByteArray(), QByteArray("GIF89a\0\xff", 8));
-    EXPECT_EQ(back.ReadProperty("BackColor").toUInt(), 0x8000000Fu);
-    EXPECT_EQ(back.ReadProperty("Filter"), QVariant(3));
-    EXPECT_EQ(back.ReadProperty("Locked"), QVariant(true));
-    EXPECT_DOUBLE_EQ(back.ReadProperty("MinFrameDelay").toDouble(), 12.5);
-    EXPECT_EQ(back.ReadProperty("Nome").toString(), QString::fromUtf8("João Conceição"));
-}
+    for (const QString &name : bag.names())
+        EXPECT_EQ(back.ReadProperty(name), bag.ReadProperty(name)) << name.toStdString();
+    EXPECT_EQ(back.ReadProperty("Filter").typeId(), QMetaType::Int) << "whole numbers come back as integers";
 
-TEST(PropertyBag, ignoresMalformedJsonEntries)
-{
-    const QJsonArray json
+    const QJsonArray malformed
         = QJsonDocument::fromJson(R"([1, {"value": 2}, {"name": 3}, {"name": "Ok", "value": 4}])").array();
-    const PropertyBag bag = PropertyBag::fromJson(json);
-    EXPECT_EQ(bag.names(), QStringList({ "Ok" }));
+    EXPECT_EQ(PropertyBag::fromJson(malformed).names(), QStringList({ "Ok" }));
 }

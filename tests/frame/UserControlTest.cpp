@@ -74,12 +74,12 @@ TEST(UserControlLifeCycle, newControlRunsInitPropertiesThenLayoutThenSaveThenTer
     control->resize(40, 20);
     form.show();
     ASSERT_TRUE(QTest::qWaitForWindowExposed(&form));
-    QTRY_VERIFY(calls.contains("Paint"));
+    ASSERT_TRUE(QTest::qWaitFor([&] { return calls.contains("Paint"); }));
     const PropertyBag saved = control->Save();
     control->Release();
     control->Release();
     QSignalSpy gone(control, &QObject::destroyed);
-    QTRY_COMPARE(gone.count(), 1);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return gone.count() == 1; }));
 
     EXPECT_EQ(calls,
         QStringList({ "Initialize", "InitProperties", "Resize", "Show", "Paint", "WriteProperties", "Terminate" }));
@@ -114,11 +114,16 @@ TEST(UserControlAmbient, reportsEachChangedAmbientPropertyOnce)
     EXPECT_FALSE(control.designMode());
     Ambient designer = control.ambient();
     designer.UserMode = false;
+    designer.UIDead = true;
+    designer.DisplayName = "NIF1";
     designer.BackColor = platform::rgb(1, 2, 3);
+    designer.Font.setPointSize(designer.Font.pointSize() + 3);
     control.setAmbient(designer);
     control.setAmbient(designer);
     EXPECT_TRUE(control.designMode());
-    EXPECT_EQ(calls.mid(1), QStringList({ "AmbientChanged:UserMode", "AmbientChanged:BackColor" }));
+    EXPECT_EQ(calls.mid(1),
+        QStringList({ "AmbientChanged:UserMode", "AmbientChanged:UIDead", "AmbientChanged:DisplayName",
+            "AmbientChanged:BackColor", "AmbientChanged:Font" }));
 }
 
 TEST(UserControlExtender, positionsAndSizesInTwips)
@@ -132,6 +137,9 @@ TEST(UserControlExtender, positionsAndSizesInTwips)
     EXPECT_EQ(control->geometry(), QRect(10, 20, 179, 22));
     EXPECT_EQ(ext.Left(), 150);
     EXPECT_EQ(ext.Width(), 2685);
+    ext.setTop(450);
+    ext.setLeft(75);
+    EXPECT_EQ(control->pos(), QPoint(5, 30));
     ext.setName("NIB1");
     ext.setTag("x");
     ext.setToolTipText("dica");

@@ -1,5 +1,6 @@
 #include "platform/FileRead.h"
 #include "platform/Settings.h"
+#include "support/TestSupport.h"
 
 #include <QDir>
 #include <QFile>
@@ -12,33 +13,17 @@
 
 #include <csignal>
 #include <fcntl.h>
-#include <sys/stat.h>
 #include <unistd.h>
 
 using namespace zelctl::platform;
 
-namespace {
-
-QString writeFile(const QString &path, const QByteArray &bytes)
-{
-    QFile file(path);
-    EXPECT_TRUE(file.open(QIODevice::WriteOnly));
-    file.write(bytes);
-    return path;
-}
-
-bool makeFifo(const QString &path)
-{
-    return ::mkfifo(QFile::encodeName(path).constData(), 0600) == 0;
-}
-
-} // namespace
+using zelctl::test::makeFifo;
+using zelctl::test::writeFile;
 
 TEST(FileRead, readsRegularFilesWithinTheBoundAndRefusesTheRestAtOnce)
 {
     QTemporaryDir dir;
-    const QString fifo = dir.filePath("fifo");
-    ASSERT_TRUE(makeFifo(fifo));
+    const QString fifo = makeFifo(dir.filePath("fifo"));
     const QString link = dir.filePath("link");
     ASSERT_TRUE(QFile::link(fifo, link));
 
@@ -121,8 +106,7 @@ TEST(Settings, aLinkedStoreIsWrittenThroughOrLeftAlone)
     EXPECT_TRUE(text.contains("RootPath=/opt/zel/") && text.contains("Other=1")) << text.toStdString();
 
     ASSERT_TRUE(QFile::remove(store));
-    const QString fifo = dir.filePath("fifo.ini");
-    ASSERT_TRUE(makeFifo(fifo));
+    const QString fifo = makeFifo(dir.filePath("fifo.ini"));
     ASSERT_TRUE(QFile::link(fifo, store));
     EXPECT_EQ(GetSetting("zEL-linked", "Setup", "RootPath", "none"), QStringLiteral("none"));
     SaveSetting("zEL-linked", "Setup", "RootPath", "/opt/zel/");

@@ -1,5 +1,11 @@
 #include "TestSupport.h"
 
+#include <QFile>
+
+#include <gtest/gtest.h>
+
+#include <sys/stat.h>
+
 namespace zelctl::test {
 
 QString sourcePath(const QString &relative)
@@ -10,6 +16,26 @@ QString sourcePath(const QString &relative)
 QString testDataPath(const QString &relative)
 {
     return QStringLiteral(ZELCTL_TEST_DATA_DIR "/") + relative;
+}
+
+QString writeFile(const QString &path, const QByteArray &bytes)
+{
+    QFile file(path);
+    EXPECT_TRUE(file.open(QIODevice::WriteOnly) && file.write(bytes) == bytes.size()) << path.toStdString();
+    return path;
+}
+
+QString sizedFile(const QString &path, qint64 size)
+{
+    QFile file(path);
+    EXPECT_TRUE(file.open(QIODevice::WriteOnly) && file.resize(size)) << path.toStdString();
+    return path;
+}
+
+QString makeFifo(const QString &path)
+{
+    EXPECT_EQ(::mkfifo(QFile::encodeName(path).constData(), 0600), 0) << path.toStdString();
+    return path;
 }
 
 MessageBoxRecorder::MessageBoxRecorder(platform::MsgResult answer)

@@ -14,6 +14,13 @@ namespace zelctl::test {
 QString sourcePath(const QString &relative);
 QString testDataPath(const QString &relative);
 
+// Files a test makes, by path; each returns the path and fails the test when it cannot.
+// writeFile: with these bytes; sizedFile: of this many (zero, sparse) bytes; makeFifo: a
+// FIFO, whose reader would wait for a writer.
+QString writeFile(const QString &path, const QByteArray &bytes);
+QString sizedFile(const QString &path, qint64 size);
+QString makeFifo(const QString &path);
+
 // Records every message box shown while it lives and answers each with `answer`.
 class MessageBoxRecorder
 {

@@ -76,20 +76,6 @@ TEST(DibSection, padsRowsTo32BitsAndStartsZeroed)
     }
 }
 
-TEST(DibSection, bottomUpKeepsTheTopRowLastInMemory)
-{
-    TestBitmap up(2, 3, 24, false);
-    TestBitmap down(2, 3, 24, true);
-    // Raw memory: first row in memory is red in both.
-    for (TestBitmap *b : { &up, &down }) {
-        uchar *first = static_cast<uchar *>(b->bits);
-        first[0] = 0x00, first[1] = 0x00, first[2] = 0xFF;
-    }
-    EXPECT_EQ(GetPixel(up.dc, 0, 2), 0x0000FFu) << "bottom-up: memory starts with the bottom row";
-    EXPECT_EQ(GetPixel(up.dc, 0, 0), 0x000000u);
-    EXPECT_EQ(GetPixel(down.dc, 0, 0), 0x0000FFu);
-}
-
 TEST(DibColorTable, holdsTwoToTheBitsEntriesAndClipsRequests)
 {
     for (int bpp : { 1, 4, 8 }) {

@@ -119,41 +119,6 @@ TEST(PersistentSurface, showsWhatWasDrawnAndKeepsItAcrossResizes)
     EXPECT_EQ(surface.size(), QSize(1, 1));
 }
 
-namespace {
-
-// A control of its own kind on a surface, as the skinned controls are built.
-class Badge : public SurfaceHost<QWidget>
-{
-    Q_OBJECT
-
-public:
-    using SurfaceHost::SurfaceHost;
-
-    void Redraw()
-    {
-        surface().clear(0x00FF00);
-        Q_EMIT Redrawn();
-    }
-
-Q_SIGNALS:
-    void Redrawn();
-};
-
-} // namespace
-
-TEST(PersistentSurface, carriesControlsWithTheirOwnSignals)
-{
-    QWidget parent;
-    Badge badge(&parent);
-    badge.resize(8, 8);
-    int redrawn = 0;
-    QObject::connect(&badge, &Badge::Redrawn, [&] { ++redrawn; });
-    badge.Redraw();
-    EXPECT_EQ(redrawn, 1);
-    EXPECT_TRUE(badge.inherits("QWidget"));
-    EXPECT_EQ(badge.grab().toImage().pixel(4, 4), qRgb(0, 255, 0));
-}
-
 TEST(RedrawWindow, reachesWidgetsByHandle)
 {
     SurfaceWidget widget;
@@ -164,5 +129,3 @@ TEST(RedrawWindow, reachesWidgetsByHandle)
     EXPECT_FALSE(RedrawWindow(0, nullptr, RDW_INVALIDATE));
     EXPECT_FALSE(RedrawWindow(handle + 1000, nullptr, RDW_INVALIDATE));
 }
-
-#include "PicturesTest.moc"
