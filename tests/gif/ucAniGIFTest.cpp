@@ -316,11 +316,14 @@ TEST_F(AniGif, animatedGifPictureHoldsTheFramesAsTheFileHadThem)
 {
     EXPECT_TRUE(gif.AnimatedGIF().isNull());
     // Disposals, delays and transparency; a local table of two colours (the smallest code size).
-    const QByteArray local = GifBuilder(3, 2, palette)
+    QByteArray bits;
+    for (int i = 0; i < 64; ++i)
+        bits.append(char(i * i % 7 % 2));
+    const QByteArray local = GifBuilder(8, 9, palette)
                                  .control(1, 7)
-                                 .solid(0, 0, 3, 2, 2)
+                                 .solid(0, 0, 8, 9, 2)
                                  .control(2, 30, 1)
-                                 .image(1, 1, 2, 1, QByteArray("\1\0", 2), { 0x111111, 0x222222 })
+                                 .image(0, 1, 8, 8, bits, { 0x111111, 0x222222 })
                                  .bytes();
     for (const QByteArray &source : { layeredGif(), local }) {
         ASSERT_TRUE(gif.LoadAnimatedGIF_Array(source));
