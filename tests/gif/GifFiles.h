@@ -4,6 +4,7 @@
 
 #include <QByteArray>
 #include <QList>
+#include <QStringList>
 
 #include <gif_lib.h>
 
@@ -95,18 +96,9 @@ private:
     QByteArray m_bytes;
 };
 
-// Decodes a GIF with giflib, which has nothing in common with our encoder.
-struct Decoded
-{
-    int width = 0;
-    int height = 0;
-    QList<QByteArray> frames;
-    QList<GraphicsControlBlock> controls;
-    QList<GifImageDesc> descriptors;
-    QList<QList<quint32>> tables; // the table each frame uses
-};
-
-inline Decoded decodeWithGiflib(const QByteArray &gif)
+// Each frame of a GIF as giflib, which has nothing in common with our code, reads it:
+// place, size, disposal, delay, transparent index, colour table and indices.
+inline QStringList decodeWithGiflib(const QByteArray &gif)
 {
     struct Source
     {
@@ -122,30 +114,29 @@ inline Decoded decodeWithGiflib(const QByteArray &gif)
     };
     int error = 0;
     GifFileType *file = DGifOpen(&source, read, &error);
-    Decoded result;
-    if (!file)
-        return result;
-    if (DGifSlurp(file) == GIF_OK) {
-        result.width = file->SWidth;
-        result.height = file->SHeight;
+    QStringList frames;
+    if (file && DGifSlurp(file) == GIF_OK) {
         for (int i = 0; i < file->ImageCount; ++i) {
-            const SavedImage &image = file->SavedImages[i];
-            result.frames.append(QByteArray(
-                reinterpret_cast<const char *>(image.RasterBits), image.ImageDesc.Width * image.ImageDesc.Height));
+            const GifImageDesc &d = file->SavedImages[i].ImageDesc;
             GraphicsControlBlock gcb {};
             DGifSavedExtensionToGCB(file, i, &gcb);
-            result.controls.append(gcb);
-            result.descriptors.append(image.ImageDesc);
-            const ColorMapObject *map = image.ImageDesc.ColorMap ? image.ImageDesc.ColorMap : file->SColorMap;
-            QList<quint32> table;
-            for (int k = 0; map && k < map->ColorCount; ++k)
-                table.append(
-                    quint32(map->Colors[k].Red) << 16 | quint32(map->Colors[k].Green) << 8 | map->Colors[k].Blue);
-            result.tables.append(table);
+            const ColorMapObject *map = d.ColorMap ? d.ColorMap : file->SColorMap;
+            const QByteArray colours(reinterpret_cast<const char *>(map->Colors), map->ColorCount * 3);
+            const QByteArray indices(
+                reinterpret_cast<const char *>(file->SavedImages[i].RasterBits), d.Width * d.Height);
+            frames << QStringLiteral("%1,%2 %3x%4 disposal %5 delay %6 transparent %7 colours %8 indices %9")
+                          .arg(d.Left)
+                          .arg(d.Top)
+                          .arg(d.Width)
+                          .arg(d.Height)
+                          .arg(gcb.DisposalMode)
+                          .arg(gcb.DelayTime)
+                          .arg(gcb.TransparentColor)
+                          .arg(QString::fromLatin1(colours.toHex()), QString::fromLatin1(indices.toHex()));
         }
     }
     DGifCloseFile(file, &error);
-    return result;
+    return frames;
 }
 
 } // namespace zelctl::test

@@ -71,14 +71,19 @@ public:
         EXPECT_TRUE(QTest::qWaitForWindowExposed(this));
     }
     QList<QRect> painted;
+    std::function<void()> onPaint = [] {};
 
 protected:
-    void paintEvent(QPaintEvent *event) override { painted.append(event->rect()); }
+    void paintEvent(QPaintEvent *event) override
+    {
+        painted.append(event->rect());
+        onPaint();
+    }
 };
 
 } // namespace
 
-TEST(PngPaint, copiesAtItsOwnSizeAndStretches)
+TEST(PngPaint, copiesStretchesAndBlends)
 {
     StdPNG image;
     ASSERT_TRUE(image.LoadData(rgbFile(12, 12)));
@@ -100,28 +105,19 @@ TEST(PngPaint, copiesAtItsOwnSizeAndStretches)
     image.Paint(part.dc, 0, 0, 20, 20, 0, 0, 0, 10, 10);
     EXPECT_EQ(part.argb(19, 19) & 0xFFFFFF, 0x5A5A07u);
     EXPECT_EQ(part.argb(20, 20), 0u);
-}
 
-TEST(PngPaint, blendsThirtyTwoBitImagesWithTheirAlphaAndAConstantOpacity)
-{
-    StdPNG image;
+    // A 32-bit image is blended with its alpha (transparent red, half green, opaque blue)
+    // and a constant opacity.
     image.setTransparentStyle(StdPNG::alphaTransparent);
     ASSERT_TRUE(image.LoadData(rgbaFile()));
-    ASSERT_EQ(image.BitCount_BMP(), 32);
-    EXPECT_EQ(argbAt(image, 0, 0), 0u);
-    EXPECT_EQ(argbAt(image, 1, 0), 0x80008000u);
-
-    TestBitmap target(3, 1, 32);
-    target.fill(0xFFFFFFFFu, 3, 32);
-    image.Paint(target.dc, 0, 0);
-    EXPECT_EQ(target.argb(0, 0) & 0xFFFFFF, 0xFFFFFFu); // transparent: the target shows
-    EXPECT_NEAR(int(target.argb(1, 0) >> 16 & 0xFF), 0x7F, 1); // half green over white
-    EXPECT_EQ(target.argb(1, 0) >> 8 & 0xFF, 0xFFu);
-    EXPECT_EQ(target.argb(2, 0) & 0xFFFFFF, 0x0000FFu);
-
-    target.fill(0xFF000000u, 3, 32);
-    image.Paint(target.dc, 0, 0, 0, 0, 0, 0, 0, 0, 0, 128);
-    EXPECT_NEAR(int(target.argb(2, 0) & 0xFF), 128, 1);
+    TestBitmap white(3, 1, 32);
+    white.fill(0xFFFFFFFFu, 3, 32);
+    image.Paint(white.dc, 0, 0);
+    EXPECT_EQ(gdi::test::rowOf(white, 0, 3), (gdi::test::Values { 0xFFFFFFFFu, 0xFF7FFF7Fu, 0xFF0000FFu }));
+    TestBitmap black(3, 1, 32);
+    black.fill(0xFF000000u, 3, 32);
+    image.Paint(black.dc, 0, 0, 0, 0, 0, 0, 0, 0, 0, 128);
+    EXPECT_NEAR(int(black.argb(2, 0) & 0xFF), 128, 1);
 }
 
 TEST(PngPaint, drawsNothingWithoutWhatItNeeds)
@@ -144,33 +140,25 @@ TEST(PngPaint, drawsNothingWhollyBesideTheTarget)
 {
     static constexpr quint32 untouched = 0xFF123456u;
     const auto expectUntouched = [](const TestBitmap &target, const std::string &what) {
-        for (int y = 0; y < 10; ++y) {
-            for (int x = 0; x < 10; ++x)
-                ASSERT_EQ(target.argb(x, y), untouched) << what << " at " << x << "," << y;
-        }
+        for (int y = 0; y < 10; ++y)
+            ASSERT_EQ(gdi::test::rowOf(target, y, 10), gdi::test::Values(10, untouched)) << what << " row " << y;
     };
     // Left, right, above and below the 10 × 10 target, and at the ends of the coordinates.
     const QPoint places[] = { { -40, 2 }, { 10, 2 }, { 2, -40 }, { 2, 10 }, { INT_MIN, 0 }, { INT_MAX, 0 },
         { 0, INT_MIN }, { 0, INT_MAX } };
-    struct Bitmap
-    {
-        QByteArray file;
-        bool make32;
-        int bitCount;
-    };
-    const Bitmap bitmaps[] = { { greyFile(4, 4), false, 8 }, { rgbFile(4, 4), false, 24 }, { rgbFile(4, 4), true, 32 },
-        { rgbaFile(), false, 32 }, { writeWithLibpng({ 12, 12, 6, 8, true, false, 4 }), false, 32 } };
+    // Bitmaps of 8, 24 and 32 bits (made so, with alpha, interlaced with alpha).
+    const std::pair<QByteArray, bool> bitmaps[] = { { greyFile(4, 4), false }, { rgbFile(4, 4), false },
+        { rgbFile(4, 4), true }, { rgbaFile(), false }, { writeWithLibpng({ 12, 12, 6, 8, true, false, 4 }), false } };
     TestBitmap target(10, 10, 32);
     RecordingWindow window;
-    for (const Bitmap &bitmap : bitmaps) {
+    for (const auto &[file, make32] : bitmaps) {
         for (const QPoint place : places) {
-            const std::string what = std::to_string(bitmap.bitCount) + " bits at " + std::to_string(place.x()) + ","
+            const std::string what = file.toHex().left(80).toStdString() + " at " + std::to_string(place.x()) + ","
                 + std::to_string(place.y());
             target.fill(untouched, 10, 32);
             StdPNG image;
             image.setTransparentStyle(StdPNG::alphaTransparent);
-            ASSERT_TRUE(image.LoadData(bitmap.file, true, bitmap.make32));
-            ASSERT_EQ(image.BitCount_BMP(), bitmap.bitCount);
+            ASSERT_TRUE(image.LoadData(file, true, make32));
             image.Paint(target.dc, place.x(), place.y());
             image.Paint(target.dc, place.x(), place.y(), 30, 30);
             expectUntouched(target, what);
@@ -179,7 +167,7 @@ TEST(PngPaint, drawsNothingWhollyBesideTheTarget)
             StdPNG shown;
             shown.setTransparentStyle(StdPNG::alphaTransparent);
             drawProgressivelyInto(shown, &target, &window, place);
-            ASSERT_TRUE(shown.LoadData(bitmap.file, true, bitmap.make32)) << what;
+            ASSERT_TRUE(shown.LoadData(file, true, make32)) << what;
             expectUntouched(target, "progressive, " + what);
         }
     }
@@ -217,75 +205,47 @@ TEST(PngPaint, worksWithoutItsOwnDcThroughTheCallersDc)
     EXPECT_NE(image.hdc(), 0);
 }
 
-TEST(PngTransparency, keepsOrDropsAlphaByStyle)
+TEST(PngTransparency, laysAlphaAndKeyedImagesOnTheirBackgroundByStyle)
 {
-    StdPNG image;
-    image.setTransparentStyle(StdPNG::alphaNoBkgNoAlpha);
-    ASSERT_TRUE(image.LoadData(rgbaFile()));
-    EXPECT_EQ(image.BitCount_BMP(), 24);
-    EXPECT_EQ(argbAt(image, 0, 0), 0xFFFF0000u); // colour kept as it is
-    TestBitmap target(3, 1, 32);
-    image.Paint(target.dc, 0, 0);
-    EXPECT_EQ(target.argb(0, 0) & 0xFFFFFF, 0xFF0000u);
-
-    // On its bKGD colour, or white without one; the result is opaque.
-    image.setTransparentStyle(StdPNG::alphaPNGwindowBkg);
-    ASSERT_TRUE(image.LoadData(rgbaFile(chunk("bKGD", QByteArray::fromHex("000000000040")))));
-    EXPECT_EQ(argbAt(image, 0, 0), 0xFF000040u);
-    EXPECT_EQ(argbAt(image, 1, 0), 0xFF00801Fu);
-    ASSERT_TRUE(image.LoadData(rgbaFile()));
-    EXPECT_EQ(argbAt(image, 0, 0), 0xFFFFFFFFu);
-
-    // alphaTransColorBkg drops the alpha of alpha images.
-    image.setTransparentStyle(StdPNG::alphaTransColorBkg);
-    ASSERT_TRUE(image.LoadData(rgbaFile()));
-    EXPECT_EQ(image.BitCount_BMP(), 24);
-
-    // A colour, the default black, and a system colour.
-    image.setTransparentStyle(0x00FF00);
-    ASSERT_TRUE(image.LoadData(rgbaFile()));
-    EXPECT_EQ(argbAt(image, 0, 0), 0xFF00FF00u);
-    image.setTransparentStyle(0);
-    ASSERT_TRUE(image.LoadData(rgbaFile()));
-    EXPECT_EQ(argbAt(image, 0, 0), 0xFF000000u);
-    image.setTransparentStyle(qint32(platform::systemColor(platform::COLOR_INFOBK)));
-    ASSERT_TRUE(image.LoadData(rgbaFile()));
-    const quint32 info = platform::GetSysColor(platform::COLOR_INFOBK);
-    EXPECT_EQ(argbAt(image, 0, 0), 0xFF000000u | (info & 0xFF) << 16 | (info & 0xFF00) | (info >> 16 & 0xFF));
-}
-
-TEST(PngTransparency, laysKeyedImagesOnTheirKeyColour)
-{
-    // RGB with key (1, 2, 3): pixel 0 matches the key.
-    const QByteArray rgb = signature() + ihdr(2, 1, 8, 2) + chunk("tRNS", QByteArray::fromHex("000100020003"))
+    // RGB with key (1, 2, 3), which pixel 0 matches; a palette image whose entry 0 is transparent.
+    const QByteArray keyed = signature() + ihdr(2, 1, 8, 2) + chunk("tRNS", QByteArray::fromHex("000100020003"))
         + chunk("IDAT", deflate(QByteArray::fromHex("00010203aabbcc"))) + iend;
-    StdPNG image;
-    image.setTransparentStyle(StdPNG::alphaTransColorBkg);
-    ASSERT_TRUE(image.LoadData(rgb));
-    EXPECT_EQ(argbAt(image, 0, 0), 0xFF010203u);
-    EXPECT_EQ(argbAt(image, 1, 0), 0xFFAABBCCu);
-
-    image.setTransparentStyle(StdPNG::alphaTransparent);
-    ASSERT_TRUE(image.LoadData(rgb));
-    EXPECT_EQ(argbAt(image, 0, 0), 0u);
-    EXPECT_EQ(argbAt(image, 1, 0), 0xFFAABBCCu);
-
-    // A palette image with transparency keeps its palette bitmap under alphaTransColorBkg.
     const QByteArray indexed = signature() + ihdr(2, 1, 8, 3) + chunk("PLTE", QByteArray::fromHex("102030405060"))
         + chunk("tRNS", QByteArray(1, '\0')) + chunk("IDAT", deflate(QByteArray::fromHex("000001"))) + iend;
-    image.setTransparentStyle(StdPNG::alphaTransColorBkg);
-    ASSERT_TRUE(image.LoadData(indexed));
-    EXPECT_EQ(image.BitCount_BMP(), 8);
-    EXPECT_EQ(argbAt(image, 0, 0), 0xFF102030u);
-}
-
-TEST(PngTransparency, bakesTheOpacityIntoAnImageOnABackground)
-{
-    StdPNG image;
-    image.setTransparentStyle(0x0000FF); // red
-    ASSERT_TRUE(image.LoadData(rgbaFile(), true, false, 128));
-    EXPECT_EQ(argbAt(image, 0, 0), 0x80800000u);
-    EXPECT_EQ(argbAt(image, 2, 0), 0x80000080u);
+    const QByteArray blueBackground = rgbaFile(chunk("bKGD", QByteArray::fromHex("000000000040")));
+    const quint32 info = platform::GetSysColor(platform::COLOR_INFOBK);
+    const struct
+    {
+        QByteArray file;
+        qint32 style;
+        int bitCount;
+        QList<quint32> pixels;
+        quint8 opacity = 255;
+    } cases[] = {
+        { rgbaFile(), StdPNG::alphaNoBkgNoAlpha, 24, { 0xFFFF0000u, 0xFF00FF00u, 0xFF0000FFu } }, // colours as they are
+        { blueBackground, StdPNG::alphaPNGwindowBkg, 32, { 0xFF000040u, 0xFF00801Fu, 0xFF0000FFu } },
+        { rgbaFile(), StdPNG::alphaPNGwindowBkg, 32, { 0xFFFFFFFFu, 0xFF7FFF7Fu, 0xFF0000FFu } }, // white without bKGD
+        { rgbaFile(), StdPNG::alphaTransColorBkg, 24, { 0xFFFF0000u, 0xFF00FF00u, 0xFF0000FFu } }, // alpha dropped
+        { rgbaFile(), 0x00FF00, 32, { 0xFF00FF00u, 0xFF00FF00u, 0xFF0000FFu } },
+        { rgbaFile(), 0, 32, { 0xFF000000u, 0xFF008000u, 0xFF0000FFu } },
+        { rgbaFile(), qint32(platform::systemColor(platform::COLOR_INFOBK)), 32,
+            { 0xFF000000u | (info & 0xFF) << 16 | (info & 0xFF00) | (info >> 16 & 0xFF) } },
+        { rgbaFile(), 0x0000FF, 32, { 0x80800000u, 0x803F4000u, 0x80000080u }, 128 }, // the opacity baked in
+        { rgbaFile(), StdPNG::alphaTransparent, 32, { 0, 0x80008000u, 0xFF0000FFu } },
+        { keyed, StdPNG::alphaTransColorBkg, 32, { 0xFF010203u, 0xFFAABBCCu } },
+        { keyed, StdPNG::alphaTransparent, 32, { 0, 0xFFAABBCCu } },
+        { indexed, StdPNG::alphaTransColorBkg, 8, { 0xFF102030u, 0xFF405060u } }, // keeps its palette
+    };
+    for (const auto &c : cases) {
+        StdPNG image;
+        image.setTransparentStyle(c.style);
+        ASSERT_TRUE(image.LoadData(c.file, true, false, c.opacity));
+        EXPECT_EQ(image.BitCount_BMP(), c.bitCount) << c.style;
+        QList<quint32> pixels;
+        for (int x = 0; x < c.pixels.size(); ++x)
+            pixels.append(argbAt(image, x, 0));
+        EXPECT_EQ(pixels, c.pixels) << c.style;
+    }
 }
 
 TEST(PngEvents, describeTheImageToTheProgressiveHandler)
@@ -363,26 +323,42 @@ TEST(PngEvents, scanTheImageInBlocksOfSixteenRows)
     EXPECT_EQ(target.argb(3, 2 + 39) & 0xFFFFFF, 0x148607u);
 }
 
-TEST(PngEvents, showInterlacedPassesPixelatedOrFadingToTheSameImage)
+TEST(PngEvents, showInterlacedPassesPixelatedOrFadingInToTheSameImage)
 {
     const QByteArray file = writeWithLibpng({ 19, 13, 2, 8, true, false, 21 });
     StdPNG plain;
     ASSERT_TRUE(plain.LoadData(file, true, true));
-
-    for (const quint8 mode : { quint8(StdPNG::pngAuto), quint8(StdPNG::pngFadeIn) }) {
+    const quint32 first = argbAt(plain, 0, 0);
+    ASSERT_NE(argbAt(plain, 7, 7), first);
+    // Pass 1 knows pixel (0, 0) only: pixelated, it fills its 8 × 8 block; fading in, it
+    // shows at a seventh of its strength on the black target, and (7, 7) stays black.
+    const auto seventh = [](quint32 c) {
+        return 0xFF000000u | (c >> 16 & 0xFF) * 36 / 255 << 16 | (c >> 8 & 0xFF) * 36 / 255 << 8
+            | (c & 0xFF) * 36 / 255;
+    };
+    const std::pair<quint8, QList<quint32>> modes[]
+        = { { StdPNG::pngAuto, { first, first } }, { StdPNG::pngFadeIn, { seventh(first), 0xFF000000u } } };
+    for (const auto &[mode, afterFirstPass] : modes) {
+        SCOPED_TRACE(int(mode));
         StdPNG image;
         image.setProgressiveDisplay(mode);
         RecordingWindow window;
         TestBitmap target(19, 13, 32);
         drawProgressivelyInto(image, &target, &window);
+        QList<QList<quint32>> displays; // pixels (0, 0) and (7, 7) at each display
         window.painted.clear();
+        window.onPaint = [&] { displays.append({ target.argb(0, 0) | 0xFF000000u, target.argb(7, 7) | 0xFF000000u }); };
         ASSERT_TRUE(image.LoadData(file, true, true));
-        EXPECT_EQ(window.painted.size(), 7) << int(mode);
+        ASSERT_EQ(window.painted.size(), 7);
+        for (int i : { 0, 1 }) {
+            for (int shift : { 0, 8, 16 }) // blending may round up
+                EXPECT_NEAR(int(displays.first()[i] >> shift & 0xFF), int(afterFirstPass[i] >> shift & 0xFF), 1) << i;
+        }
         // Blocks of early passes never overwrite pixels that are already final.
         for (int y = 0; y < 13; ++y) {
             for (int x = 0; x < 19; ++x) {
-                ASSERT_EQ(argbAt(image, x, y), argbAt(plain, x, y)) << int(mode) << " at " << x << "," << y;
-                ASSERT_EQ(target.argb(x, y) | 0xFF000000u, argbAt(plain, x, y)) << int(mode) << " at " << x << "," << y;
+                ASSERT_EQ(argbAt(image, x, y), argbAt(plain, x, y)) << x << "," << y;
+                ASSERT_EQ(target.argb(x, y) | 0xFF000000u, argbAt(plain, x, y)) << x << "," << y;
             }
         }
     }

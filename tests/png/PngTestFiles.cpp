@@ -3,18 +3,13 @@
 #include <png.h>
 #include <zlib.h>
 
+#include <algorithm>
 #include <cstring>
 #include <stdexcept>
 
 namespace zelctl::test {
 
 namespace {
-
-uint32_t nextRandom(uint32_t &state)
-{
-    state = state * 1664525u + 1013904223u;
-    return state >> 8;
-}
 
 void appendToBuffer(png_structp png, png_bytep data, png_size_t length)
 {
@@ -53,66 +48,49 @@ QByteArray writeWithLibpng(const ImageRecipe &recipe)
         recipe.interlaced ? PNG_INTERLACE_ADAM7 : PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_BASE, PNG_FILTER_TYPE_BASE);
 
     uint32_t state = recipe.seed;
-    const int maximum = (1 << recipe.bitDepth) - 1;
+    const auto random = [&state] {
+        state = state * 1664525u + 1013904223u;
+        return png_byte(state >> 16);
+    };
+    // Random rows in which every third pixel of 8 bits or more repeats the first, so colour
+    // keys match more than once (low bit depths match often by chance).
+    const int pixelBits = recipe.channels() * recipe.bitDepth;
+    std::vector<std::vector<png_byte>> rows(size_t(recipe.height));
+    for (int y = 0; y < recipe.height; ++y) {
+        rows[size_t(y)].resize((size_t(recipe.width) * size_t(pixelBits) + 7) / 8);
+        std::generate(rows[size_t(y)].begin(), rows[size_t(y)].end(), random);
+        for (int x = 0; pixelBits >= 8 && x < recipe.width; ++x) {
+            if ((x + y) % 3 == 0)
+                std::copy_n(rows[0].begin(), pixelBits / 8, rows[size_t(y)].begin() + x * pixelBits / 8);
+        }
+    }
+    const auto firstSample = [&](size_t i) {
+        const std::vector<png_byte> &first = rows[0];
+        return png_uint_16(recipe.bitDepth == 16 ? first[2 * i] << 8 | first[2 * i + 1]
+                                                 : first[i] >> (8 - std::min(8, recipe.bitDepth)));
+    };
+
     const int entries = recipe.colorType == PNG_COLOR_TYPE_PALETTE ? 1 << recipe.bitDepth : 0;
     std::vector<png_color> palette(static_cast<size_t>(entries));
     for (png_color &c : palette)
-        c = { png_byte(nextRandom(state)), png_byte(nextRandom(state)), png_byte(nextRandom(state)) };
+        c = { random(), random(), random() };
     if (entries)
         png_set_PLTE(png, info, palette.data(), entries);
-
-    const int samples = recipe.channels();
-    std::vector<std::vector<int>> pixels(size_t(recipe.height), std::vector<int>(size_t(recipe.width * samples)));
-    for (auto &row : pixels) {
-        for (int &sample : row)
-            sample = int(nextRandom(state) % uint32_t(maximum + 1));
-    }
-    // Plenty of pixels repeat the first one, so colour keys match more than once.
-    for (int y = 0; y < recipe.height; ++y) {
-        for (int x = 0; x < recipe.width; ++x) {
-            if ((x + y) % 3 == 0)
-                std::copy_n(pixels[0].begin(), samples, pixels[size_t(y)].begin() + x * samples);
-        }
-    }
-
-    std::vector<png_byte> alphas;
+    std::vector<png_byte> alphas(size_t(entries / 2 + 1));
     png_color_16 key {};
-    if (recipe.withTransparency) {
-        if (recipe.colorType == PNG_COLOR_TYPE_PALETTE) {
-            alphas.resize(size_t(std::max(1, entries / 2 + 1)));
-            for (size_t i = 0; i < alphas.size(); ++i)
-                alphas[i] = png_byte(i % 3 == 0 ? 0 : nextRandom(state));
-            png_set_tRNS(png, info, alphas.data(), int(alphas.size()), nullptr);
-        } else if (recipe.colorType == PNG_COLOR_TYPE_GRAY) {
-            key.gray = png_uint_16(pixels[0][0]);
-            png_set_tRNS(png, info, nullptr, 0, &key);
-        } else if (recipe.colorType == PNG_COLOR_TYPE_RGB) {
-            key.red = png_uint_16(pixels[0][0]);
-            key.green = png_uint_16(pixels[0][1]);
-            key.blue = png_uint_16(pixels[0][2]);
-            png_set_tRNS(png, info, nullptr, 0, &key);
-        }
+    if (recipe.withTransparency && entries) {
+        for (size_t i = 0; i < alphas.size(); ++i)
+            alphas[i] = i % 3 == 0 ? 0 : random();
+        png_set_tRNS(png, info, alphas.data(), int(alphas.size()), nullptr);
+    } else if (recipe.withTransparency && recipe.colorType == PNG_COLOR_TYPE_GRAY) {
+        key.gray = firstSample(0);
+        png_set_tRNS(png, info, nullptr, 0, &key);
+    } else if (recipe.withTransparency && recipe.colorType == PNG_COLOR_TYPE_RGB) {
+        key = { 0, firstSample(0), firstSample(1), firstSample(2), 0 };
+        png_set_tRNS(png, info, nullptr, 0, &key);
     }
     png_write_info(png, info);
 
-    const size_t rowBytes = png_get_rowbytes(png, info);
-    std::vector<std::vector<png_byte>> rows(size_t(recipe.height), std::vector<png_byte>(rowBytes));
-    for (int y = 0; y < recipe.height; ++y) {
-        png_byte *row = rows[size_t(y)].data();
-        for (int i = 0; i < recipe.width * samples; ++i) {
-            const int value = pixels[size_t(y)][size_t(i)];
-            if (recipe.bitDepth == 16) {
-                row[2 * i] = png_byte(value >> 8);
-                row[2 * i + 1] = png_byte(value);
-            } else if (recipe.bitDepth == 8) {
-                row[i] = png_byte(value);
-            } else {
-                const int perByte = 8 / recipe.bitDepth;
-                const int shift = 8 - recipe.bitDepth * (i % perByte + 1);
-                row[i / perByte] = png_byte(row[i / perByte] | value << shift);
-            }
-        }
-    }
     std::vector<png_bytep> pointers;
     for (auto &row : rows)
         pointers.push_back(row.data());
