@@ -6,8 +6,6 @@
 #include <QFile>
 #include <QTest>
 
-#include <sys/stat.h>
-
 namespace zelctl::test {
 
 void LookupFixture::SetUp()
@@ -56,11 +54,6 @@ QStringList fetch(companion::NIFGrabber &grabber, const QString &number, const Q
         grabber.Fetch(meanwhile);
     EXPECT_TRUE(QTest::qWaitFor([&] { return !grabber.IsBusy(); }, 10000));
     return events;
-}
-
-void makeFifo(const QString &path)
-{
-    ASSERT_EQ(::mkfifo(QFile::encodeName(path).constData(), 0600), 0);
 }
 
 } // namespace zelctl::test

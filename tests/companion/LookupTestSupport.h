@@ -21,8 +21,6 @@ inline const QString TimedOut = QStringLiteral("O serviço não respondeu em 1.5
 // Runs one fetch to its end (with a second one asked for meanwhile, if given) and gives
 // its events: "Starting", "ReceivedInformation:<id>", "Finished".
 QStringList fetch(companion::NIFGrabber &grabber, const QString &number, const QString &meanwhile = {});
-// Makes a FIFO at `path`, which a reader must refuse rather than wait on.
-void makeFifo(const QString &path);
 
 // Points the user's lookup settings at a fake service on 127.0.0.1, with remote lookups
 // allowed and a short timeout, and takes them back afterwards.

@@ -2,6 +2,7 @@
 // in for a failing network, and how the database file bears sharing and damage.
 
 #include "LookupTestSupport.h"
+#include "support/TestSupport.h"
 
 #include <QCoreApplication>
 #include <QDir>
