@@ -5,6 +5,7 @@
 #include "common/modFuncs.h"
 
 #include <QLabel>
+#include <QPointer>
 
 #include <array>
 
@@ -159,8 +160,10 @@ void skGrowth::WriteProperties(PropertyBag &bag)
 void skGrowth::resizeEvent(QResizeEvent *event)
 {
     SurfaceHost::resizeEvent(event);
+    const QPointer<skGrowth> alive(this);
     Q_EMIT Resize();
-    Repaint();
+    if (alive)
+        Repaint();
 }
 
 ZELCTL_REGISTER_CLASS(skGrowth)
