@@ -242,10 +242,13 @@ void cNIF::Private::textChanged()
 {
     if (switchTypedCountry())
         return;
+    // The host may delete the control in any of its events.
+    const QPointer<cNIF> alive(q);
     q->RefreshMe();
-    if (nif->text().isEmpty())
+    if (alive && nif->text().isEmpty())
         Q_EMIT q->Cleared();
-    Q_EMIT q->Changed();
+    if (alive)
+        Q_EMIT q->Changed();
 }
 
 void cNIF::Private::applyColours()
@@ -286,10 +289,15 @@ void cNIF::Private::informationReceived(const QString &id)
     const QString value = q->Value();
     if (!grabber || grabber->GetField(QStringLiteral("ID")) != value || id != value)
         return;
-    for (const FetchedField &field : FetchedFields)
+    const QPointer<cNIF> alive(q);
+    for (const FetchedField &field : FetchedFields) {
         q->setInformation(QString::fromUtf16(field.id), grabber->GetField(QString::fromUtf16(field.key)));
+        if (!alive || !grabber)
+            return;
+    }
     q->setNome(grabber->HolderName());
-    refreshTip();
+    if (alive)
+        refreshTip();
 }
 
 void cNIF::Private::fetchFinished()
@@ -372,10 +380,11 @@ bool cNIF::eventFilter(QObject *watched, QEvent *event)
         return UserControl::eventFilter(watched, event);
     switch (event->type()) {
     case QEvent::MouseButtonPress:
-        if (static_cast<QMouseEvent *>(event)->button() == Qt::RightButton) {
-            PopupContextMenu();
+        // The right button's menu opens on the context menu event Qt sends right after the
+        // press: Qt touches the pressed box no more after that one, so the host may delete
+        // the control while its menu is open.
+        if (static_cast<QMouseEvent *>(event)->button() == Qt::RightButton)
             return true;
-        }
         break;
     case QEvent::MouseButtonRelease: {
         const auto *mouse = static_cast<QMouseEvent *>(event);
@@ -385,10 +394,8 @@ bool cNIF::eventFilter(QObject *watched, QEvent *event)
         break;
     }
     case QEvent::ContextMenu:
-        // The control's own menu replaces the box's: the right button opens it when pressed,
-        // the menu key here.
-        if (static_cast<QContextMenuEvent *>(event)->reason() == QContextMenuEvent::Keyboard)
-            PopupContextMenu();
+        // The control's own menu replaces the box's, for the right button and the menu key.
+        PopupContextMenu();
         return true;
     case QEvent::FocusIn:
         if (watched == d->nif)
@@ -535,16 +542,25 @@ bool cNIF::IsOK()
 
 void cNIF::RefreshMe()
 {
+    // The host may delete the control in any of the events raised here.
+    const QPointer<cNIF> alive(this);
     if (IsEmpty()) {
         d->Shape1->setBorderColor(White);
         if (!d->name.isEmpty())
             Q_EMIT Cleared();
+        if (!alive)
+            return;
         d->name.clear();
         d->setStateColours(Black, White);
-    } else if (IsValid() && IsAccepted()) {
+    } else if (const bool valid = IsValid(); !alive) {
+        return;
+    } else if (valid && IsAccepted()) {
         d->popup->entry("mnu_ficha")->setEnabled(true);
         Q_EMIT NIFIndicated();
-        GetNIFInformation();
+        if (alive)
+            GetNIFInformation();
+        if (!alive)
+            return;
         d->setStateColours(ValidText, White);
     } else {
         d->popup->entry("mnu_ficha")->setEnabled(false);
@@ -653,9 +669,10 @@ void cNIF::setInformation(const QString &varID, const QString &value)
     }
     if (varID == QLatin1String("AUTO") || !changed)
         return;
+    const QPointer<cNIF> alive(this);
     if (!value.isEmpty())
         Q_EMIT UpdatedInformation(varID);
-    if (varID == QLatin1String("nome")) {
+    if (alive && varID == QLatin1String("nome")) {
         d->name = value;
         Q_EMIT NameUpdated(value);
     }
@@ -668,8 +685,10 @@ void cNIF::GetNIFInformation()
     if (companion::KeyedStore *store = d->store()) {
         const QString stored = store->Read(d->storeKey(QStringLiteral("nome"))).toString();
         if (!stored.isEmpty()) {
+            const QPointer<cNIF> alive(this);
             setNome(stored);
-            d->fetchFinished();
+            if (alive)
+                d->fetchFinished();
             return;
         }
     }
@@ -691,7 +710,10 @@ void cNIF::setNome(const QString &name)
     if (name == d->name)
         return;
     d->name = name;
+    const QPointer<cNIF> alive(this);
     setInformation(QStringLiteral("nome"), name);
+    if (!alive)
+        return;
     d->refreshTip();
     Q_EMIT NameUpdated(d->name);
 }
