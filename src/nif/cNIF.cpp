@@ -493,8 +493,13 @@ void cNIF::setCountryID(const QString &code)
     d->lastAppliedCountry = value;
     d->country = value.toUpper();
     if (d->country == Portugal) {
-        if (d->nif->text().size() > PortugalLength)
+        if (d->nif->text().size() > PortugalLength) {
+            // The cut raises Changed, in which the host may delete the control.
+            const QPointer<cNIF> alive(this);
             d->nif->setText(d->nif->text().first(PortugalLength));
+            if (!alive)
+                return;
+        }
         d->nif->setMaxLength(PortugalLength);
     } else {
         d->nif->setMaxLength(32767);
@@ -582,13 +587,20 @@ void cNIF::ShowCountryList()
     form.setFilterMode(d->filter);
     form.setCustomList(d->customCountryList);
     form.RelistCountries();
+    // The host may delete the control while the form is open.
+    const QPointer<cNIF> alive(this);
     platform::showModal(form);
     const QString chosen = form.Tag();
+    form.Unload();
+    if (!alive)
+        return;
     if (!chosen.isEmpty())
         setCountryID(chosen);
-    form.Unload();
+    if (!alive)
+        return;
     RefreshMe();
-    unsetCursor();
+    if (alive)
+        unsetCursor();
 }
 
 QString cNIF::Value() const
@@ -599,19 +611,24 @@ QString cNIF::Value() const
 void cNIF::setValue(const QString &value)
 {
     const bool bareNumber = !value.isEmpty() && nifValidator::IsNumericFrom(value, 1, 1);
+    // Each step may raise events in which the host deletes the control.
+    const QPointer<cNIF> alive(this);
     if (value.isEmpty())
         setCountryID(QString(Portugal));
     else if (value.size() != PortugalLength && !bareNumber)
         setCountryID(value.first(std::min<qsizetype>(2, value.size())));
-    if (Value() == value)
+    if (!alive || Value() == value)
         return;
     if (bareNumber) {
         d->nif->setText(value);
     } else {
         setCountryID(value.first(std::min<qsizetype>(2, value.size())));
+        if (!alive)
+            return;
         d->nif->setText(value.size() > 2 ? value.sliced(2) : QString());
     }
-    RefreshMe();
+    if (alive)
+        RefreshMe();
 }
 
 bool cNIF::Enabled() const

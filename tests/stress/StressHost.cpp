@@ -80,6 +80,8 @@ QString describe(const QWidget *widget)
     return QLatin1String(widget->metaObject()->className()) + (name.isEmpty() ? QString() : QLatin1Char(' ') + name);
 }
 
+QString keyText(Qt::Key key, Qt::KeyboardModifiers modifiers);
+
 bool declaredByTheLibrary(const QMetaObject *meta)
 {
     return QByteArray(meta->className()).startsWith("zelctl::");
@@ -187,7 +189,10 @@ std::vector<QMetaMethod> eventsOf(const QObject *object)
     const QMetaObject *meta = object->metaObject();
     for (int i = 0; i < meta->methodCount(); ++i) {
         const QMetaMethod method = meta->method(i);
-        if (method.methodType() == QMetaMethod::Signal && declaredByTheLibrary(method.enclosingMetaObject()))
+        // propertyChanged is the container's bookkeeping of a modified form, not an event of
+        // the control that a host handles.
+        if (method.methodType() == QMetaMethod::Signal && declaredByTheLibrary(method.enclosingMetaObject())
+            && method.name() != "propertyChanged")
             events.push_back(method);
     }
     return events;
@@ -254,7 +259,7 @@ void Watcher::look()
             = { Qt::Key_Down, Qt::Key_Up, Qt::Key_Tab, Qt::Key_Space, Qt::Key_Return, Qt::Key_Escape, Qt::Key_Right };
         const Qt::Key key = m_random.pick(keys);
         journal.add(QStringLiteral("watcher presses %1 in %2").arg(QKeySequence(key).toString(), describe(open)));
-        QTest::keyClick(open, key);
+        QTest::sendKeyEvent(QTest::Click, open, key, keyText(key, Qt::NoModifier), Qt::NoModifier);
         return;
     }
     journal.add(QStringLiteral("watcher closes %1").arg(describe(open)));
@@ -864,7 +869,14 @@ void Episode::typeText()
     if (!focus || focus->window() != m_form)
         return;
     note(QStringLiteral("type %1 into %2").arg(shortly(text), describe(focus)));
-    QTest::keyClicks(focus, text);
+    const QPointer<QWidget> into(focus);
+    for (const QChar c : text) {
+        if (!into)
+            return;
+        const char32_t upper = c.toUpper().unicode();
+        const bool plain = (upper >= u'0' && upper <= u'9') || (upper >= u'A' && upper <= u'Z') || upper == u' ';
+        QTest::sendKeyEvent(QTest::Click, into, plain ? Qt::Key(upper) : Qt::Key_unknown, QString(c), Qt::NoModifier);
+    }
 }
 
 void Episode::paste()
@@ -906,7 +918,7 @@ void Episode::click(bool twice)
              .arg(at.y()));
     // One double click is one Click (or Clicked) of a control that draws itself.
     std::unique_ptr<QSignalSpy> clicks;
-    if (twice && on == m_object && button == Qt::LeftButton) {
+    if (twice && on == m_object && button == Qt::LeftButton && !on->childAt(on->mapFrom(on->window(), at))) {
         const QMetaObject *meta = m_object->metaObject();
         int index = meta->indexOfSignal("Click()");
         if (index < 0)
