@@ -210,7 +210,11 @@ cNIB::cNIB(QWidget *parent)
     });
 }
 
-cNIB::~cNIB() = default;
+cNIB::~cNIB()
+{
+    // The boxes give up the focus while QWidget's destructor deletes them, after d is gone.
+    disconnect(qApp, &QApplication::focusChanged, this, nullptr);
+}
 
 QString cNIB::Text() const
 {

@@ -198,8 +198,10 @@ std::vector<QMetaMethod> eventsOf(const QObject *object)
     return events;
 }
 
-bool UnsafeEvents::isSafe(int eventType)
+bool UnsafeEvents::isSafe(const QObject *receiver, int eventType)
 {
+    if (!declaredByTheLibrary(receiver->metaObject()))
+        return false;
     switch (eventType) {
     case QEvent::MouseButtonPress:
     case QEvent::MouseButtonRelease:
