@@ -308,7 +308,9 @@ void cNIF::Private::fetchFinished()
 
 QString cNIF::Private::tipText()
 {
-    if (q->IsEmpty() || name.isEmpty() || !q->IsValid())
+    // Checked without IsValid: building a tip raises no Validated for the host to act on.
+    if (q->IsEmpty() || name.isEmpty()
+        || !nifValidator::CheckTaxNumber(nif->text(), nifValidator::CountryIndex(country)))
         return {};
     const QString lineBreak = QStringLiteral("\r\n");
     QString text = name;
@@ -541,8 +543,9 @@ bool cNIF::IsAccepted() const
 
 bool cNIF::IsOK()
 {
+    const QPointer<cNIF> alive(this);
     const bool valid = IsValid();
-    return valid && IsAccepted() && !IsEmpty();
+    return valid && alive && IsAccepted() && !IsEmpty();
 }
 
 void cNIF::RefreshMe()
@@ -668,7 +671,9 @@ QString cNIF::Information(const QString &varID)
 
 void cNIF::setInformation(const QString &varID, const QString &value)
 {
-    if (!IsValid())
+    // IsValid raises Validated, in which the host may delete the control.
+    const QPointer<cNIF> alive(this);
+    if (!IsValid() || !alive)
         return;
     bool changed = false;
     // The fetcher keeps the data of the number it fetched; another number's values are
@@ -686,7 +691,6 @@ void cNIF::setInformation(const QString &varID, const QString &value)
     }
     if (varID == QLatin1String("AUTO") || !changed)
         return;
-    const QPointer<cNIF> alive(this);
     if (!value.isEmpty())
         Q_EMIT UpdatedInformation(varID);
     if (alive && varID == QLatin1String("nome")) {

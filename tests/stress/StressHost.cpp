@@ -253,7 +253,9 @@ void Watcher::look()
             if (button->isVisible() && button->isEnabled()) {
                 journal.add(QStringLiteral("watcher clicks %1 \"%2\" in %3")
                                 .arg(describe(button), button->text(), describe(open)));
-                button->click();
+                // Queued: a form the click opens must not run inside this timer's own slot,
+                // where the timer cannot fire again to close it.
+                QMetaObject::invokeMethod(button, &QAbstractButton::click, Qt::QueuedConnection);
                 return;
             }
         }
@@ -261,7 +263,10 @@ void Watcher::look()
             = { Qt::Key_Down, Qt::Key_Up, Qt::Key_Tab, Qt::Key_Space, Qt::Key_Return, Qt::Key_Escape, Qt::Key_Right };
         const Qt::Key key = m_random.pick(keys);
         journal.add(QStringLiteral("watcher presses %1 in %2").arg(QKeySequence(key).toString(), describe(open)));
-        QTest::sendKeyEvent(QTest::Click, open, key, keyText(key, Qt::NoModifier), Qt::NoModifier);
+        QMetaObject::invokeMethod(
+            open,
+            [open, key] { QTest::sendKeyEvent(QTest::Click, open, key, keyText(key, Qt::NoModifier), Qt::NoModifier); },
+            Qt::QueuedConnection);
         return;
     }
     journal.add(QStringLiteral("watcher closes %1").arg(describe(open)));
