@@ -71,7 +71,10 @@ public:
                      if (auto *widget = qobject_cast<QWidget *>(object.data()))
                          widget->setFocus();
                  },
-                 [&] { QTest::keyClicks(QApplication::focusWidget(), QStringLiteral("PT501964843")); },
+                 [&] {
+                     if (QWidget *focus = QApplication::focusWidget())
+                         QTest::keyClicks(focus, QStringLiteral("PT501964843"));
+                 },
                  [&] { QTest::keyClick(window, Qt::Key_Tab); },
                  [&] { QTest::keyClick(window, Qt::Key_Escape); },
                  [&] {

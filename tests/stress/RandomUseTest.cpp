@@ -1,5 +1,5 @@
 // The stress host over every class the library serves: random episodes, each from its own
-// seed, for a budget of seconds shared among the classes (ZELCTL_STRESS_SECONDS, 24 by
+// seed, for a budget of seconds shared among the classes (ZELCTL_STRESS_SECONDS, 12 by
 // default; ZELCTL_STRESS_SEED picks another series). ZELCTL_STRESS_REPLAY=Class:seed
 // replays one episode and prints its steps as they run.
 
@@ -68,7 +68,7 @@ TEST_P(RandomUse, aCarelessHostBreaksNothing)
     const std::vector<std::string> classes = servedClasses();
     const qint64 budget = qEnvironmentVariableIntValue("ZELCTL_STRESS_SECONDS") > 0
         ? qEnvironmentVariableIntValue("ZELCTL_STRESS_SECONDS") * 1000ll / qint64(classes.size())
-        : 24000 / qint64(classes.size());
+        : 12000 / qint64(classes.size());
     const quint64 series
         = qEnvironmentVariableIsSet("ZELCTL_STRESS_SEED") ? qgetenv("ZELCTL_STRESS_SEED").toULongLong() : 1;
     const quint64 classIndex = quint64(std::find(classes.begin(), classes.end(), GetParam()) - classes.begin());
