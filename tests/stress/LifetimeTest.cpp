@@ -117,20 +117,7 @@ private:
             if (method.methodType() != QMetaMethod::Method || method.access() != QMetaMethod::Public
                 || !QByteArray(method.enclosingMetaObject()->className()).startsWith("zelctl::"))
                 continue;
-            std::array<QVariant, 10> arguments;
-            std::array<QGenericArgument, 10> generic;
-            const QList<QByteArray> names = method.parameterNames();
-            for (int p = 0; p < method.parameterCount() && p < 10; ++p) {
-                arguments[size_t(p)] = values.make(method.parameterMetaType(p), names.value(p));
-                generic[size_t(p)] = QGenericArgument(method.parameterMetaType(p).name(), arguments[size_t(p)].data());
-            }
-            QVariant answer(method.returnMetaType());
-            method.invoke(object, Qt::DirectConnection,
-                method.returnMetaType().id() == QMetaType::Void
-                    ? QGenericReturnArgument()
-                    : QGenericReturnArgument(method.returnMetaType().name(), answer.data()),
-                generic[0], generic[1], generic[2], generic[3], generic[4], generic[5], generic[6], generic[7],
-                generic[8], generic[9]);
+            call(object, method, values);
             runFor(5);
         }
     }

@@ -1052,26 +1052,8 @@ void Episode::readProperties()
 void Episode::invoke()
 {
     const std::vector<QMetaMethod> methods = invokables(m_object);
-    if (methods.empty())
-        return;
-    const QMetaMethod method = m_random.pick(methods);
-    std::array<QVariant, 10> arguments;
-    QStringList shown;
-    const QList<QByteArray> names = method.parameterNames();
-    for (int i = 0; i < method.parameterCount() && i < 10; ++i) {
-        arguments[size_t(i)] = m_values.make(method.parameterMetaType(i), names.value(i));
-        shown << shortly(arguments[size_t(i)]);
-    }
-    note(QStringLiteral("call %1(%2)").arg(QLatin1String(method.name()), shown.join(QStringLiteral(", "))));
-    std::array<QGenericArgument, 10> generic;
-    for (int i = 0; i < method.parameterCount() && i < 10; ++i)
-        generic[size_t(i)] = QGenericArgument(method.parameterMetaType(i).name(), arguments[size_t(i)].data());
-    QVariant answer(method.returnMetaType());
-    const QGenericReturnArgument returned = method.returnMetaType().id() == QMetaType::Void
-        ? QGenericReturnArgument()
-        : QGenericReturnArgument(method.returnMetaType().name(), answer.data());
-    method.invoke(m_object, Qt::DirectConnection, returned, generic[0], generic[1], generic[2], generic[3], generic[4],
-        generic[5], generic[6], generic[7], generic[8], generic[9]);
+    if (!methods.empty())
+        call(m_object, m_random.pick(methods), m_values);
 }
 
 void Episode::roundTrip()
@@ -1120,6 +1102,27 @@ void Episode::wait()
 }
 
 } // namespace
+
+void call(QObject *object, const QMetaMethod &method, Values &values)
+{
+    std::array<QVariant, 10> arguments;
+    std::array<QGenericArgument, 10> generic;
+    QStringList shown;
+    const QList<QByteArray> names = method.parameterNames();
+    for (int i = 0; i < method.parameterCount() && i < 10; ++i) {
+        arguments[size_t(i)] = values.make(method.parameterMetaType(i), names.value(i));
+        generic[size_t(i)] = QGenericArgument(method.parameterMetaType(i).name(), arguments[size_t(i)].data());
+        shown << shortly(arguments[size_t(i)]);
+    }
+    Journal::current().add(
+        QStringLiteral("call %1(%2)").arg(QLatin1String(method.name()), shown.join(QStringLiteral(", "))));
+    QVariant answer(method.returnMetaType());
+    const QGenericReturnArgument returned = method.returnMetaType().id() == QMetaType::Void
+        ? QGenericReturnArgument()
+        : QGenericReturnArgument(method.returnMetaType().name(), answer.data());
+    method.invoke(object, Qt::DirectConnection, returned, generic[0], generic[1], generic[2], generic[3], generic[4],
+        generic[5], generic[6], generic[7], generic[8], generic[9]);
+}
 
 EpisodeResult runEpisode(const QString &className, quint64 seed, int steps)
 {

@@ -148,6 +148,9 @@ private:
     std::vector<QPointer<QObject>> m_objects;
 };
 
+// Calls a method late-bound with arguments from `values`, noting the call in the journal.
+void call(QObject *object, const QMetaMethod &method, Values &values);
+
 // One episode: a form with the object and a neighbouring text box, `steps` random steps,
 // the object deleted at some point, then checks that the form lives on.
 struct EpisodeResult
