@@ -15,6 +15,7 @@
 #include <QTimer>
 
 #include <cmath>
+#include <cstdlib>
 #include <limits>
 
 namespace zelctl {
@@ -648,9 +649,13 @@ void ucAniGIF::paintEvent(QPaintEvent *event)
         gdi::SetStretchBltMode(dc, scaled ? gdi::HALFTONE : gdi::COLORONCOLOR);
         gdi::SetBrushOrgEx(dc, 0, 0);
         d->canvas.show(d->frames, current);
-        const QRect to(d->offsetX, d->offsetY, int(std::lround(d->frames.canvasWidth() * d->scaleX)),
-            int(std::lround(d->frames.canvasHeight() * d->scaleY)));
-        d->canvas.paint(dc, to);
+        // An offset that puts the picture far beyond any bitmap leaves nothing to draw, and
+        // would overflow the rectangle's arithmetic.
+        const qint64 w = std::llround(d->frames.canvasWidth() * d->scaleX);
+        const qint64 h = std::llround(d->frames.canvasHeight() * d->scaleY);
+        constexpr qint64 Reach = qint64(1) << 27;
+        if (std::abs(qint64(d->offsetX)) + w < Reach && std::abs(qint64(d->offsetY)) + h < Reach)
+            d->canvas.paint(dc, QRect(d->offsetX, d->offsetY, int(w), int(h)));
     }
     if (designMode()) {
         const gdi::HDC dc = target.hdc();
