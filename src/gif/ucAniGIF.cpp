@@ -11,9 +11,11 @@
 #include <QBuffer>
 #include <QFile>
 #include <QMouseEvent>
+#include <QPointer>
 #include <QTimer>
 
 #include <cmath>
+#include <cstdlib>
 #include <limits>
 
 namespace zelctl {
@@ -260,8 +262,9 @@ void ucAniGIF::Private::remoteArrived(const QByteArray &bytes)
     const int width = quint8(bytes[6]) | quint8(bytes[7]) << 8;
     const int height = quint8(bytes[8]) | quint8(bytes[9]) << 8;
     bool cancel = false;
+    const QPointer<ucAniGIF> alive(q);
     Q_EMIT q->RemoteLoadComplete(twipsFromPixels(width), twipsFromPixels(height), cancel);
-    if (!cancel)
+    if (alive && !cancel)
         load(bytes);
 }
 
@@ -646,9 +649,13 @@ void ucAniGIF::paintEvent(QPaintEvent *event)
         gdi::SetStretchBltMode(dc, scaled ? gdi::HALFTONE : gdi::COLORONCOLOR);
         gdi::SetBrushOrgEx(dc, 0, 0);
         d->canvas.show(d->frames, current);
-        const QRect to(d->offsetX, d->offsetY, int(std::lround(d->frames.canvasWidth() * d->scaleX)),
-            int(std::lround(d->frames.canvasHeight() * d->scaleY)));
-        d->canvas.paint(dc, to);
+        // An offset that puts the picture far beyond any bitmap leaves nothing to draw, and
+        // would overflow the rectangle's arithmetic.
+        const qint64 w = std::llround(d->frames.canvasWidth() * d->scaleX);
+        const qint64 h = std::llround(d->frames.canvasHeight() * d->scaleY);
+        constexpr qint64 Reach = qint64(1) << 27;
+        if (std::abs(qint64(d->offsetX)) + w < Reach && std::abs(qint64(d->offsetY)) + h < Reach)
+            d->canvas.paint(dc, QRect(d->offsetX, d->offsetY, int(w), int(h)));
     }
     if (designMode()) {
         const gdi::HDC dc = target.hdc();
@@ -691,11 +698,18 @@ void ucAniGIF::mousePressEvent(QMouseEvent *event)
 void ucAniGIF::mouseReleaseEvent(QMouseEvent *event)
 {
     const QPointF at = event->position();
+    const bool click
+        = std::exchange(d->pressed, false) && event->button() == Qt::LeftButton && rect().contains(at.toPoint());
+    const QPointer<ucAniGIF> alive(this);
     Q_EMIT MouseUp(buttonsOf(event->button()), shiftOf(event->modifiers()), float(twipsFromPixels(1) * at.x()),
         float(twipsFromPixels(1) * at.y()));
-    if (d->pressed && event->button() == Qt::LeftButton && rect().contains(at.toPoint()))
+    if (alive && click)
         Q_EMIT Click();
-    d->pressed = false;
+}
+
+void ucAniGIF::mouseDoubleClickEvent(QMouseEvent *)
+{
+    // The second press of a double click makes no second Click.
 }
 
 void ucAniGIF::mouseMoveEvent(QMouseEvent *event)

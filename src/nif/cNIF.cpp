@@ -20,7 +20,6 @@
 
 #include <QAction>
 #include <QClipboard>
-#include <QContextMenuEvent>
 #include <QGuiApplication>
 #include <QLineEdit>
 #include <QMimeData>
@@ -491,11 +490,11 @@ bool cNIF::eventFilter(QObject *watched, QEvent *event)
     const Private::Guard alive(this);
     switch (event->type()) {
     case QEvent::MouseButtonPress:
-        if (static_cast<QMouseEvent *>(event)->button() == Qt::RightButton) {
-            if (isEnabled())
-                PopupContextMenu();
+        // The right button's menu opens on the context menu event Qt sends right after the
+        // press: Qt touches the pressed box no more after that one, so the host may delete
+        // the control while its menu is open.
+        if (static_cast<QMouseEvent *>(event)->button() == Qt::RightButton)
             return true;
-        }
         break;
     case QEvent::MouseButtonRelease: {
         const auto *mouse = static_cast<QMouseEvent *>(event);
@@ -529,9 +528,8 @@ bool cNIF::eventFilter(QObject *watched, QEvent *event)
         break;
     }
     case QEvent::ContextMenu:
-        // The control's own menu replaces the box's: the right button opens it when pressed,
-        // the menu key here.
-        if (static_cast<QContextMenuEvent *>(event)->reason() == QContextMenuEvent::Keyboard && isEnabled())
+        // The control's own menu replaces the box's, for the right button and the menu key.
+        if (isEnabled())
             PopupContextMenu();
         return true;
     case QEvent::FocusIn:

@@ -1,5 +1,6 @@
 #include "Settings.h"
 
+#include <QFile>
 #include <QSettings>
 #include <QStandardPaths>
 
@@ -12,6 +13,36 @@ QString settingsKey(const QString &section, const QString &key)
     return section + QLatin1Char('/') + key;
 }
 
+// The text after "key=" in the section, as a person typed it, when it is not quoted. Only
+// such a value can hold a comma or a semicolon that QSettings did not write itself.
+QString handWrittenValue(const QString &file, const QString &section, const QString &key)
+{
+    QFile in(file);
+    if (!in.open(QIODevice::ReadOnly | QIODevice::Text))
+        return {};
+    bool inSection = false;
+    while (!in.atEnd()) {
+        const QString line = QString::fromUtf8(in.readLine()).trimmed();
+        if (line.startsWith(QLatin1Char('[')) && line.endsWith(QLatin1Char(']'))) {
+            inSection = line.mid(1, line.size() - 2).trimmed().compare(section, Qt::CaseInsensitive) == 0;
+            continue;
+        }
+        const qsizetype equals = line.indexOf(QLatin1Char('='));
+        if (inSection && equals > 0 && line.first(equals).trimmed().compare(key, Qt::CaseInsensitive) == 0) {
+            const QString value = line.sliced(equals + 1).trimmed();
+            return value.startsWith(QLatin1Char('"')) ? QString() : value;
+        }
+    }
+    return {};
+}
+
+// A store that exists but could not be read is not written: writing would replace the
+// user's whole file with what little was understood of it.
+bool writable(const QSettings &store)
+{
+    return store.status() == QSettings::NoError;
+}
+
 } // namespace
 
 QString settingsFile(const QString &application)
@@ -22,20 +53,37 @@ QString settingsFile(const QString &application)
 
 QString GetSetting(const QString &application, const QString &section, const QString &key, const QString &defaultValue)
 {
-    const QSettings store(settingsFile(application), QSettings::IniFormat);
-    return store.value(settingsKey(section, key), defaultValue).toString();
+    const QString file = settingsFile(application);
+    const QSettings store(file, QSettings::IniFormat);
+    const QVariant value = store.value(settingsKey(section, key));
+    if (!value.isValid())
+        return defaultValue;
+    // An unquoted comma makes QSettings read a list and a semicolon ends its value; a
+    // hand-edited setting such as "RootPath=/opt/zel,2024" is meant whole.
+    const QString typed = handWrittenValue(file, section, key);
+    if (typed.contains(QLatin1Char(',')) || typed.contains(QLatin1Char(';')))
+        return typed;
+    return value.toString();
 }
 
-void SaveSetting(const QString &application, const QString &section, const QString &key, const QString &value)
+bool SaveSetting(const QString &application, const QString &section, const QString &key, const QString &value)
 {
     QSettings store(settingsFile(application), QSettings::IniFormat);
+    if (!writable(store))
+        return false;
     store.setValue(settingsKey(section, key), value);
+    store.sync();
+    return store.status() == QSettings::NoError;
 }
 
-void DeleteSetting(const QString &application, const QString &section, const QString &key)
+bool DeleteSetting(const QString &application, const QString &section, const QString &key)
 {
     QSettings store(settingsFile(application), QSettings::IniFormat);
+    if (!writable(store))
+        return false;
     store.remove(settingsKey(section, key));
+    store.sync();
+    return store.status() == QSettings::NoError;
 }
 
 } // namespace zelctl::platform

@@ -251,14 +251,19 @@ void cSujeitoSelector::Private::click(int i)
             before = kinds[j];
     }
 
+    // The host may delete the control in any of its events, or while its list is open.
+    const QPointer<cSujeitoSelector> alive(q);
     if (canSelectNone && wasPressed && clicked->Tag() == lastClickedTag) {
-        q->setSelectedSujeito(QString());
         lastClickedTag.clear();
-        Q_EMIT q->Changed();
+        q->setSelectedSujeito(QString());
+        if (alive)
+            Q_EMIT q->Changed();
         return;
     }
     lastClickedTag = clicked->Tag();
     Q_EMIT q->Clicked();
+    if (!alive)
+        return;
 
     if (clicked->Value()) {
         for (int j = 0; j < kindCount; ++j) {
@@ -275,6 +280,8 @@ void cSujeitoSelector::Private::click(int i)
         refresh();
         if (isListed(now) && index == 0) {
             chooseFromList(pressedButton());
+            if (!alive)
+                return;
             if (index == 0)
                 setIndex(1);
         }
@@ -356,7 +363,10 @@ void cSujeitoSelector::Private::chooseFromList(int pressed)
     listItem(0)->setEnabled(false);
 
     const CommandButton *b = button(pressed);
+    const QPointer<cSujeitoSelector> alive(q);
     QAction *chosen = subject::showListMenu(*mnu_listagem, q->mapToGlobal(QPoint(b->x(), b->height())));
+    if (!alive)
+        return;
     const int k = chosen ? int(mnu_list.indexOf(chosen)) : -1;
     if (k >= 1 && k <= count) {
         index = qint16(k);

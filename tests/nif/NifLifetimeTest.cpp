@@ -121,7 +121,7 @@ TEST_F(NifLifetime, deletedWhileSomethingOfItsOwnIsPending)
         const char *pending;
         std::function<void()> open;
     } cases[] = {
-        { "its menu", [&] { QTest::mousePress(box(), Qt::RightButton); } },
+        { "its menu", [&] { rightClick(box()); } },
         { "its country list",
             [&] {
                 control->setCountries(GSEL_All);

@@ -1,3 +1,4 @@
+#include "common/modFuncs.h"
 #include "platform/OleColor.h"
 #include "platform/Settings.h"
 #include "platform/Shell.h"
@@ -6,6 +7,8 @@
 #include <QStandardPaths>
 
 #include <gtest/gtest.h>
+
+#include <thread>
 
 using namespace zelctl::platform;
 
@@ -21,6 +24,35 @@ TEST(Settings, liveInThePrivateConfigFolderAndFoldTheApplicationName)
     EXPECT_TRUE(QFile::exists(settingsFile("ZeL")));
     DeleteSetting("zEL", "Config", "allowautonif");
     EXPECT_EQ(GetSetting("ZEL", "Config", "allowautonif", "1"), "1");
+}
+
+TEST(Settings, aHandEditedValueIsReadWholeAndNeverWrittenOver)
+{
+    const auto contents = [](const QString &path) {
+        QFile file(path);
+        return file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray();
+    };
+    const auto write = [](const QString &path, const QByteArray &bytes) {
+        QFile file(path);
+        ASSERT_TRUE(file.open(QIODevice::WriteOnly | QIODevice::Truncate));
+        file.write(bytes);
+    };
+    const QString path = settingsFile("zEL");
+    const QByteArray original = contents(path);
+    const QByteArray edited = "[Setup]\nRootPath=/opt/zel,2024\nSkinPreviewPath = /srv/skins;old \n";
+    write(path, edited);
+
+    EXPECT_EQ(GetSetting("zEL", "Setup", "RootPath"), "/opt/zel,2024");
+    EXPECT_EQ(GetSetting("zEL", "Setup", "SkinPreviewPath"), "/srv/skins;old");
+    // Each thread keeps its own root path, so a new one reads the setting afresh.
+    QString root;
+    std::thread([&root] { root = zelctl::modFuncs::GetRootPath(); }).join();
+    EXPECT_EQ(root, "/opt/zel,2024/");
+    EXPECT_EQ(contents(path), edited) << "the user's setting stays as written";
+
+    EXPECT_TRUE(SaveSetting("zEL", "Setup", "Mixed", "a,b;c"));
+    EXPECT_EQ(GetSetting("zEL", "Setup", "Mixed"), "a,b;c") << "what the library writes reads back the same";
+    write(path, original);
 }
 
 TEST(OleColor, resolvesSystemColoursAndConvertsToQColor)

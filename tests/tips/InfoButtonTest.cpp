@@ -152,7 +152,10 @@ TEST_F(PlacedButton, clickDependsOnTheAction)
         EXPECT_EQ(button->Action(), row.stored);
         EXPECT_EQ(button->cursor().shape(), Qt::PointingHandCursor);
         QSignalSpy clicks(button, &InfoButton::Click);
+        // A double click acts once: its second press is no new press.
         QTest::mouseClick(button, Qt::LeftButton, {}, QPoint(8, 8));
+        QTest::mouseDClick(button, Qt::LeftButton, {}, QPoint(8, 8));
+        QTest::mouseRelease(button, Qt::LeftButton, {}, QPoint(8, 8));
         EXPECT_EQ(clicks.count(), row.clicks) << row.action.toStdString();
         EXPECT_EQ(shell.opened, row.opened) << row.action.toStdString();
     }
