@@ -340,6 +340,40 @@ TEST_F(SelectionTest, theDialogIsPlacedAgainstItsParent)
     }
 }
 
+TEST_F(SelectionTest, aLongListThatGrowsOpenIsPaintedOnceNotOncePerItemLaidOut)
+{
+    // Growing open shows the form before its items are laid out; painting each item as it
+    // moved repainted every item it still overlapped.
+    QWidget parent;
+    parent.setGeometry(100, 100, 200, 50);
+    parent.show();
+    parent.setProperty("hWnd", platform::handleOf(&parent));
+    QList<GFXItem> items = numberedItems(120);
+    for (GFXItem &item : items)
+        item.Title += QString(2000, u'x');
+    GFXSelection s;
+    s.ParentObj = &parent;
+
+    struct PaintCounter : QObject
+    {
+        bool eventFilter(QObject *watched, QEvent *event) override
+        {
+            if (event->type() == QEvent::Paint && watched->objectName() == QLatin1String("btnSelector"))
+                ++paints;
+            return false;
+        }
+        int paints = 0;
+    } counter;
+    qApp->installEventFilter(&counter);
+    int paintsBeforeShown = -1;
+    select(s, items, [&](QDialog &dialog) {
+        paintsBeforeShown = counter.paints;
+        cancelButton(dialog)->click();
+    });
+    qApp->removeEventFilter(&counter);
+    EXPECT_LT(paintsBeforeShown, 2 * int(items.size()));
+}
+
 TEST_F(SelectionTest, theUnbuiltListsAnswerEmpty)
 {
     EXPECT_EQ(selection.QuickSelectFrom(QStringLiteral("a\tb\tc")), "");
