@@ -21,6 +21,7 @@
 #include <QLineEdit>
 #include <QMenu>
 #include <QMetaProperty>
+#include <QMouseEvent>
 #include <QScopedValueRollback>
 #include <QSignalSpy>
 #include <QTest>
@@ -198,14 +199,17 @@ std::vector<QMetaMethod> eventsOf(const QObject *object)
     return events;
 }
 
-bool UnsafeEvents::isSafe(const QObject *receiver, int eventType)
+bool UnsafeEvents::isSafe(const QObject *receiver, const QEvent *event)
 {
-    if (!declaredByTheLibrary(receiver->metaObject()))
-        return false;
-    switch (eventType) {
+    switch (event->type()) {
     case QEvent::MouseButtonPress:
-    case QEvent::MouseButtonRelease:
     case QEvent::MouseButtonDblClick:
+        // Qt follows a right-button press with a context menu event to the same widget,
+        // through a plain pointer.
+        if (static_cast<const QMouseEvent *>(event)->button() == Qt::RightButton)
+            return false;
+        break;
+    case QEvent::MouseButtonRelease:
     case QEvent::MouseMove:
     case QEvent::KeyPress:
     case QEvent::KeyRelease:
@@ -213,10 +217,21 @@ bool UnsafeEvents::isSafe(const QObject *receiver, int eventType)
     case QEvent::Timer:
     case QEvent::MetaCall:
     case QEvent::ContextMenu:
-        return true;
+        break;
     default:
         return false;
     }
+    if (declaredByTheLibrary(receiver->metaObject()))
+        return true;
+    // A Qt widget that is an inner part of a library control (the text boxes of the NIF and
+    // NIB boxes): the control keeps it alive while its own input code raises the control's
+    // events.
+    for (const QWidget *part = static_cast<const QWidget *>(receiver); !part->isWindow();) {
+        part = part->parentWidget();
+        if (declaredByTheLibrary(part->metaObject()))
+            return true;
+    }
+    return false;
 }
 
 // --- Watcher ----------------------------------------------------------------------------
@@ -1068,8 +1083,21 @@ void Episode::roundTrip()
         const QScopedValueRollback loading(m_loading, true);
         control->Load(saved);
     }
-    if (alive && !(alive->Save() == saved))
-        m_faults << QStringLiteral("a Save/Load round trip changed what the control saves");
+    if (!alive)
+        return;
+    const PropertyBag again = alive->Save();
+    for (const QString &name : saved.names() + again.names()) {
+        const QVariant before = saved.ReadProperty(name), after = again.ReadProperty(name);
+        // The number badge's empty caption is not written and reads back as "1", as its
+        // saved forms always have.
+        const bool documented = m_className == QLatin1String("skNumber") && name == QLatin1String("Caption")
+            && !before.isValid() && after == QLatin1String("1");
+        if (before != after && !documented) {
+            m_faults << QStringLiteral("a Save/Load round trip changed %1 from %2 to %3")
+                            .arg(name, shortly(before), shortly(after));
+            return;
+        }
+    }
 }
 
 void Episode::changeAmbient()

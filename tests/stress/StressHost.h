@@ -85,15 +85,15 @@ private:
 std::vector<QMetaMethod> eventsOf(const QObject *object);
 
 // Counts the events being delivered to widgets after which Qt itself still touches the
-// widget (paint, resize, show, focus ...), and any event of Qt's own widgets (a text box
-// goes on with its key press after it raised textChanged). The stress application's
-// notify() keeps it; a handler that runs inside such an event may only delete the control
-// later, as in any Qt program. Mouse, key, wheel and timer events of the library's own
-// widgets, queued calls and network replies are safe.
+// widget: paint, resize, show, focus and the like, and a right-button press, which Qt
+// follows with a context menu event to the same widget. A handler that runs inside such an
+// event may only delete the control later, as in any Qt program. Input events of the
+// library's widgets and of the inner boxes of its controls, timers, queued calls and
+// network replies are safe: the library keeps alive whatever of it their code still uses.
 class UnsafeEvents
 {
 public:
-    static bool isSafe(const QObject *receiver, int eventType);
+    static bool isSafe(const QObject *receiver, const QEvent *event);
     static void enter() { ++s_depth; }
     static void leave() { --s_depth; }
     static bool inside() { return s_depth > 0; }

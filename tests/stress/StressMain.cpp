@@ -24,7 +24,7 @@ public:
 
     bool notify(QObject *receiver, QEvent *event) override
     {
-        const bool unsafe = receiver->isWidgetType() && !zelctl::stress::UnsafeEvents::isSafe(receiver, event->type());
+        const bool unsafe = receiver->isWidgetType() && !zelctl::stress::UnsafeEvents::isSafe(receiver, event);
         if (unsafe)
             zelctl::stress::UnsafeEvents::enter();
         const bool handled = QApplication::notify(receiver, event);
