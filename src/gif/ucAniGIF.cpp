@@ -612,7 +612,7 @@ void ucAniGIF::WriteProperties(PropertyBag &bag)
         bag.WriteProperty("MouseIcon", png);
     }
     bag.WriteProperty("MousePointer", d->mousePointer, 0);
-    bag.WriteProperty("Enabled", isEnabled(), true);
+    bag.WriteProperty("Enabled", Enabled(), true);
     bag.WriteProperty("OffsetX", d->offsetX, 0);
     bag.WriteProperty("OffsetY", d->offsetY, 0);
 }

@@ -114,7 +114,8 @@ public:
     void setMouseIcon(const Picture &icon);
     qint32 MousePointer() const;
     void setMousePointer(qint32 pointer);
-    bool Enabled() const { return isEnabled(); }
+    // The control's own setting: a disabled form around it leaves this alone.
+    bool Enabled() const { return !testAttribute(Qt::WA_ForceDisabled); }
     qint32 OffsetX() const;
     void setOffsetX(qint32 pixels);
     qint32 OffsetY() const;

@@ -49,6 +49,10 @@ cSlider::cSlider(QWidget *parent)
     styleButton(false);
     connect(d->cc, &CommandButton::Click, this, [this] { setSlideOpen(!d->open); });
     connect(d->cc, &CommandButton::MouseHover, this, [this](bool hovering) { styleButton(hovering); });
+    // Focus given to the slider (a label's buddy, a host's setFocus) lands on its button;
+    // Tab reaches the button and the host's controls inside, never the bare container.
+    setFocusPolicy(Qt::TabFocus);
+    setFocusProxy(d->cc);
 
     // Every slider starts closed; its Slided waits for the event loop, when a host can hear it.
     close();

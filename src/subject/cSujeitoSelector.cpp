@@ -211,6 +211,7 @@ void cSujeitoSelector::Private::refresh()
     }
 
     int left = 0;
+    CommandButton *focusTarget = nullptr;
     for (int i = 0; i < kindCount; ++i) {
         CommandButton *b = button(i);
         if (!possible.contains(kinds[i])) {
@@ -224,7 +225,12 @@ void cSujeitoSelector::Private::refresh()
         b->setCaption(i == pressed ? title : QString());
         b->show();
         left += width;
+        if (!focusTarget || i == pressed)
+            focusTarget = b;
     }
+    // Focus given to the control (a label's buddy, a host's setFocus) lands on the pressed
+    // button, as on the checked one of a group of radio buttons.
+    q->setFocusProxy(focusTarget);
 
     if (pressed >= 0 && !button(pressed)->isHidden()) {
         const CommandButton *b = button(pressed);
@@ -380,6 +386,7 @@ cSujeitoSelector::cSujeitoSelector(QWidget *parent)
     , d(std::make_unique<Private>(this))
 {
     setFixedHeight(pixelsFromTwips(buttonHeight + heightMargin));
+    setFocusPolicy(Qt::TabFocus);
     d->refresh();
 }
 
