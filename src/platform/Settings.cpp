@@ -36,11 +36,32 @@ QString handWrittenValue(const QString &file, const QString &section, const QStr
     return {};
 }
 
-// A store that exists but could not be read is not written: writing would replace the
-// user's whole file with what little was understood of it.
+// Whether every line of the file is one the reader takes in: blank, a comment, a section
+// or "key=value". QSettings passes over other lines (a setting typed without its "=")
+// without a word and would leave them out of the file it writes back.
+bool everyLineUnderstood(const QString &file)
+{
+    QFile in(file);
+    if (!in.exists())
+        return true;
+    if (!in.open(QIODevice::ReadOnly | QIODevice::Text))
+        return false;
+    while (!in.atEnd()) {
+        const QString line = QString::fromUtf8(in.readLine()).trimmed();
+        const bool understood = line.isEmpty() || line.startsWith(QLatin1Char(';')) || line.startsWith(QLatin1Char('#'))
+            || (line.startsWith(QLatin1Char('[')) && line.endsWith(QLatin1Char(']')))
+            || line.indexOf(QLatin1Char('=')) > 0;
+        if (!understood)
+            return false;
+    }
+    return true;
+}
+
+// A store that exists but could not be read whole is not written: writing would replace
+// the user's whole file with what little was understood of it.
 bool writable(const QSettings &store)
 {
-    return store.status() == QSettings::NoError;
+    return store.status() == QSettings::NoError && everyLineUnderstood(store.fileName());
 }
 
 } // namespace

@@ -3,7 +3,9 @@
 #include "platform/Settings.h"
 #include "platform/Shell.h"
 
+#include <QDir>
 #include <QFile>
+#include <QFileInfo>
 #include <QStandardPaths>
 
 #include <gtest/gtest.h>
@@ -53,6 +55,55 @@ TEST(Settings, aHandEditedValueIsReadWholeAndNeverWrittenOver)
     EXPECT_TRUE(SaveSetting("zEL", "Setup", "Mixed", "a,b;c"));
     EXPECT_EQ(GetSetting("zEL", "Setup", "Mixed"), "a,b;c") << "what the library writes reads back the same";
     write(path, original);
+}
+
+TEST(Settings, aStoreThatCannotBeReadIsNeverWrittenOver)
+{
+    const QString path = settingsFile("zEL");
+    QFile original(path);
+    ASSERT_TRUE(original.rename(path + ".kept"));
+    const auto rootPathInANewThread = [] {
+        // Each thread keeps its own root path, so a new one reads the setting afresh.
+        QString root;
+        std::thread([&root] { root = zelctl::modFuncs::GetRootPath(); }).join();
+        return root;
+    };
+    const auto bytes = [&] {
+        QFile file(path);
+        return file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray("(unreadable)");
+    };
+
+    // A folder where the file should be: nothing can be read, nothing may be put there.
+    ASSERT_TRUE(QDir().mkpath(path + "/kept"));
+    EXPECT_EQ(rootPathInANewThread().toStdString(), (QDir::currentPath() + '/').toStdString())
+        << "the session still has a root";
+    EXPECT_FALSE(SaveSetting("zEL", "Setup", "RootPath", "/tmp/"));
+    EXPECT_FALSE(DeleteSetting("zEL", "Setup", "RootPath"));
+    EXPECT_TRUE(QFileInfo(path + "/kept").isDir());
+    ASSERT_TRUE(QDir(path).removeRecursively());
+
+    // A person's typos, which the reader passes over or reads round: the file stays as typed.
+    const struct
+    {
+        QByteArray typed;
+        QString root;
+    } typos[] = {
+        { "[Setup]\nRootPath /opt/zel\nSkinPreviewPath=/srv/skins\n", QDir::currentPath() + '/' },
+        { "[Setup\nRootPath=/opt/zel\nSkinPreviewPath=/srv/skins\n", "/opt/zel/" },
+    };
+    for (const auto &typo : typos) {
+        {
+            QFile file(path);
+            ASSERT_TRUE(file.open(QIODevice::WriteOnly | QIODevice::Truncate));
+            file.write(typo.typed);
+        }
+        EXPECT_EQ(rootPathInANewThread().toStdString(), typo.root.toStdString());
+        EXPECT_FALSE(SaveSetting("zEL", "Setup", "SkinPreviewPath", "/tmp/"));
+        EXPECT_FALSE(DeleteSetting("zEL", "Setup", "SkinPreviewPath"));
+        EXPECT_EQ(bytes(), typo.typed);
+    }
+    QFile::remove(path);
+    original.rename(path);
 }
 
 TEST(OleColor, resolvesSystemColoursAndConvertsToQColor)
