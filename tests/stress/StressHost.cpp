@@ -3,6 +3,7 @@
 #include "support/TestSupport.h"
 
 #include "frame/ClassRegistry.h"
+#include "frame/EntryPoints.h"
 #include "frame/Picture.h"
 #include "frame/PropertyBag.h"
 #include "frame/UserControl.h"
@@ -598,6 +599,7 @@ private:
     void roundTrip();
     void changeAmbient();
     void wait();
+    void lockServer();
 
     QWidget *target();
     QPoint pointIn(QWidget *widget);
@@ -616,6 +618,8 @@ private:
     QStringList m_faults;
     bool m_victimIsForm = false;
     bool m_loading = false;
+    // Locks this host holds on the library, as a host that keeps a class factory does.
+    int m_locks = 0;
 };
 
 void Episode::place()
@@ -626,7 +630,21 @@ void Episode::place()
     m_form->resize(300 + m_random.below(400), 200 + m_random.below(300));
     m_neighbour = new QLineEdit(m_form);
     m_neighbour->setObjectName(QStringLiteral("neighbour"));
-    m_object = CreateObject(m_className, m_form);
+    // As a host does: the class factory through the entry point, locked while it is kept.
+    const QUuid id = ClassRegistry::factoryFor(m_className)->info().classId;
+    const GUID classId = { id.data1, id.data2, id.data3,
+        { id.data4[0], id.data4[1], id.data4[2], id.data4[3], id.data4[4], id.data4[5], id.data4[6], id.data4[7] } };
+    void *factory = nullptr;
+    if (DllGetClassObject(&classId, &IID_IClassFactory, &factory) != S_OK || !factory) {
+        m_faults << QStringLiteral("DllGetClassObject gave no factory");
+        return;
+    }
+    if (m_random.chance(0.5)) {
+        note(QStringLiteral("LockServer(true)"));
+        ClassFactory::LockServer(true);
+        ++m_locks;
+    }
+    m_object = static_cast<const ClassFactory *>(factory)->CreateInstance(m_form);
     auto *widget = qobject_cast<QWidget *>(m_object.data());
     const bool laidOut = m_random.chance(0.5);
     if (laidOut) {
@@ -755,6 +773,7 @@ EpisodeResult Episode::run(int steps)
 {
     EpisodeResult result;
     const int liveBefore = LiveObject::count();
+    const qsizetype windowsBefore = QApplication::topLevelWidgets().size();
     place();
     const int deleteAt = m_random.below(steps + 1);
     const Deletion mode = Deletion(m_random.below(5));
@@ -777,6 +796,13 @@ EpisodeResult Episode::run(int steps)
     m_hook.reset();
     delete m_form.data();
     QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
+    for (; m_locks > 0; --m_locks)
+        ClassFactory::LockServer(false);
+    if (liveBefore == 0 && LiveObject::count() == 0 && DllCanUnloadNow() != S_OK)
+        result.faults << QStringLiteral("DllCanUnloadNow keeps the library loaded with nothing alive and no lock");
+    if (QApplication::topLevelWidgets().size() > windowsBefore)
+        result.faults << QStringLiteral("%1 windows outlive their form")
+                             .arg(QApplication::topLevelWidgets().size() - windowsBefore);
     if (LiveObject::count() != liveBefore)
         result.faults << QStringLiteral("%1 public objects outlive their form").arg(LiveObject::count() - liveBefore);
     return result;
@@ -830,6 +856,7 @@ void Episode::step()
         { 3, &Episode::roundTrip },
         { 2, &Episode::changeAmbient },
         { 4, &Episode::wait },
+        { 1, &Episode::lockServer },
     };
     static const int total = [] {
         int sum = 0;
@@ -1127,6 +1154,23 @@ void Episode::wait()
     const int ms = m_random.below(60);
     note(QStringLiteral("let the event loop run %1 ms").arg(ms));
     processFor(ms);
+}
+
+void Episode::lockServer()
+{
+    const int roll = m_random.below(3);
+    if (roll == 0) {
+        note(QStringLiteral("LockServer(true)"));
+        ClassFactory::LockServer(true);
+        ++m_locks;
+    } else {
+        // With no lock of its own, a careless host's unlock that the library must ignore.
+        note(QStringLiteral("LockServer(false)%1").arg(m_locks > 0 ? "" : ", holding no lock"));
+        ClassFactory::LockServer(false);
+        m_locks = std::max(m_locks - 1, 0);
+    }
+    if (DllCanUnloadNow() != S_FALSE)
+        m_faults << QStringLiteral("DllCanUnloadNow lets the library unload under a live object");
 }
 
 } // namespace
