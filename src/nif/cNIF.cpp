@@ -626,8 +626,10 @@ void cNIF::setBackColor(OleColor color)
         setPalette(palette);
         PropertyChanged(QStringLiteral("BackColor"));
     }
+    const Private::Guard alive(this);
     setCountryID(d->country);
-    RefreshMe();
+    if (alive)
+        RefreshMe();
 }
 
 QString cNIF::CountryID() const
@@ -971,9 +973,12 @@ void cNIF::ReadProperties(const PropertyBag &bag)
     if (known && filter >= GSEL_OnlyPT && filter <= GSEL_Custom)
         d->filter = GSEL_CountryFilterList(filter);
     d->customCountryList = bag.ReadProperty(QStringLiteral("CustomCountryList"), QString()).toString();
+    // The refresh raises events, in which the host may delete the control.
+    const Private::Guard alive(this);
     setBackColor(readColor(bag, QStringLiteral("BackColor"), White));
     // "Country" is what a saved control holds; a "CountryID" from the container wins.
-    setCountryID(bag.ReadProperty(QStringLiteral("CountryID"), saved).toString());
+    if (alive)
+        setCountryID(bag.ReadProperty(QStringLiteral("CountryID"), saved).toString());
 }
 
 void cNIF::WriteProperties(PropertyBag &bag)

@@ -114,6 +114,21 @@ TEST_F(NifLifetime, deletedFromInsideEachOfItsEvents)
     }
 }
 
+TEST_F(NifLifetime, deletedFromAnEventRaisedWhileItLoads)
+{
+    for (const bool wholeWindow : { false, true }) {
+        reset();
+        control->setValue("PT" + PlainNif);
+        const PropertyBag saved = control->Save();
+        // Loading refreshes the valid number it holds, which raises NIFIndicated.
+        deleteOn(&cNIF::NIFIndicated, wholeWindow);
+        control->Load(saved);
+        runDeferredDeletes();
+        EXPECT_TRUE(control.isNull());
+        EXPECT_EQ(window.isNull(), wholeWindow);
+    }
+}
+
 TEST_F(NifLifetime, deletedWhileSomethingOfItsOwnIsPending)
 {
     const struct

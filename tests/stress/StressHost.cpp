@@ -23,7 +23,6 @@
 #include <QMenu>
 #include <QMetaProperty>
 #include <QMouseEvent>
-#include <QScopedValueRollback>
 #include <QSignalSpy>
 #include <QTest>
 #include <QVBoxLayout>
@@ -617,7 +616,6 @@ private:
     std::unique_ptr<SignalHook> m_hook;
     QStringList m_faults;
     bool m_victimIsForm = false;
-    bool m_loading = false;
     // Locks this host holds on the library, as a host that keeps a class factory does.
     int m_locks = 0;
 };
@@ -672,7 +670,6 @@ void Episode::place()
             control->setAmbient(ambient);
             note(QStringLiteral("the container is a form designer"));
         }
-        const QScopedValueRollback loading(m_loading, true);
         if (m_random.chance(0.5)) {
             note(QStringLiteral("InitNew"));
             control->InitNew();
@@ -724,11 +721,11 @@ void Episode::destroy(const QString &how)
             return;
         }
     }
-    // Inside Qt's own delivery of a paint or layout event, or while the host itself is
-    // loading the control, deletion can only wait for the event loop.
-    const bool later = UnsafeEvents::inside() || m_loading;
+    // Inside an event after which Qt itself goes on with the widget, deletion can only wait
+    // for the event loop.
+    const bool later = UnsafeEvents::inside();
     note(QStringLiteral("the host deletes the %1 %2%3")
-             .arg(m_victimIsForm ? "form" : "control", how, later ? " (later: inside a paint or layout event)" : ""));
+             .arg(m_victimIsForm ? "form" : "control", how, later ? " (later: Qt goes on with the widget)" : ""));
     if (later)
         victim->deleteLater();
     else
@@ -1106,10 +1103,7 @@ void Episode::roundTrip()
     note(QStringLiteral("Save, then Load what was saved"));
     const PropertyBag saved = control->Save();
     const QPointer<UserControl> alive(control);
-    {
-        const QScopedValueRollback loading(m_loading, true);
-        control->Load(saved);
-    }
+    control->Load(saved);
     if (!alive)
         return;
     const PropertyBag again = alive->Save();
