@@ -1,12 +1,17 @@
 #include "common/modFuncs.h"
+#include "platform/MessageBox.h"
 #include "platform/OleColor.h"
 #include "platform/Settings.h"
 #include "platform/Shell.h"
 
+#include <QApplication>
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
+#include <QPointer>
 #include <QStandardPaths>
+#include <QTest>
+#include <QTimer>
 
 #include <gtest/gtest.h>
 
@@ -104,6 +109,22 @@ TEST(Settings, aStoreThatCannotBeReadIsNeverWrittenOver)
     }
     QFile::remove(path);
     original.rename(path);
+}
+
+TEST(MessageBox, closingTheWindowItBelongsToWhileItIsOpenAnswersAsEscape)
+{
+    const MessageBoxPresenter recorder = setMessageBoxPresenter({});
+    for (const auto &[buttons, answer] : { std::pair { MsgButtons::OkCancel, MsgResult::Cancel },
+             std::pair { MsgButtons::YesNo, MsgResult::No }, std::pair { MsgButtons::Ok, MsgResult::Ok } }) {
+        const QPointer<QWidget> window = new QWidget;
+        window->show();
+        QApplication::setActiveWindow(window);
+        ASSERT_TRUE(QTest::qWaitForWindowActive(window));
+        QTimer::singleShot(0, window, [&] { delete window.data(); });
+        EXPECT_EQ(messageBox(MsgIcon::Question, "Sair", "Sair sem guardar?", buttons), answer);
+        EXPECT_TRUE(window.isNull());
+    }
+    setMessageBoxPresenter(recorder);
 }
 
 TEST(OleColor, resolvesSystemColoursAndConvertsToQColor)
