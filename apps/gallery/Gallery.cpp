@@ -2,10 +2,12 @@
 
 #include "Sections.h"
 
+#include "common/modFuncs.h"
 #include "frame/ClassRegistry.h"
 #include "frame/FormFile.h"
 #include "frame/UserControl.h"
 
+#include <QFile>
 #include <QFileDialog>
 #include <QMenuBar>
 #include <QMessageBox>
@@ -13,20 +15,36 @@
 #include <QGroupBox>
 #include <QLabel>
 #include <QScrollArea>
+#include <QUrl>
 #include <QVBoxLayout>
 
 namespace {
 
-// Which public classes this build serves, so a visitor sees what the form can hold.
+// What each public class is, as its page in docs/ says in its title, linked to that page,
+// so a host developer trying the gallery knows where to read on.
 QWidget *classList()
 {
     QStringList lines;
+    const QString docs = zelctl::modFuncs::GetRootPath() + QStringLiteral("docs/");
     for (const zelctl::ClassInfo &info : zelctl::ClassRegistry::classes()) {
-        const bool available = zelctl::ClassRegistry::factoryFor(info.classId) != nullptr;
-        lines << QStringLiteral("%1 — %2").arg(QLatin1String(info.name), available ? "pronto" : "por construir");
+        const QString name = QLatin1String(info.name);
+        const QString kind = info.isControl ? QStringLiteral("controlo") : QStringLiteral("classe");
+        QFile page(docs + name + QStringLiteral(".md"));
+        if (!page.open(QIODevice::ReadOnly)) {
+            lines << QStringLiteral("<b>%1</b> (%2)").arg(name, kind);
+            continue;
+        }
+        // The title reads "# cNIF — tax number box".
+        const QString title = QString::fromUtf8(page.readLine()).trimmed();
+        const QString what = title.section(QStringLiteral(" — "), 1);
+        lines << QStringLiteral("<a href=\"%1\">%2</a> (%3) — %4")
+                     .arg(QUrl::fromLocalFile(page.fileName()).toString(), name, kind, what.toHtmlEscaped());
     }
-    auto *label = new QLabel(lines.join('\n'));
-    label->setTextInteractionFlags(Qt::TextSelectableByMouse);
+    auto *label = new QLabel(lines.join(QStringLiteral("<br>")));
+    label->setObjectName(QStringLiteral("classes"));
+    label->setTextFormat(Qt::RichText);
+    label->setOpenExternalLinks(true);
+    label->setTextInteractionFlags(Qt::TextBrowserInteraction);
     return label;
 }
 
@@ -54,7 +72,7 @@ Gallery::Gallery(QWidget *parent)
     addSection(QStringLiteral("Dicas e botões de informação"), createTipsSection());
     addSection(QStringLiteral("Controlos com skin"), createSkinsSection());
     addSection(QStringLiteral("GIF animado"), createGifSection());
-    // Last: which classes this build serves.
+    // Last: what each class is and where its page is.
     addSection(QStringLiteral("Classes da biblioteca"), classList());
 }
 

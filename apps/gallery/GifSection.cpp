@@ -19,6 +19,7 @@ QWidget *createGifSection()
     gif->setObjectName("AniGIF1");
     gif->InitNew();
     gif->setStretch(ucAniGIF::gfsActualSize);
+    gif->extender().setToolTipText("A aguardar");
     const QString file = zelctl::modFuncs::GetDataPath() + "gif/aguarde.gif";
     auto *state = new QLabel("Imagem 1");
     if (!gif->LoadAnimatedGIF_File(file))

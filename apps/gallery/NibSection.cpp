@@ -21,6 +21,9 @@ QWidget *createNibSection()
             state->setText(nib->Valid() ? "NIB válido" : "NIB com dígitos de controlo errados");
     });
     nib->setText("003506510000001234580");
+    auto *label = new QLabel("N&IB:");
+    label->setBuddy(nib);
+    layout->addWidget(label);
     layout->addWidget(nib);
     layout->addWidget(state);
     layout->addStretch();

@@ -37,7 +37,11 @@ QWidget *createNifSection()
     declaration->load(modFuncs::GetDataPath() + QStringLiteral("declaracao.json"));
 
     auto *row = new QHBoxLayout;
+    // A host names its controls with labels: a screen reader reads the label as the name.
+    auto *label = new QLabel(QStringLiteral("&NIF:"));
+    row->addWidget(label);
     auto *nif = new cNIF;
+    label->setBuddy(nif);
     nif->setObjectName(QStringLiteral("NIF1"));
     nif->InitNew();
     nif->setCountries(GSEL_OnlyEU);

@@ -6,6 +6,7 @@
 #include "gif/GifFrames.h"
 #include "gif/GifLimits.h"
 #include "gif/GifRemoteLoader.h"
+#include "platform/Accessibility.h"
 #include "platform/Twips.h"
 
 #include <QBuffer>
@@ -149,6 +150,8 @@ public:
     qint32 mousePointer = 0;
     bool inResize = false;
     bool pressed = false;
+    // What a screen reader hears: the frames loaded and whether they move.
+    platform::AccessibleEcho echo { q };
 };
 
 ucAniGIF::Private::Private(ucAniGIF *owner)
@@ -157,7 +160,10 @@ ucAniGIF::Private::Private(ucAniGIF *owner)
     deferred.setSingleShot(true);
     QObject::connect(&deferred, &QTimer::timeout, q, [this] { finishFrames(); });
     QObject::connect(&animator, &GifAnimator::advanced, q, [this] { redraw(); });
-    QObject::connect(&animator, &GifAnimator::loopsEnded, q, &ucAniGIF::LoopsEnded);
+    QObject::connect(&animator, &GifAnimator::loopsEnded, q, [this] {
+        echo.refresh();
+        Q_EMIT q->LoopsEnded();
+    });
     QObject::connect(&remote, &GifRemoteLoader::finished, q, [this](const QByteArray &bytes) { remoteArrived(bytes); });
     QObject::connect(&remote, &GifRemoteLoader::failed, q, &ucAniGIF::RemoteLoadFailure);
 }
@@ -177,6 +183,7 @@ bool ucAniGIF::Private::load(const QByteArray &bytes)
     if (bytes.isEmpty() || !frames.load(bytes) || !canvas.create(frames.canvasWidth(), frames.canvasHeight())) {
         release();
         q->update();
+        echo.refresh();
         return false;
     }
     frames.setMirror(mirror);
@@ -193,6 +200,7 @@ bool ucAniGIF::Private::load(const QByteArray &bytes)
             startPlaying();
     }
     redraw();
+    echo.refresh();
     return true;
 }
 
@@ -206,6 +214,7 @@ void ucAniGIF::Private::startPlaying()
 {
     if (loaded() && running() && delayMode != gfdDoNotAnimate)
         animator.start();
+    echo.refresh();
 }
 
 void ucAniGIF::Private::redraw()
@@ -535,6 +544,7 @@ void ucAniGIF::setAction(qint32 action)
     default:
         break;
     }
+    d->echo.refresh();
 }
 
 Picture ucAniGIF::AnimatedGIF() const

@@ -3,6 +3,8 @@
 #include "NibCheckDigits.h"
 #include "common/InnerCalls.h"
 #include "frame/PropertyReaders.h"
+#include "platform/Accessibility.h"
+#include "platform/KeyboardFocus.h"
 #include "platform/MessageBox.h"
 #include "platform/Twips.h"
 
@@ -10,6 +12,7 @@
 #include <QKeyEvent>
 #include <QLabel>
 #include <QLineEdit>
+#include <QPainter>
 #include <QPointer>
 
 #include <array>
@@ -26,13 +29,14 @@ struct BoxGeometry
     int width;
     int first; // offset of the box's first character in the number
     int maxLength;
+    const char16_t *part; // what a screen reader calls the box
 };
 
 constexpr std::array<BoxGeometry, 4> boxes = { {
-    { 0, 465, 0, 4 },
-    { 480, 465, 4, 4 },
-    { 960, 1125, 8, 11 },
-    { 2100, 285, 19, 2 },
+    { 0, 465, 0, 4, u"Banco" },
+    { 480, 465, 4, 4, u"Balcão" },
+    { 960, 1125, 8, 11, u"Conta" },
+    { 2100, 285, 19, 2, u"Dígitos de controlo" },
 } };
 constexpr int boxHeight = 315;
 constexpr QRect validMarkTwips(2430, 0, 240, 240);
@@ -46,21 +50,49 @@ QRect pixels(const QRect &twips)
         pixelsFromTwips(twips.height()) };
 }
 
-// The error mark explains itself when clicked.
+const QString ErrorTitle = QStringLiteral("NIB incorrecto");
+const QString ErrorText = QStringLiteral("O número de identificação bancário (NIB) não se encontra correcto.\n"
+                                         "Por favor verifique o NIB inserido");
+
+// The error mark explains itself when clicked, or pressed with Space or Enter once the
+// keyboard has reached it (it is a tab stop while shown).
 class ErrorMark : public QLabel
 {
 public:
-    using QLabel::QLabel;
+    explicit ErrorMark(QWidget *parent)
+        : QLabel(parent)
+    {
+        setFocusPolicy(Qt::TabFocus);
+        setAccessibleName(ErrorTitle);
+        setAccessibleDescription(ErrorText);
+    }
 
 protected:
     void mouseReleaseEvent(QMouseEvent *event) override
     {
-        if (event->button() == Qt::LeftButton && rect().contains(event->position().toPoint())) {
-            platform::messageBox(platform::MsgIcon::Information, QStringLiteral("NIB incorrecto"),
-                QStringLiteral("O número de identificação bancário (NIB) não se encontra correcto.\n"
-                               "Por favor verifique o NIB inserido"));
+        if (event->button() == Qt::LeftButton && rect().contains(event->position().toPoint()))
+            explain();
+    }
+
+    void keyPressEvent(QKeyEvent *event) override
+    {
+        if (platform::pressesButton(*event))
+            explain();
+        else
+            QLabel::keyPressEvent(event);
+    }
+
+    void paintEvent(QPaintEvent *event) override
+    {
+        QLabel::paintEvent(event);
+        if (platform::showsFocusMark(*this)) {
+            QPainter painter(this);
+            platform::paintFocusMark(painter, rect());
         }
     }
+
+private:
+    static void explain() { platform::messageBox(platform::MsgIcon::Information, ErrorTitle, ErrorText); }
 };
 
 } // namespace
@@ -83,6 +115,7 @@ public:
     QLabel *validpic;
     ErrorMark *Image1;
     InnerCalls innerCalls;
+    platform::AccessibleEcho echo;
     platform::OleColor backColor = platform::systemColor(platform::COLOR_BTNFACE);
 };
 
@@ -91,6 +124,7 @@ cNIB::Private::Private(cNIB *owner)
     , validpic(new QLabel(owner))
     , Image1(new ErrorMark(owner))
     , innerCalls(owner)
+    , echo(owner)
 {
     QFont font(QStringLiteral("Arial"));
     font.setPointSizeF(8.25);
@@ -101,6 +135,8 @@ cNIB::Private::Private(cNIB *owner)
         box->setProperty("Index", int(i));
         box->setMaxLength(boxes[i].maxLength);
         box->setFont(font);
+        box->setAccessibleName(QString::fromUtf16(boxes[i].part));
+        box->setAccessibleDescription(QStringLiteral("Parte %1 de 4 do NIB").arg(i + 1));
         box->setGeometry(pixels(QRect(boxes[i].left, 0, boxes[i].width, boxHeight)));
         box->installEventFilter(owner);
         // Changed is raised from inside the box's own editing; a host deleting the control
@@ -160,12 +196,14 @@ void cNIB::Private::changed(int index)
     const qsizetype length = text().size();
     if (length == 0) {
         Image1->hide();
+        echo.refresh();
         Q_EMIT q->Changed();
     } else if (length == fullLength) {
         refreshValidity();
         Q_EMIT q->Changed();
     } else {
         showMarks(false, false);
+        echo.refresh();
     }
 }
 
@@ -180,8 +218,9 @@ void cNIB::Private::refreshValidity()
         // Completing the number raises Changed, whose handler may delete the control.
         const QPointer<cNIB> alive(q);
         nib[3]->setText(CalculateNibCheckDigits(number));
-        if (alive)
-            validpic->setVisible(q->Valid());
+        if (!alive)
+            return;
+        validpic->setVisible(q->Valid());
         break;
     }
     case fullLength: {
@@ -193,6 +232,7 @@ void cNIB::Private::refreshValidity()
         showMarks(false, true);
         break;
     }
+    echo.refresh();
 }
 
 void cNIB::Private::eraseBack(int index)

@@ -9,6 +9,7 @@
 #include "companion/NIFGrabber.h"
 #include "frame/PropertyReaders.h"
 #include "frmEditNIF.h"
+#include "platform/Accessibility.h"
 #include "platform/ModalPresenter.h"
 #include "platform/Settings.h"
 #include "platform/WindowHandles.h"
@@ -129,6 +130,8 @@ public:
     void layout();
     void uncount();
     void openRecordForm();
+    // Tells assistive technology what changed: validity, value, holder, country.
+    void announce();
 
     cNIF *q;
     QLineEdit *nif;
@@ -140,6 +143,8 @@ public:
     clsBalloonTip *tip = nullptr;
     NifPopupMenu *popup = nullptr;
     InnerCalls innerCalls;
+    platform::AccessibleEcho echo;
+    platform::AccessibleEcho flagEcho;
 
     // The records the control keeps itself, by number (Value): every value let through
     // Information and what fetches answered. They hold the record where the host set no
@@ -171,6 +176,8 @@ cNIF::Private::Private(cNIF *owner)
     , Shape2(new ShapeWidget(owner))
     , grabber(companion::createNIFGrabber(owner))
     , innerCalls(owner)
+    , echo(owner)
+    , flagEcho(cPicture)
 {
     Shape2->setObjectName(QStringLiteral("Shape2"));
     Shape2->setBorderColor(FrameColour);
@@ -227,6 +234,14 @@ void cNIF::Private::openRecordForm()
     form->SetNIFControl(q);
     platform::showModal(*form);
     delete form.data();
+}
+
+void cNIF::Private::announce()
+{
+    echo.refresh();
+    // The box has the focus and speaks for the control.
+    echo.mirrorTo(*nif);
+    flagEcho.refresh();
 }
 
 void cNIF::Private::layout()
@@ -533,20 +548,35 @@ bool cNIF::eventFilter(QObject *watched, QEvent *event)
             PopupContextMenu();
         return true;
     case QEvent::FocusIn:
-        if (watched == d->nif)
+        if (watched == d->nif) {
             d->refreshTip();
-        if (!alive)
-            return true;
+            if (!alive)
+                return true;
+            d->announce();
+        }
         break;
     case QEvent::EnabledChange:
         // Also when a parent is enabled or disabled: the box looks as it acts.
-        if (watched == d->nif)
+        if (watched == d->nif) {
             d->applyColours();
+            d->announce();
+        }
         break;
-    case QEvent::KeyPress:
-        if (watched == d->nif && d->popup->handleShortcut(*static_cast<QKeyEvent *>(event)))
+    case QEvent::KeyPress: {
+        const auto *key = static_cast<QKeyEvent *>(event);
+        if (watched != d->nif)
+            break;
+        if (d->popup->handleShortcut(*key))
             return true;
+        // The keyboard's way to the flag, as to a combo box's list: Alt+Down or F4.
+        if ((key->key() == Qt::Key_F4 && key->modifiers() == Qt::NoModifier)
+            || (key->key() == Qt::Key_Down && key->modifiers() == Qt::AltModifier)) {
+            if (d->userMayEdit())
+                ShowCountryList();
+            return true;
+        }
         break;
+    }
     default:
         break;
     }
@@ -645,6 +675,7 @@ void cNIF::setCountryID(const QString &code)
     d->lastAppliedCountry = value;
     d->country = value.toUpper();
     d->cPicture->setPicture(mod_CTL::flagOn(*d->cPicture, d->country));
+    d->announce();
     PropertyChanged(QStringLiteral("CountryID"));
     // The Portuguese limit holds for what the box already has; the cut is a change of the text.
     if (d->country == Portugal && d->nif->text().size() > PortugalLength)
@@ -727,6 +758,8 @@ void cNIF::RefreshMe()
         }
     }
     d->refreshTip();
+    if (alive)
+        d->announce();
 }
 
 void cNIF::ShowCountryList()
@@ -855,6 +888,7 @@ void cNIF::setInformation(const QString &varID, const QString &value)
     }
     if (varID == QLatin1String("nome")) {
         d->name = value;
+        d->announce();
         Q_EMIT NameUpdated(value);
     }
 }
@@ -898,6 +932,7 @@ void cNIF::setNome(const QString &name)
     d->refreshTip();
     if (!alive)
         return;
+    d->announce();
     Q_EMIT NameUpdated(QString(d->name));
 }
 
@@ -947,6 +982,7 @@ void cNIF::setLocked(bool locked)
     if (locked) {
         d->lockTint = true;
         d->applyColours();
+        d->announce();
     } else {
         RefreshMe();
     }

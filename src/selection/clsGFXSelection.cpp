@@ -197,6 +197,7 @@ GFXResult clsGFXSelection::SelectFrom(const GFXSelection &s, const QList<GFXItem
         subtitle->setVisible(!s.Subtitle.isEmpty());
 
         bool focused = false;
+        CommandButton *firstChoice = nullptr;
         for (int index = 0; index < Items.size(); ++index) {
             const GFXItem &item = Items.at(index);
             CommandButton *button = index == 0 ? form.btnSelector()(0) : form.btnSelector().Load(index);
@@ -209,6 +210,8 @@ GFXResult clsGFXSelection::SelectFrom(const GFXSelection &s, const QList<GFXItem
                 session.pressed = index;
             button->setEnabled(!item.Disabled);
             button->setTag(QString::number(index));
+            // OK stays the dialog's default button while an item has the focus.
+            button->setAutoDefault(false);
             button->setPicture(itemPicture(item.Image.toString()));
             button->show();
             // OK stays the default button: the default item starts with the focus, so Enter
@@ -217,7 +220,14 @@ GFXResult clsGFXSelection::SelectFrom(const GFXSelection &s, const QList<GFXItem
                 button->setFocus(Qt::OtherFocusReason);
                 focused = true;
             }
+            if (!item.Disabled && !firstChoice)
+                firstChoice = button;
         }
+        // Without a default item the keyboard starts on the chosen item, else on the first; in
+        // a list long enough for a filter box, in the box.
+        CommandButton *start = session.pressed >= 0 ? form.btnSelector()(session.pressed) : firstChoice;
+        if (start && !focused && start->isEnabled() && Items.size() <= frmSelector::FilterThreshold)
+            start->setFocus(Qt::OtherFocusReason);
         form.btn_Handle()(0)->show();
         form.btn_Handle()(1)->setVisible(!s.DisableCancel);
         form.ReArrange();

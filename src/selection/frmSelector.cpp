@@ -5,6 +5,7 @@
 
 #include "companion/CommandButton.h"
 #include "companion/CommandButtonArray.h"
+#include "companion/KeyCodes.h"
 #include "platform/Twips.h"
 #include "platform/WindowHandles.h"
 
@@ -21,6 +22,9 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstdlib>
+#include <limits>
+#include <utility>
 
 namespace zelctl {
 
@@ -101,6 +105,47 @@ public:
                 shown.append(button);
         return shown;
     }
+
+    // Arrow keys move among the items: Left and Right in their order, Up and Down to the
+    // nearest item of the row above or below (from the first row, Up goes to the filter
+    // box). True when the key was an arrow; it is spent even at an edge, where it stays.
+    bool moveAmongItems(CommandButton *from, int keyCode) const
+    {
+        const QList<CommandButton *> items = shownItems();
+        const qsizetype at = items.indexOf(from);
+        if (at < 0)
+            return false;
+        const bool up = keyCode == keyCodes::fromQtKey(Qt::Key_Up);
+        const bool down = keyCode == keyCodes::fromQtKey(Qt::Key_Down);
+        QWidget *to = nullptr;
+        if (keyCode == keyCodes::fromQtKey(Qt::Key_Left)) {
+            to = at > 0 ? items.at(at - 1) : nullptr;
+        } else if (keyCode == keyCodes::fromQtKey(Qt::Key_Right)) {
+            to = at + 1 < items.size() ? items.at(at + 1) : nullptr;
+        } else if (up || down) {
+            int best = std::numeric_limits<int>::max();
+            for (CommandButton *item : items) {
+                const int rows = item->y() - from->y();
+                if (up ? rows >= 0 : rows <= 0)
+                    continue;
+                // A row nearer always wins; within a row, the item nearest the column.
+                const int distance = std::abs(rows) * 4096 + std::abs(item->x() - from->x());
+                if (distance < best) {
+                    best = distance;
+                    to = item;
+                }
+            }
+            if (!to && up && !txtFilter->isHidden())
+                to = txtFilter;
+        } else {
+            return false;
+        }
+        if (to) {
+            to->setFocus(Qt::TabFocusReason);
+            grid->ensureWidgetVisible(to);
+        }
+        return true;
+    }
 };
 
 frmSelector::frmSelector(QWidget *parent)
@@ -118,6 +163,7 @@ frmSelector::frmSelector(QWidget *parent)
     d->txtFilter = new QLineEdit(this);
     d->txtFilter->setObjectName(QStringLiteral("txtFilter"));
     d->txtFilter->setPlaceholderText(QStringLiteral("Escreva para procurar"));
+    d->txtFilter->setAccessibleName(QStringLiteral("Procurar"));
     d->txtFilter->setClearButtonEnabled(true);
     d->txtFilter->hide();
     d->txtFilter->installEventFilter(this);
@@ -128,6 +174,8 @@ frmSelector::frmSelector(QWidget *parent)
     d->grid->setObjectName(QStringLiteral("grid"));
     d->grid->setFrameShape(QFrame::NoFrame);
     d->grid->setHorizontalScrollBarPolicy(Qt::ScrollBarAlwaysOff);
+    // The items take the focus, and the pane scrolls to show the one that has it.
+    d->grid->setFocusPolicy(Qt::NoFocus);
     d->grid->viewport()->setAutoFillBackground(false);
     auto *pane = new QWidget;
     pane->setObjectName(QStringLiteral("gridPane"));
@@ -151,7 +199,7 @@ frmSelector::frmSelector(QWidget *parent)
         const QPointer<frmSelector> alive(this);
         send((*d->btnSelector)(index), QStringLiteral("KeyDown"), QStringLiteral("%1,%2").arg(keyCode).arg(shift));
         // A key that closed the dialog has done its work; the button must not act on it too.
-        if (!alive || !isVisible())
+        if (!alive || !isVisible() || d->moveAmongItems((*d->btnSelector)(index), keyCode))
             keyCode = 0;
     });
 
@@ -241,6 +289,12 @@ void frmSelector::ReArrange()
     ok->Move(layout.ok.left(), layout.ok.top());
     cancel->Move(layout.cancel.left(), layout.cancel.top());
     d->grid->setGeometry(pixelsOf(layout.grid));
+    // Tab goes from the filter box through the items to OK and Cancel, as they read.
+    QWidget *previous = d->txtFilter;
+    for (CommandButton *item : items)
+        setTabOrder(std::exchange(previous, item), item);
+    setTabOrder(previous, ok);
+    setTabOrder(ok, cancel);
     d->grid->setVerticalScrollBarPolicy(layout.scrolls ? Qt::ScrollBarAlwaysOn : Qt::ScrollBarAlwaysOff);
     if (!layout.itemsPlaced)
         return;

@@ -3,7 +3,9 @@
 #include "skinCommon.h"
 
 #include "companion/CommandButton.h"
+#include "platform/Accessibility.h"
 
+#include <QApplication>
 #include <QResizeEvent>
 
 namespace zelctl {
@@ -34,15 +36,22 @@ constexpr ButtonLook RestingLook { CommandButton::FlatStyle, 0, 0x404040 };
 class cSliderPrivate
 {
 public:
+    explicit cSliderPrivate(cSlider *q)
+        : echo(q)
+        , cc(new CommandButton(q))
+        , toggleEcho(cc)
+    { }
+
     bool open = false;
-    CommandButton *cc = nullptr;
+    platform::AccessibleEcho echo;
+    CommandButton *cc;
+    platform::AccessibleEcho toggleEcho;
 };
 
 cSlider::cSlider(QWidget *parent)
     : UserControl(parent)
-    , d(std::make_unique<cSliderPrivate>())
+    , d(std::make_unique<cSliderPrivate>(this))
 {
-    d->cc = new CommandButton(this);
     d->cc->setObjectName(QStringLiteral("cc"));
     d->cc->setFont(QFont(QStringLiteral("Wingdings"), 10));
     d->cc->setWidth(ButtonWidth);
@@ -53,13 +62,22 @@ cSlider::cSlider(QWidget *parent)
     // Tab reaches the button and the host's controls inside, never the bare container.
     setFocusPolicy(Qt::TabFocus);
     setFocusProxy(d->cc);
+    // The keyboard reaching a control hidden in the closed slider opens it, so the focus shows.
+    connect(qApp, &QApplication::focusChanged, this, [this](QWidget *, QWidget *now) {
+        if (!d->open && now && now != d->cc && isAncestorOf(now))
+            setSlideOpen(true);
+    });
 
     // Every slider starts closed; its Slided waits for the event loop, when a host can hear it.
     close();
     QMetaObject::invokeMethod(this, &cSlider::Slided, Qt::QueuedConnection);
 }
 
-cSlider::~cSlider() = default;
+cSlider::~cSlider()
+{
+    // A control inside gives up the focus while QWidget's destructor deletes it, after d is gone.
+    disconnect(qApp, &QApplication::focusChanged, this, nullptr);
+}
 
 bool cSlider::SlideOpen() const
 {
@@ -75,6 +93,8 @@ void cSlider::setSlideOpen(bool open)
         this->open();
     else
         close();
+    d->echo.refresh();
+    d->toggleEcho.refresh();
     Q_EMIT Slided();
 }
 

@@ -19,7 +19,8 @@ class cSliderPrivate;
 // and raised with a frame and a blue arrow while the pointer is on it. Every change of
 // SlideOpen raises Slided. A new slider is closed; the Slided of that first closing arrives
 // once the event loop runs, so a host that connects right after creating the slider hears
-// it. Lengths are twips.
+// it. The keyboard reaching one of the host's controls while the slider is closed opens it.
+// Lengths are twips.
 class ZELCTL_EXPORT cSlider : public UserControl
 {
     Q_OBJECT

@@ -2,10 +2,13 @@
 
 #include "skinCommon.h"
 
+#include "platform/Accessibility.h"
+#include "platform/KeyboardFocus.h"
 #include "platform/Pointer.h"
 #include "tips/clsBalloonTip.h"
 
 #include <QMouseEvent>
+#include <QPainter>
 
 #include <array>
 #include <optional>
@@ -26,6 +29,10 @@ constexpr platform::OleColor DisabledGrey = 0x787878;
 class skGoButtonPrivate
 {
 public:
+    explicit skGoButtonPrivate(skGoButton *q)
+        : echo(q)
+    { }
+
     bool hovering = false;
     bool clicking = false;
     std::array<QString, SlotCount> paths;
@@ -34,13 +41,15 @@ public:
     bool active = false;
     std::unique_ptr<clsBalloonTip> tip;
     std::optional<skinCommon::HoverTracker> hover;
+    platform::AccessibleEcho echo;
 };
 
 skGoButton::skGoButton(QWidget *parent)
     : SurfaceHost(parent)
-    , d(std::make_unique<skGoButtonPrivate>())
+    , d(std::make_unique<skGoButtonPrivate>(this))
 {
     setMouseTracking(true);
+    setFocusPolicy(Qt::TabFocus);
     d->hover.emplace(this, d->hovering,
         skinCommon::HoverTracker::Handlers {
             [this] { Q_EMIT MouseIn(); }, [this] { Q_EMIT MouseOut(); }, [this] { Repaint(); } });
@@ -120,6 +129,7 @@ void skGoButton::setTooltip(const QString &text)
         tip->Create();
         d->tip = std::move(tip);
     }
+    d->echo.refresh();
     PropertyChanged(QStringLiteral("Tooltip"));
 }
 
@@ -166,6 +176,7 @@ void skGoButton::Repaint()
             gdi::drawPicture(dc, d->pictures[NormalSlot], 0, 0, side, side, gdi::SRCAND);
     }
     update();
+    d->echo.refresh();
 }
 
 void skGoButton::ReadProperties(const PropertyBag &bag)
@@ -258,6 +269,23 @@ void skGoButton::mouseReleaseEvent(QMouseEvent *event)
         click();
     else if (!d->hovering && platform::capturedWidget() == this)
         platform::releaseCapture();
+}
+
+void skGoButton::keyPressEvent(QKeyEvent *event)
+{
+    if (platform::pressesButton(*event))
+        click();
+    else
+        SurfaceHost::keyPressEvent(event);
+}
+
+void skGoButton::paintEvent(QPaintEvent *event)
+{
+    SurfaceHost::paintEvent(event);
+    if (platform::showsFocusMark(*this)) {
+        QPainter painter(this);
+        platform::paintFocusMark(painter, rect().adjusted(2, 2, -2, -2), true);
+    }
 }
 
 void skGoButton::loadDesignPreview()

@@ -15,7 +15,7 @@ class skGoButtonPrivate;
 // slot 1 while the pointer is over it and slot 2 while the left button is held on it,
 // greys the normal picture when disabled, and lets black pixels show the container
 // through. It tracks the pointer itself to raise MouseIn and MouseOut, and can carry a
-// balloon tip.
+// balloon tip. The keyboard reaches it with Tab; Space or Enter click it.
 //
 // Persisted as "SkinID" and "Tooltip".
 class ZELCTL_EXPORT skGoButton : public gdi::SurfaceHost<UserControl>
@@ -91,6 +91,8 @@ protected:
     void mousePressEvent(QMouseEvent *event) override;
     void mouseReleaseEvent(QMouseEvent *event) override;
     void mouseDoubleClickEvent(QMouseEvent *event) override;
+    void keyPressEvent(QKeyEvent *event) override;
+    void paintEvent(QPaintEvent *event) override;
 
 private:
     void loadDesignPreview();

@@ -3,8 +3,11 @@
 #include "skinCommon.h"
 
 #include "frame/PropertyReaders.h"
+#include "platform/Accessibility.h"
+#include "platform/KeyboardFocus.h"
 
 #include <QMouseEvent>
+#include <QPainter>
 
 #include <cmath>
 #include <optional>
@@ -37,6 +40,10 @@ void dot(gdi::HDC dc, int x, int y, int diameter, platform::OleColor color, int 
 class skNumberPrivate
 {
 public:
+    explicit skNumberPrivate(skNumber *q)
+        : echo(q)
+    { }
+
     platform::OleColor backColor = DefaultBackColor;
     platform::OleColor background = DefaultBackground;
     platform::OleColor foreground = DefaultForeground;
@@ -47,13 +54,15 @@ public:
     QString caption;
     QString skinId;
     std::optional<skinCommon::HoverTracker> hover;
+    platform::AccessibleEcho echo;
 };
 
 skNumber::skNumber(QWidget *parent)
     : SurfaceHost(parent)
-    , d(std::make_unique<skNumberPrivate>())
+    , d(std::make_unique<skNumberPrivate>(this))
 {
     setMouseTracking(true);
+    setFocusPolicy(Qt::TabFocus);
     // The pointer resting on the badge is what makes it active; leaving gives the capture
     // back even with a button held.
     d->hover.emplace(this, d->active,
@@ -243,6 +252,7 @@ void skNumber::redraw()
         gdi::TextOut(dc, int(std::floor((w - extent.cx) / 2.0)), int(std::floor((h - extent.cy) / 2.0)), d->caption);
     }
     update();
+    d->echo.refresh();
 }
 
 void skNumber::resizeEvent(QResizeEvent *event)
@@ -281,6 +291,23 @@ void skNumber::mouseDoubleClickEvent(QMouseEvent *event)
 {
     if (event->button() == Qt::LeftButton)
         Q_EMIT DoubleClicked();
+}
+
+void skNumber::keyPressEvent(QKeyEvent *event)
+{
+    if (platform::pressesButton(*event))
+        Q_EMIT Clicked();
+    else
+        SurfaceHost::keyPressEvent(event);
+}
+
+void skNumber::paintEvent(QPaintEvent *event)
+{
+    SurfaceHost::paintEvent(event);
+    if (platform::showsFocusMark(*this)) {
+        QPainter painter(this);
+        platform::paintFocusMark(painter, rect().adjusted(1, 1, -1, -1), true);
+    }
 }
 
 ZELCTL_REGISTER_CLASS(skNumber)

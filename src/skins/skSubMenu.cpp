@@ -3,10 +3,13 @@
 #include "skinCommon.h"
 
 #include "frame/PropertyReaders.h"
+#include "platform/Accessibility.h"
+#include "platform/KeyboardFocus.h"
 #include "platform/Pointer.h"
 #include "platform/Twips.h"
 
 #include <QMouseEvent>
+#include <QPainter>
 
 #include <cmath>
 #include <optional>
@@ -32,6 +35,10 @@ constexpr platform::OleColor SliceBackground = 0xFFFFFF;
 class skSubMenuPrivate
 {
 public:
+    explicit skSubMenuPrivate(skSubMenu *q)
+        : echo(q)
+    { }
+
     platform::OleColor foreColor = DefaultForeColor;
     platform::OleColor backColor = DefaultBackColor;
     platform::OleColor hoverForeColor = DefaultHoverForeColor;
@@ -45,13 +52,15 @@ public:
     bool hovering = false;
     skinCommon::ImageFileSlots slices;
     std::optional<skinCommon::HoverTracker> hover;
+    platform::AccessibleEcho echo;
 };
 
 skSubMenu::skSubMenu(QWidget *parent)
     : SurfaceHost(parent)
-    , d(std::make_unique<skSubMenuPrivate>())
+    , d(std::make_unique<skSubMenuPrivate>(this))
 {
     setMouseTracking(true);
+    setFocusPolicy(Qt::TabFocus);
     d->hover.emplace(this, d->hovering,
         skinCommon::HoverTracker::Handlers {
             [this] { Q_EMIT MouseIn(); }, [this] { Q_EMIT MouseOut(); }, [this] { Redraw(); } });
@@ -203,6 +212,7 @@ void skSubMenu::Redraw()
     gdi::SetTextColor(dc, text);
     gdi::TextOut(dc, textX, (height() - textHeight) / 2, d->caption);
     update();
+    d->echo.refresh();
 }
 
 int skSubMenu::drawArrowBox()
@@ -362,6 +372,23 @@ void skSubMenu::mouseReleaseEvent(QMouseEvent *event)
         click();
     else if (platform::capturedWidget() == this && event->buttons() == Qt::NoButton)
         platform::releaseCapture();
+}
+
+void skSubMenu::keyPressEvent(QKeyEvent *event)
+{
+    if (platform::pressesButton(*event))
+        click();
+    else
+        SurfaceHost::keyPressEvent(event);
+}
+
+void skSubMenu::paintEvent(QPaintEvent *event)
+{
+    SurfaceHost::paintEvent(event);
+    if (platform::showsFocusMark(*this)) {
+        QPainter painter(this);
+        platform::paintFocusMark(painter, rect().adjusted(0, 0, -height() / 2, 0));
+    }
 }
 
 void skSubMenu::clearHover()

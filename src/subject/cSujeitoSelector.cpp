@@ -5,6 +5,7 @@
 #include "companion/CommandButton.h"
 #include "companion/CommandButtonArray.h"
 #include "companion/Declaration.h"
+#include "platform/Accessibility.h"
 #include "platform/Twips.h"
 
 #include <QAction>
@@ -55,6 +56,17 @@ constexpr std::array<KindTexts, kindCount> texts = { {
     { u"Herança", u"Herança" },
 } };
 
+// What a screen reader calls each kind's button, where no holder's name is known.
+constexpr std::array<const char16_t *, kindCount> spokenKinds = {
+    u"Sujeito passivo A",
+    u"Sujeito passivo B",
+    u"Dependente",
+    u"Ascendente",
+    u"Falecido",
+    u"Agregado",
+    u"Herança",
+};
+
 // Kinds with several subjects, chosen from a list.
 bool isListed(QChar kind)
 {
@@ -102,6 +114,7 @@ public:
     void selectKind(const QString &value);
     void setIndex(qint16 value);
     void refresh();
+    void nameButton(int i, int pressed);
     void click(int i);
     void chooseFromList(int i);
     QAction *listItem(int k);
@@ -223,6 +236,7 @@ void cSujeitoSelector::Private::refresh()
         b->setEnabled(true);
         b->Move(left, 0, width, b->Height());
         b->setCaption(i == pressed ? title : QString());
+        nameButton(i, pressed);
         b->show();
         left += width;
         if (!focusTarget || i == pressed)
@@ -241,6 +255,28 @@ void cSujeitoSelector::Private::refresh()
         Line1->hide();
     }
     q->updateGeometry();
+}
+
+void cSujeitoSelector::Private::nameButton(int i, int pressed)
+{
+    // The holder's name, as the pressed button shows it, says most; the kind, then, is the
+    // description. A button of a listed kind names its subject only once one is chosen.
+    const QChar kind = kinds[i];
+    QString spoken = QString::fromUtf16(spokenKinds[size_t(i)]);
+    QString holder;
+    if (i == pressed) {
+        if (index > 0)
+            spoken += QLatin1Char(' ') + QString::number(index);
+        holder = modFuncs::FormatShortName(subjectName(subjectId(kind, index)));
+    } else if (!isListed(kind) && i != buttonC) {
+        holder = modFuncs::FormatShortName(subjectName(QString(kind)));
+    }
+    // "Agregado" says whom it holds: "Sujeitos A e B".
+    const QString whom = i == buttonC ? QString::fromUtf16(texts[size_t(i)].toolTip) : QString();
+    if (holder.isEmpty())
+        platform::setAccessibleTexts(*button(i), spoken, whom);
+    else
+        platform::setAccessibleTexts(*button(i), holder, spoken);
 }
 
 void cSujeitoSelector::Private::click(int i)

@@ -1,9 +1,12 @@
 #include "InfoButton.h"
 
 #include "common/modFuncs.h"
+#include "platform/Accessibility.h"
+#include "platform/KeyboardFocus.h"
 #include "platform/Shell.h"
 
 #include <QFileInfo>
+#include <QKeyEvent>
 #include <QMouseEvent>
 #include <QPainter>
 
@@ -65,6 +68,10 @@ QString shellTarget(const QString &action)
 class InfoButtonPrivate
 {
 public:
+    explicit InfoButtonPrivate(InfoButton *q)
+        : echo(q)
+    { }
+
     QString toolTipTitle;
     InfoButton::TT_STYLE_ENUM toolTipStyle = InfoButton::TTS_DEFAULT;
     QString action;
@@ -77,15 +84,18 @@ public:
     bool pressed = false;
     QPixmap icon;
     std::unique_ptr<clsBalloonTip> tip = std::make_unique<clsBalloonTip>();
+    platform::AccessibleEcho echo;
 };
 
 InfoButton::InfoButton(QWidget *parent)
     : UserControl(parent)
-    , d(std::make_unique<InfoButtonPrivate>())
+    , d(std::make_unique<InfoButtonPrivate>(this))
 {
     d->target = hWnd();
     setFixedSize(SizePixels, SizePixels);
     setMouseTracking(true);
+    // Reached with Tab, pressed with Space or Enter; a click leaves the focus where it was.
+    setFocusPolicy(Qt::TabFocus);
     paintIcon();
 }
 
@@ -134,6 +144,7 @@ void InfoButton::setToolTipTitle(const QString &title)
         return;
     d->toolTipTitle = title;
     d->tipDirty = true;
+    d->echo.refresh();
     PropertyChanged(QStringLiteral("ibutton.title"));
 }
 
@@ -163,6 +174,7 @@ void InfoButton::setStyle(IB_STYLE_ENUM style)
     const bool changed = style != d->style;
     d->style = style;
     setEnabled(Enabled());
+    d->echo.refresh();
     if (changed)
         PropertyChanged(QStringLiteral("ibutton.bstyle"));
 }
@@ -187,6 +199,7 @@ void InfoButton::setTipText(const QString &text)
     if (text == d->tipText)
         return;
     d->tipText = text;
+    d->echo.refresh();
     PropertyChanged(QStringLiteral("ibutton.tiptext"));
 }
 
@@ -263,6 +276,8 @@ void InfoButton::paintEvent(QPaintEvent *)
     if (!d->transparent)
         painter.fillRect(rect(), platform::toQColor(ambient().BackColor));
     painter.drawPixmap(rect(), d->icon);
+    if (platform::showsFocusMark(*this))
+        platform::paintFocusMark(painter, rect());
 }
 
 void InfoButton::changeEvent(QEvent *event)
@@ -274,6 +289,23 @@ void InfoButton::changeEvent(QEvent *event)
 }
 
 void InfoButton::mouseMoveEvent(QMouseEvent *event)
+{
+    syncTip();
+    UserControl::mouseMoveEvent(event);
+}
+
+void InfoButton::keyPressEvent(QKeyEvent *event)
+{
+    if (platform::pressesButton(*event)) {
+        // The keyboard never moved the pointer over the button: the tip is brought up to date here.
+        syncTip();
+        click();
+        return;
+    }
+    UserControl::keyPressEvent(event);
+}
+
+void InfoButton::syncTip()
 {
     // A plain tooltip given by the container becomes the balloon's text, so only one shows.
     if (d->tipText.isEmpty() && !extender().ToolTipText().isEmpty()) {
@@ -287,7 +319,6 @@ void InfoButton::mouseMoveEvent(QMouseEvent *event)
         else
             buildTip();
     }
-    UserControl::mouseMoveEvent(event);
 }
 
 void InfoButton::mousePressEvent(QMouseEvent *event)

@@ -14,7 +14,8 @@ class InfoButtonPrivate;
 // A 16 x 16 button showing the information, warning or error icon (greyed when disabled)
 // with a balloon tip of a title and a text. The tip is built on the first pointer move
 // after its text, title or style changed. A click pops the tip up, raises Click, or opens
-// the document, program or address given in Action.
+// the document, program or address given in Action. The keyboard reaches the button with
+// Tab; Space or Enter press it.
 //
 // Persisted as "ibutton.action", "ibutton.bstyle", "ibutton.style", "ibutton.title",
 // "ibutton.enabled", "ibutton.tiptext" (falling back to "ToolTipText") and
@@ -107,9 +108,12 @@ protected:
     void mousePressEvent(QMouseEvent *event) override;
     void mouseReleaseEvent(QMouseEvent *event) override;
     void mouseDoubleClickEvent(QMouseEvent *event) override;
+    void keyPressEvent(QKeyEvent *event) override;
 
 private:
     void paintIcon();
+    // Builds the tip again if its text, title or style changed since, or removes it.
+    void syncTip();
     void buildTip();
     void removeTip();
     void click();

@@ -1,5 +1,6 @@
 #include "TooltipWindow.h"
 
+#include "platform/Accessibility.h"
 #include "platform/OleColor.h"
 #include "platform/Pointer.h"
 
@@ -272,6 +273,9 @@ void TooltipWindow::popUp()
     m_initialTimer.stop();
     place();
     show();
+    // Qt announces no tooltip window as it shows; a screen reader reads this one's title and
+    // text from its interface.
+    platform::raiseAccessibleEvent(this, QAccessible::ObjectShow);
     m_autoPopTimer.start();
 }
 

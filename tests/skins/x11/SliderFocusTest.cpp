@@ -39,3 +39,23 @@ TEST(SliderFocus, focusGivenToTheSliderLandsOnItsButton)
     slider->setFocus();
     EXPECT_EQ(QApplication::focusWidget(), button);
 }
+
+// A host may delete the slider while one of the controls it placed inside has the focus.
+TEST(SliderFocus, deletedWhileAControlInsideHasTheFocus)
+{
+    QWidget form;
+    auto *first = new QLineEdit(&form);
+    auto *slider = new cSlider(&form);
+    slider->move(0, 40);
+    auto *inside = new QLineEdit(slider);
+    form.resize(300, 200);
+    form.show();
+    form.activateWindow();
+    ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
+    inside->setFocus();
+    ASSERT_TRUE(inside->hasFocus());
+    EXPECT_TRUE(slider->SlideOpen()) << "the focus inside opens the slider";
+    delete slider;
+    QTest::keyClicks(first, "ok");
+    EXPECT_EQ(first->text(), "ok") << "the form lives on";
+}
