@@ -57,16 +57,6 @@ TEST_F(GoButton, disabledShowsTheNormalPictureAndedOnGreyWhateverItsState)
     // Transparent pixels leave the grey as it is.
     EXPECT_EQ(pixel(*button, 1, 1), 0x787878u);
     EXPECT_FALSE(button->mask().contains(QPoint(1, 1))) << "the mask is the one of the enabled look";
-
-    // A disabled container greys it too, leaving the button's own state alone.
-    button->setEnabled(true);
-    button->setActive(false);
-    button->setHovering(false);
-    form.setEnabled(false);
-    EXPECT_EQ(centre(), platform::rgb(72, 96, 48));
-    EXPECT_TRUE(button->Enabled());
-    form.setEnabled(true);
-    EXPECT_EQ(centre(), Normal);
 }
 
 TEST_F(GoButton, keepsItselfSquare)
