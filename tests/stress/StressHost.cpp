@@ -119,6 +119,12 @@ void Journal::end()
 
 void Journal::add(const QString &step)
 {
+    // A step that took long is named, so a long run shows where its time went.
+    const qint64 took = nowMs() - lastTick;
+    if (lastTick != 0 && took > 2000 && !m_steps.empty())
+        std::fprintf(stderr, "[ slow     ] %s seed %llu: %lld ms in step %zu, %s\n", qPrintable(m_class),
+            static_cast<unsigned long long>(m_seed), static_cast<long long>(took), m_steps.size(),
+            m_steps.back().c_str());
     {
         const std::lock_guard lock(journalMutex);
         m_steps.push_back(step.toStdString());
@@ -622,6 +628,10 @@ private:
 
 void Episode::place()
 {
+    // The pointer and the clipboard are the machine's: each episode starts them afresh, so
+    // that it follows from its seed alone.
+    QCursor::setPos(0, 0);
+    QGuiApplication::clipboard()->clear();
     m_form = new QWidget;
     m_form->setObjectName(QStringLiteral("form"));
     m_form->setWindowTitle(QStringLiteral("stress ") + m_className);

@@ -12,7 +12,15 @@ Coverage::Coverage(const QRect &bounds)
 void Coverage::mark(int x, int y)
 {
     if (m_bounds.contains(x, y))
-        m_points.emplace_back(y, x);
+        keep(y, x);
+}
+
+void Coverage::keep(int y, int x)
+{
+    const std::pair point(y, x);
+    if (!m_points.empty() && !(m_points.back() < point))
+        m_ordered = false;
+    m_points.push_back(point);
 }
 
 void Coverage::addPoint(int x, int y)
@@ -39,13 +47,32 @@ void Coverage::addDot(int x, int y, int diameter)
         for (int px = left; px <= right; ++px) {
             const qint64 dx = 2 * qint64(px) + 1 - cx;
             if (dx * dx + dy * dy <= limit)
-                m_points.emplace_back(py, px);
+                keep(py, px);
         }
     }
 }
 
 void Coverage::addLine(int x0, int y0, int x1, int y1, int width)
 {
+    // Only the part within a dot's reach of the bounds can mark anything: a line wholly
+    // beyond them costs nothing, and a straight one is walked only where it is inside.
+    const int reach = std::max(width, 1) / 2 + 1;
+    const QRect near = m_bounds.adjusted(-reach, -reach, reach, reach);
+    if (std::max(x0, x1) < near.left() || std::min(x0, x1) > near.right() || std::max(y0, y1) < near.top()
+        || std::min(y0, y1) > near.bottom())
+        return;
+    if (x0 == x1 || y0 == y1) {
+        const bool across = y0 == y1;
+        const int from = across ? x0 : y0, to = across ? x1 : y1;
+        const int low = across ? near.left() : near.top(), high = across ? near.right() : near.bottom();
+        const int step = from < to ? 1 : -1;
+        // The end point is left out, as below.
+        const int first = step > 0 ? std::max(from, low) : std::min(from, high);
+        const int last = step > 0 ? std::min(to - 1, high) : std::max(to + 1, low);
+        for (int v = first; step > 0 ? v <= last : v >= last; v += step)
+            addDot(across ? v : x0, across ? y0 : v, width);
+        return;
+    }
     // Bresenham; the end point is left out so that joined lines meet without overlap.
     const int dx = std::abs(x1 - x0), dy = -std::abs(y1 - y0);
     const int sx = x0 < x1 ? 1 : -1, sy = y0 < y1 ? 1 : -1;
@@ -67,9 +94,14 @@ void Coverage::addLine(int x0, int y0, int x1, int y1, int width)
 
 void Coverage::apply(const Surface &surface, quint32 value, PenMode mode) const
 {
-    std::vector<std::pair<int, int>> points = m_points;
-    std::sort(points.begin(), points.end());
-    points.erase(std::unique(points.begin(), points.end()), points.end());
+    // Each pixel once, so XOR marks it once; a single dot or straight line comes in order.
+    std::vector<std::pair<int, int>> sorted;
+    if (!m_ordered) {
+        sorted = m_points;
+        std::sort(sorted.begin(), sorted.end());
+        sorted.erase(std::unique(sorted.begin(), sorted.end()), sorted.end());
+    }
+    const std::vector<std::pair<int, int>> &points = m_ordered ? m_points : sorted;
     // XOR leaves the alpha of a 32-bit pixel as it was.
     const quint32 xorMask = surface.bpp == 32 ? value & 0xFFFFFFu : value;
     for (const auto &[y, x] : points) {

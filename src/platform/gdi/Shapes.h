@@ -31,9 +31,12 @@ public:
 
 private:
     void mark(int x, int y);
+    void keep(int y, int x);
 
     QRect m_bounds;
     std::vector<std::pair<int, int>> m_points; // (y, x)
+    // Whether m_points is in strictly increasing order, so without repeats.
+    bool m_ordered = true;
 };
 
 } // namespace zelctl::gdi::detail
