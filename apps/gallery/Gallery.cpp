@@ -91,19 +91,14 @@ QList<zelctl::UserControl *> Gallery::controls() const
 
 bool Gallery::saveForm(const QString &path, QString *error) const
 {
-    if (zelctl::FormFile::save(path, controls()))
-        return true;
-    *error = QStringLiteral("Não foi possível gravar o formulário em %1.").arg(path);
-    return false;
+    return zelctl::FormFile::save(path, controls(), error);
 }
 
 bool Gallery::openForm(const QString &path, QString *error)
 {
     QJsonObject form;
-    if (!zelctl::FormFile::load(path, &form)) {
-        *error = QStringLiteral("%1 não é um formulário que se possa ler.").arg(path);
+    if (!zelctl::FormFile::load(path, &form, error))
         return false;
-    }
     zelctl::FormFile::apply(form, controls());
     return true;
 }

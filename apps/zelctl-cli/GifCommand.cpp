@@ -1,27 +1,29 @@
 #include "Command.h"
+#include "InputFile.h"
 
-#include "gif/GifFrameDecoder.h"
+#include "gif/GifFrames.h"
 #include "gif/GifLimits.h"
-#include "gif/GifScanner.h"
-
-#include <QFile>
 
 namespace {
 
-quint32 fnv1a(QByteArrayView bytes)
+struct Fnv1a
 {
-    quint32 hash = 2166136261u;
-    for (char byte : bytes) {
-        hash ^= quint8(byte);
-        hash *= 16777619u;
+    quint32 value = 2166136261u;
+
+    void add(QByteArrayView bytes)
+    {
+        for (char byte : bytes) {
+            value ^= quint8(byte);
+            value *= 16777619u;
+        }
     }
-    return hash;
-}
+};
 
 } // namespace
 
 // zelctl gif-info [--hash] FILE: the loop count and each frame as the animated GIF control
-// reads it; with --hash, the FNV-1a hash of each frame's palette indices.
+// loads it, within the same limits; with --hash, the FNV-1a hash of each frame's palette
+// indices.
 int runGifInfo(const QStringList &args, QTextStream &out, QTextStream &err)
 {
     QStringList rest = args;
@@ -30,38 +32,34 @@ int runGifInfo(const QStringList &args, QTextStream &out, QTextStream &err)
         err << "usage: zelctl gif-info [--hash] FILE\n";
         return 2;
     }
-    QFile file(rest.first());
-    if (!file.open(QIODevice::ReadOnly)) {
-        err << "zelctl gif-info: cannot read " << rest.first() << ": " << file.errorString() << '\n';
+    const std::optional<QByteArray> bytes
+        = readInputFile(rest.first(), zelctl::gifLimits::MaxFileBytes, "gif-info", err);
+    if (!bytes)
         return 1;
-    }
-    if (file.size() > zelctl::gifLimits::MaxFileBytes) {
-        err << "zelctl gif-info: " << rest.first() << " is larger than " << zelctl::gifLimits::MaxFileBytes
-            << " bytes\n";
-        return 1;
-    }
-    const QByteArray bytes = file.readAll();
-    const zelctl::gifScanner::GifLayout layout = zelctl::gifScanner::scan(bytes);
-    if (layout.Frames.isEmpty()) {
+    zelctl::GifFrames frames;
+    if (!frames.load(*bytes)) {
         err << "zelctl gif-info: " << rest.first() << " holds no GIF frame that can be shown\n";
         return 1;
     }
 
-    out << "loops: " << layout.LoopCount << '\n';
-    out << "frames: " << layout.Frames.size() << '\n';
-    for (qsizetype i = 0; i < layout.Frames.size(); ++i) {
-        const zelctl::gifScanner::FrameRecord &frame = layout.Frames[i];
-        const int localSize = frame.ColorTable > 0 ? layout.ColorTables[frame.ColorTable].count : 0;
-        out << "frame " << i + 1 << ": left " << frame.Left << " top " << frame.Top << " width " << frame.Width
+    out << "loops: " << frames.loopCount() << '\n';
+    out << "frames: " << frames.count() << '\n';
+    for (int i = 1; i <= frames.count(); ++i) {
+        const zelctl::gifScanner::FrameRecord &frame = frames.frame(i);
+        const int localSize = frame.ColorTable > 0 ? frames.table(frame.ColorTable).count : 0;
+        out << "frame " << i << ": left " << frame.Left << " top " << frame.Top << " width " << frame.Width
             << " height " << frame.Height << " delay " << frame.Delay << " disposal " << int(frame.Disposal)
             << " transparent " << (frame.HasTransparency ? int(frame.TransparentIndex) : -1) << " local-table "
             << localSize;
         if (withHash) {
-            QByteArray indices(qsizetype(frame.Width) * frame.Height, '\0');
-            if (!zelctl::gifFrameDecoder::decode(
-                    bytes, layout.BlockList[i], frame, reinterpret_cast<uchar *>(indices.data()), frame.Width))
+            if (!frames.decodeUpTo(i))
                 out << " damaged";
-            out << " hash " << QStringLiteral("%1").arg(fnv1a(indices), 8, 16, QLatin1Char('0'));
+            Fnv1a hash;
+            for (int y = 0; y < frame.Height; ++y) {
+                if (const uchar *row = frames.frameRow(i, y))
+                    hash.add(QByteArrayView(row, frame.Width));
+            }
+            out << " hash " << QStringLiteral("%1").arg(hash.value, 8, 16, QLatin1Char('0'));
         }
         out << '\n';
     }

@@ -1,5 +1,7 @@
 #include "Command.h"
+#include "InputFile.h"
 
+#include "png/PngChunkReader.h"
 #include "png/PngDecoder.h"
 #include "png/StdPNG.h"
 #include "png/stdPNGdata.h"
@@ -107,8 +109,11 @@ int runPngInfo(const QStringList &args, QTextStream &out, QTextStream &err)
         err << "usage: zelctl png-info FILE\n";
         return 2;
     }
+    const std::optional<QByteArray> file = readInputFile(args.first(), zelctl::png::MaxFileBytes, "png-info", err);
+    if (!file)
+        return 1;
     zelctl::StdPNG image;
-    if (!image.LoadFile(args.first())) {
+    if (!image.LoadData(*file)) {
         err << "zelctl png-info: " << args.first() << ": " << image.FailureReason() << '\n';
         return 1;
     }
@@ -172,7 +177,10 @@ int runPngDecode(const QStringList &args, QTextStream &, QTextStream &err)
         err << usage;
         return 2;
     }
-    if (!image.LoadFile(files[0], true, make32, quint8(alpha))) {
+    const std::optional<QByteArray> file = readInputFile(files[0], zelctl::png::MaxFileBytes, "png-decode", err);
+    if (!file)
+        return 1;
+    if (!image.LoadData(*file, true, make32, quint8(alpha))) {
         err << "zelctl png-decode: " << files[0] << ": " << image.FailureReason() << '\n';
         return 1;
     }

@@ -1,11 +1,11 @@
 #include "modFuncs.h"
 
+#include "platform/FileRead.h"
 #include "platform/MessageBox.h"
 #include "platform/Settings.h"
 #include "platform/WindowHandles.h"
 
 #include <QDir>
-#include <QFile>
 #include <QFileInfo>
 #include <QRegularExpression>
 #include <QWidget>
@@ -116,17 +116,25 @@ QString decodeWindows1252(const QByteArray &bytes)
 
 QString ReadWholeFile(const QString &path, bool quiet)
 {
-    if (SafeFileLength(path) > 0) {
-        QFile file(path);
-        if (file.open(QIODevice::ReadOnly))
-            return decodeWindows1252(file.readAll());
-    }
+    const platform::FileRead file = platform::readFile(path, MaxDataFileBytes);
+    if (file.ok() && !file.bytes.isEmpty())
+        return decodeWindows1252(file.bytes);
     if (!quiet) {
         platform::messageBox(platform::MsgIcon::Warning, QStringLiteral("Ficheiro com acesso negado ou inexistente"),
             QStringLiteral("Não foi possível aceder ao ficheiro:\n") + path
                 + QStringLiteral("\n\nPor favor verifique se existe uma nova versão desta aplicação"));
     }
     return {};
+}
+
+QList<QStringView> textLines(QStringView text)
+{
+    QList<QStringView> lines = text.split(u'\n');
+    for (QStringView &line : lines) {
+        if (line.endsWith(u'\r'))
+            line.chop(1);
+    }
+    return lines;
 }
 
 QString FormatShortName(const QString &name)

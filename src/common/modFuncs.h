@@ -2,7 +2,9 @@
 
 #include "zelctl_export.h"
 
+#include <QList>
 #include <QString>
+#include <QStringView>
 #include <QtGlobal>
 
 class QObject;
@@ -19,9 +21,18 @@ ZELCTL_EXPORT QString GetRootPath();
 // GetRootPath() followed by "data/".
 ZELCTL_EXPORT QString GetDataPath();
 
+// Data files (the country file, the holders' directory, a declaration) larger than this
+// are refused as unreadable: no file named by a setting can exhaust the memory.
+inline constexpr qint64 MaxDataFileBytes = qint64(8) << 20;
+
 // The whole file as text (Windows-1252, one character a byte), or "" when it is missing,
-// unreadable or empty; then, unless quiet, the user is told in a message box.
+// unreadable, empty, not a regular file (a FIFO is refused without waiting) or larger than
+// MaxDataFileBytes; then, unless quiet, the user is told in a message box.
 ZELCTL_EXPORT QString ReadWholeFile(const QString &path, bool quiet = false);
+
+// The lines of a text, split at each LF with the CR before it dropped: the country file is
+// written with CR LF, but a hand-edited one may end its lines with LF alone.
+ZELCTL_EXPORT QList<QStringView> textLines(QStringView text);
 
 // The file's length in bytes, or 0 on any error.
 ZELCTL_EXPORT qint64 SafeFileLength(const QString &path);

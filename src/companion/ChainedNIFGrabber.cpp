@@ -3,7 +3,9 @@
 #include "DirectoryNIFGrabber.h"
 #include "VatServiceClient.h"
 
-#include <QFile>
+#include "common/modFuncs.h"
+#include "platform/FileRead.h"
+
 #include <QHostAddress>
 #include <QJsonDocument>
 #include <QJsonObject>
@@ -137,11 +139,12 @@ std::optional<NifAnswer> ChainedNIFGrabber::fromCache()
 std::optional<NifAnswer> ChainedNIFGrabber::fromDirectory() const
 {
     // The file is read at every lookup, so edits count without restarting the host.
-    QFile file(
-        m_settings.directoryFile.isEmpty() ? DirectoryNIFGrabber::defaultDirectoryFile() : m_settings.directoryFile);
-    if (!file.open(QIODevice::ReadOnly))
+    const platform::FileRead file = platform::readFile(
+        m_settings.directoryFile.isEmpty() ? DirectoryNIFGrabber::defaultDirectoryFile() : m_settings.directoryFile,
+        modFuncs::MaxDataFileBytes);
+    if (!file.ok())
         return std::nullopt;
-    const QJsonObject holder = QJsonDocument::fromJson(file.readAll()).object().value(number()).toObject();
+    const QJsonObject holder = QJsonDocument::fromJson(file.bytes).object().value(number()).toObject();
     if (holder.isEmpty())
         return std::nullopt;
     NifAnswer answer { NifAnswer::Outcome::Found, {}, {} };

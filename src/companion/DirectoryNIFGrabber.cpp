@@ -1,8 +1,8 @@
 #include "DirectoryNIFGrabber.h"
 
 #include "common/modFuncs.h"
+#include "platform/FileRead.h"
 
-#include <QFile>
 #include <QJsonDocument>
 #include <QTimer>
 
@@ -12,10 +12,8 @@ namespace {
 
 QJsonObject readDirectory(const QString &path)
 {
-    QFile file(path);
-    if (!file.open(QIODevice::ReadOnly))
-        return {};
-    return QJsonDocument::fromJson(file.readAll()).object();
+    const platform::FileRead file = platform::readFile(path, modFuncs::MaxDataFileBytes);
+    return file.ok() ? QJsonDocument::fromJson(file.bytes).object() : QJsonObject();
 }
 
 } // namespace

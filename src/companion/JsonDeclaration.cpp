@@ -1,6 +1,8 @@
 #include "JsonDeclaration.h"
 
-#include <QFile>
+#include "common/modFuncs.h"
+#include "platform/FileRead.h"
+
 #include <QJsonArray>
 #include <QJsonDocument>
 #include <QJsonObject>
@@ -53,11 +55,11 @@ JsonDeclaration::~JsonDeclaration() = default;
 
 bool JsonDeclaration::load(const QString &path)
 {
-    QFile file(path);
-    if (!file.open(QIODevice::ReadOnly))
+    const platform::FileRead file = platform::readFile(path, modFuncs::MaxDataFileBytes);
+    if (!file.ok())
         return false;
     QJsonParseError error;
-    const QJsonDocument doc = QJsonDocument::fromJson(file.readAll(), &error);
+    const QJsonDocument doc = QJsonDocument::fromJson(file.bytes, &error);
     if (error.error != QJsonParseError::NoError || !doc.isObject())
         return false;
     const QJsonObject json = doc.object();
@@ -107,8 +109,9 @@ bool JsonDeclaration::save(const QString &path) const
     QJsonObject json { { "fields", fields }, { "subjects", subjects }, { "nifInfo", nifInfo } };
     if (!titles.isEmpty())
         json.insert("titles", titles);
+    // A new file renamed over a FIFO or a device would replace it.
     QSaveFile out(path);
-    if (!out.open(QIODevice::WriteOnly))
+    if (platform::isSpecialFile(path) || !out.open(QIODevice::WriteOnly))
         return false;
     out.write(QJsonDocument(json).toJson());
     return out.commit();

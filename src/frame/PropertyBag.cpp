@@ -2,7 +2,6 @@
 
 #include <QJsonObject>
 
-#include <algorithm>
 #include <climits>
 #include <cmath>
 
@@ -38,32 +37,42 @@ QVariant fromJsonValue(const QJsonValue &value)
 
 QVariant PropertyBag::ReadProperty(const QString &name, const QVariant &defaultValue) const
 {
-    const auto it = std::find_if(m_entries.cbegin(), m_entries.cend(), [&](const auto &e) { return e.first == name; });
-    return it == m_entries.cend() ? defaultValue : it->second;
+    const auto it = m_index.constFind(name);
+    return it == m_index.cend() ? defaultValue : m_entries[*it].second;
 }
 
 void PropertyBag::WriteProperty(const QString &name, const QVariant &value, const QVariant &defaultValue)
 {
-    const auto it = std::find_if(m_entries.begin(), m_entries.end(), [&](const auto &e) { return e.first == name; });
+    const auto it = m_index.find(name);
     if (defaultValue.isValid() && value == defaultValue) {
-        if (it != m_entries.end())
-            m_entries.erase(it);
+        if (it != m_index.end()) {
+            const qsizetype at = *it;
+            m_index.erase(it);
+            m_entries.removeAt(at);
+            for (qsizetype &position : m_index) {
+                if (position > at)
+                    --position;
+            }
+        }
         return;
     }
-    if (it != m_entries.end())
-        it->second = value;
-    else
+    if (it != m_index.end()) {
+        m_entries[*it].second = value;
+    } else if (m_entries.size() < MaxEntries) {
+        m_index.insert(name, m_entries.size());
         m_entries.append({ name, value });
+    }
 }
 
 bool PropertyBag::contains(const QString &name) const
 {
-    return std::any_of(m_entries.cbegin(), m_entries.cend(), [&](const auto &e) { return e.first == name; });
+    return m_index.contains(name);
 }
 
 QStringList PropertyBag::names() const
 {
     QStringList result;
+    result.reserve(m_entries.size());
     for (const auto &[name, value] : m_entries)
         result.append(name);
     return result;

@@ -2,6 +2,7 @@
 
 #include "zelctl_export.h"
 
+#include <QHash>
 #include <QJsonArray>
 #include <QList>
 #include <QString>
@@ -11,9 +12,15 @@ namespace zelctl {
 
 // The persisted properties of one control, in the order they were written, as the
 // container keeps them in its form. Values are booleans, numbers, texts or byte arrays.
+// Names are found by hash, so a bag read from a hostile form costs time in proportion to
+// its size.
 class ZELCTL_EXPORT PropertyBag
 {
 public:
+    // Names one bag holds at most; writes of further names are dropped. No control persists
+    // more than a few dozen.
+    static constexpr qsizetype MaxEntries = 1024;
+
     // The value stored under the name, or defaultValue when the name is absent.
     QVariant ReadProperty(const QString &name, const QVariant &defaultValue = QVariant()) const;
 
@@ -29,13 +36,16 @@ public:
     // As a JSON array of {"name", "value"} objects, which keeps the order. Byte arrays are
     // written as {"base64": "..."}.
     QJsonArray toJson() const;
-    // Entries that are not objects with a text name are skipped.
+    // Entries that are not objects with a text name are skipped, and so are those beyond
+    // MaxEntries names.
     static PropertyBag fromJson(const QJsonArray &json);
 
     bool operator==(const PropertyBag &other) const = default;
 
 private:
     QList<std::pair<QString, QVariant>> m_entries;
+    // Where each name is in m_entries.
+    QHash<QString, qsizetype> m_index;
 };
 
 } // namespace zelctl

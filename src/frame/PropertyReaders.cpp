@@ -1,5 +1,6 @@
 #include "PropertyReaders.h"
 
+#include <cmath>
 #include <limits>
 #include <optional>
 
@@ -49,8 +50,9 @@ std::optional<OleColor> colourOf(const QVariant &value)
             ? std::optional<OleColor>(OleColor(value.toULongLong()))
             : std::nullopt;
     case QMetaType::Double: {
+        // Compared before the conversion: 1e300 or NaN has no 64-bit value.
         const double number = value.toDouble();
-        if (number != double(qint64(number)))
+        if (!(number >= -2147483648.0 && number <= 4294967295.0) || number != std::trunc(number))
             return std::nullopt;
         return colourOfNumber(qint64(number));
     }
@@ -61,7 +63,49 @@ std::optional<OleColor> colourOf(const QVariant &value)
     }
 }
 
+// A whole number, or nothing for a value that is not a finite number.
+std::optional<double> numberOf(const QVariant &value)
+{
+    bool ok = false;
+    double number = 0;
+    switch (value.typeId()) {
+    case QMetaType::Int:
+    case QMetaType::UInt:
+    case QMetaType::Long:
+    case QMetaType::ULong:
+    case QMetaType::LongLong:
+    case QMetaType::ULongLong:
+    case QMetaType::Short:
+    case QMetaType::UShort:
+    case QMetaType::Double:
+    case QMetaType::Float:
+        number = value.toDouble(&ok);
+        break;
+    case QMetaType::QString:
+        number = value.toString().trimmed().toDouble(&ok);
+        break;
+    default:
+        return std::nullopt;
+    }
+    if (!ok || !std::isfinite(number))
+        return std::nullopt;
+    return std::nearbyint(number);
+}
+
 } // namespace
+
+qint32 readLong(
+    const PropertyBag &bag, const QString &name, qint32 fallback, qint32 minimum, qint32 maximum, OutOfRange rule)
+{
+    const std::optional<double> number = numberOf(bag.ReadProperty(name));
+    if (!number)
+        return fallback;
+    if (*number < minimum)
+        return rule == OutOfRange::Clamp ? minimum : fallback;
+    if (*number > maximum)
+        return rule == OutOfRange::Clamp ? maximum : fallback;
+    return qint32(*number);
+}
 
 platform::OleColor readColor(const PropertyBag &bag, const QString &name, platform::OleColor fallback)
 {

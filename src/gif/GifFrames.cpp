@@ -99,11 +99,13 @@ QList<qint32> GifFrames::delays() const
     return result;
 }
 
-void GifFrames::decodeUpTo(int last)
+bool GifFrames::decodeUpTo(int last)
 {
     last = std::min(last, count());
+    bool whole = true;
     while (m_decoded < last)
-        decodeFrame(++m_decoded);
+        whole = decodeFrame(++m_decoded) && whole;
+    return whole;
 }
 
 bool GifFrames::decodeFrame(int index)

@@ -39,8 +39,9 @@ public:
     int loopCount() const { return m_layout.LoopCount; }
     QList<qint32> delays() const;
 
-    // Decodes frames up to and including `last` (1-based) that are not decoded yet.
-    void decodeUpTo(int last);
+    // Decodes frames up to and including `last` (1-based) that are not decoded yet. False
+    // when the data of one of them was damaged (it keeps what could be decoded).
+    bool decodeUpTo(int last);
 
     // Where a frame lies on the canvas, mirrored with the picture.
     QRect frameRect(int index) const;

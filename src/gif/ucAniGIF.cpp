@@ -1,5 +1,6 @@
 #include "ucAniGIF.h"
 
+#include "frame/PropertyReaders.h"
 #include "gif/GifAnimator.h"
 #include "gif/GifCanvas.h"
 #include "gif/GifEncoder.h"
@@ -7,10 +8,10 @@
 #include "gif/GifLimits.h"
 #include "gif/GifRemoteLoader.h"
 #include "platform/Accessibility.h"
+#include "platform/FileRead.h"
 #include "platform/Twips.h"
 
 #include <QBuffer>
-#include <QFile>
 #include <QMouseEvent>
 #include <QPointer>
 #include <QTimer>
@@ -75,6 +76,12 @@ qint16 shiftOf(Qt::KeyboardModifiers modifiers)
 {
     return qint16((modifiers & Qt::ShiftModifier ? 1 : 0) | (modifiers & Qt::ControlModifier ? 2 : 0)
         | (modifiers & Qt::AltModifier ? 4 : 0));
+}
+
+// The absolute value of a Long, as far as it goes.
+int loopCountOf(qint32 loops)
+{
+    return loops == std::numeric_limits<qint32>::min() ? std::numeric_limits<qint32>::max() : std::abs(loops);
 }
 
 bool hasGifSignature(const QByteArray &bytes)
@@ -288,15 +295,10 @@ ucAniGIF::~ucAniGIF() = default;
 
 bool ucAniGIF::LoadAnimatedGIF_File(const QString &FileName)
 {
-    // A file that cannot be read leaves the GIF shown as it is; one that reads but holds no
-    // frame empties the control, as any load does.
-    QFile file(FileName);
-    if (!file.open(QIODevice::ReadOnly) || file.size() <= 0 || file.size() > gifLimits::MaxFileBytes)
-        return false;
-    const QByteArray bytes = file.readAll();
-    if (bytes.size() != file.size())
-        return false;
-    return d->load(bytes);
+    // A file that cannot be read loads nothing, and the load empties the control as any
+    // other does: a host that reads FrameCount afterwards sees that this file failed.
+    const platform::FileRead file = platform::readFile(FileName, gifLimits::MaxFileBytes);
+    return d->load(file.ok() ? file.bytes : QByteArray());
 }
 
 bool ucAniGIF::LoadAnimatedGIF_Array(const QByteArray &Bytes)
@@ -358,15 +360,17 @@ bool ucAniGIF::RestoreColorTables(bool bReleaseCache)
     return true;
 }
 
-qint16 ucAniGIF::MinFrameDelay() const
+qint32 ucAniGIF::MinFrameDelay() const
 {
-    return qint16(d->animator.minFrameDelay());
+    return d->animator.minFrameDelay();
 }
 
-void ucAniGIF::setMinFrameDelay(qint16 milliseconds)
+void ucAniGIF::setMinFrameDelay(qint32 milliseconds)
 {
+    const int before = d->animator.minFrameDelay();
     d->animator.setMinFrameDelay(milliseconds);
-    PropertyChanged(QStringLiteral("Delay"));
+    if (d->animator.minFrameDelay() != before)
+        PropertyChanged(QStringLiteral("Delay"));
 }
 
 qint32 ucAniGIF::Stretch() const
@@ -396,8 +400,7 @@ qint32 ucAniGIF::Loops() const
 
 void ucAniGIF::setLoops(qint32 loops)
 {
-    d->animator.setLoopCount(
-        loops == std::numeric_limits<qint32>::min() ? std::numeric_limits<qint32>::max() : std::abs(loops));
+    d->animator.setLoopCount(loopCountOf(loops));
     PropertyChanged(QStringLiteral("Loops"));
 }
 
@@ -586,22 +589,21 @@ void ucAniGIF::InitProperties()
 
 void ucAniGIF::ReadProperties(const PropertyBag &bag)
 {
-    d->animator.setMinFrameDelay(bag.ReadProperty("Delay", GifAnimator::DefaultMinFrameDelay).toInt());
-    const int stretch = bag.ReadProperty("Stretch", int(gfsScaleAlways)).toInt();
-    d->stretch = stretch >= gfsClip && stretch <= gfsActualSize ? stretch : gfsScaleAlways;
-    const int delayMode = bag.ReadProperty("DelayLoad", int(gfdDelayStartup)).toInt();
-    d->delayMode = delayMode >= 0 && delayMode <= 3 ? delayMode : gfdDelayStartup;
-    d->mirror = bag.ReadProperty("Mirror", int(gfmNone)).toInt() & 3;
+    d->animator.setMinFrameDelay(
+        readLong(bag, "Delay", GifAnimator::DefaultMinFrameDelay, 10, 32700, OutOfRange::Clamp));
+    d->stretch = readLong(bag, "Stretch", gfsScaleAlways, gfsClip, gfsActualSize);
+    // A stored -1 reads back as the default.
+    d->delayMode = readLong(bag, "DelayLoad", gfdDelayStartup, 0, 3);
+    d->mirror = readLong(bag, "Mirror", gfmNone, gfmNone, gfmHorAndVer);
     const QByteArray icon = bag.ReadProperty("MouseIcon").toByteArray();
     d->mouseIcon = icon.isEmpty() ? Picture() : Picture::fromData(icon);
-    setMousePointer(bag.ReadProperty("MousePointer", 0).toInt());
-    setEnabled(bag.ReadProperty("Enabled", true).toBool());
-    d->offsetX = bag.ReadProperty("OffsetX", 0).toInt();
-    d->offsetY = bag.ReadProperty("OffsetY", 0).toInt();
+    setMousePointer(readLong(bag, "MousePointer", 0));
+    setEnabled(readBoolean(bag, "Enabled", true));
+    d->offsetX = readLong(bag, "OffsetX", 0);
+    d->offsetY = readLong(bag, "OffsetY", 0);
     d->load(bag.ReadProperty("GIF").toByteArray());
     // Read after the GIF, so that a saved count overrides the file's own.
-    const qint64 loops = std::abs(bag.ReadProperty("Loops", d->frames.loopCount()).toLongLong());
-    d->animator.setLoopCount(int(std::min<qint64>(loops, std::numeric_limits<qint32>::max())));
+    d->animator.setLoopCount(loopCountOf(readLong(bag, "Loops", d->frames.loopCount())));
 }
 
 void ucAniGIF::WriteProperties(PropertyBag &bag)
@@ -659,12 +661,11 @@ void ucAniGIF::paintEvent(QPaintEvent *event)
         gdi::SetStretchBltMode(dc, scaled ? gdi::HALFTONE : gdi::COLORONCOLOR);
         gdi::SetBrushOrgEx(dc, 0, 0);
         d->canvas.show(d->frames, current);
-        // An offset that puts the picture far beyond any bitmap leaves nothing to draw, and
-        // would overflow the rectangle's arithmetic.
-        const qint64 w = std::llround(d->frames.canvasWidth() * d->scaleX);
-        const qint64 h = std::llround(d->frames.canvasHeight() * d->scaleY);
-        constexpr qint64 Reach = qint64(1) << 27;
-        if (std::abs(qint64(d->offsetX)) + w < Reach && std::abs(qint64(d->offsetY)) + h < Reach)
+        const qint64 w = std::lround(d->frames.canvasWidth() * d->scaleX);
+        const qint64 h = std::lround(d->frames.canvasHeight() * d->scaleY);
+        // Offsets may be any Long: a picture wholly beside the control is not drawn, and one
+        // that shows has edges small enough for a rectangle.
+        if (d->offsetX < width() && d->offsetX + w > 0 && d->offsetY < height() && d->offsetY + h > 0)
             d->canvas.paint(dc, QRect(d->offsetX, d->offsetY, int(w), int(h)));
     }
     if (designMode()) {

@@ -19,9 +19,9 @@ namespace zelctl {
 class ZELCTL_EXPORT ucAniGIF : public gdi::SurfaceHost<UserControl>
 {
     Q_OBJECT
-    // Shortest time a frame is shown, in milliseconds: 10..32700 (values outside are
-    // clamped). Persisted as "Delay", default 50.
-    Q_PROPERTY(qint16 MinFrameDelay READ MinFrameDelay WRITE setMinFrameDelay)
+    // Shortest time a frame is shown, in milliseconds: 10..32700 (any value outside is
+    // clamped, 40000 to 32700). Persisted as "Delay", default 50.
+    Q_PROPERTY(qint32 MinFrameDelay READ MinFrameDelay WRITE setMinFrameDelay)
     // How the picture and the control's size fit each other: a ScaleGIFConstants value.
     // Persisted as "Stretch", default gfsScaleAlways.
     Q_PROPERTY(qint32 Stretch READ Stretch WRITE setStretch)
@@ -79,12 +79,18 @@ public:
     explicit ucAniGIF(QWidget *parent = nullptr);
     ~ucAniGIF() override;
 
-    // Reads the whole file; true when it holds at least one frame.
+    // Reads the whole file; true when it holds at least one frame. Any load stops and
+    // releases the GIF shown first, so a file that is missing, empty, unreadable, not a
+    // regular file or larger than a GIF may be leaves the control empty (FrameCount 0).
     Q_INVOKABLE bool LoadAnimatedGIF_File(const QString &FileName);
     // True when the bytes hold at least one frame.
     Q_INVOKABLE bool LoadAnimatedGIF_Array(const QByteArray &Bytes);
     // Starts reading a local path, a file:// or an http(s):// address and returns at once;
-    // RemoteLoadComplete or RemoteLoadFailure follows. An empty path does nothing.
+    // RemoteLoadComplete or RemoteLoadFailure follows. An empty path does nothing. A local
+    // FIFO or device is refused. An address is read with a transfer timeout (the setting
+    // "giftimeout" of application "ZEL", section "Config", in seconds, default 30), at most
+    // 5 redirects and no more bytes than a GIF may hold; each GIF read is kept in the
+    // user's cache folder, and when the network fails the kept copy is loaded instead.
     Q_INVOKABLE void LoadAnimatedGIF_Remote(const QString &RemotePath);
 
     Q_INVOKABLE void Refresh();
@@ -100,8 +106,8 @@ public:
     // Puts the kept copy back (and drops it when bReleaseCache); false without a copy.
     Q_INVOKABLE bool RestoreColorTables(bool bReleaseCache);
 
-    qint16 MinFrameDelay() const;
-    void setMinFrameDelay(qint16 milliseconds);
+    qint32 MinFrameDelay() const;
+    void setMinFrameDelay(qint32 milliseconds);
     qint32 Stretch() const;
     void setStretch(qint32 stretch);
     qint32 Loops() const;

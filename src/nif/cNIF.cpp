@@ -26,7 +26,6 @@
 #include <QMimeData>
 #include <QMouseEvent>
 #include <QPointer>
-#include <QStringTokenizer>
 
 namespace zelctl {
 
@@ -589,7 +588,7 @@ QString cNIF::CountryName(bool fulldesc) const
         return QStringLiteral("Portugal");
     const QString file = modFuncs::ReadWholeFile(modFuncs::GetDataPath() + QStringLiteral("iso3166.txt"), true);
     const auto fieldsOf = [&file](QStringView code) -> QList<QStringView> {
-        for (const QStringView line : QStringTokenizer(file, u"\r\n")) {
+        for (const QStringView line : modFuncs::textLines(file)) {
             const QList<QStringView> fields = line.split(u'\t');
             if (fields.size() >= 2 && fields[1] == code)
                 return fields;
@@ -1004,10 +1003,8 @@ void cNIF::ReadProperties(const PropertyBag &bag)
     setDisablePopupMenu(readBoolean(bag, QStringLiteral("DisablePopupMenu"), false));
     const QString saved = bag.ReadProperty(QStringLiteral("Country"), QString(Portugal)).toString();
     d->required = readBoolean(bag, QStringLiteral("Required"), false);
-    bool known = false;
-    const int filter = bag.ReadProperty(QStringLiteral("Countries"), 0).toInt(&known);
-    if (known && filter >= GSEL_OnlyPT && filter <= GSEL_Custom)
-        d->filter = GSEL_CountryFilterList(filter);
+    d->filter
+        = GSEL_CountryFilterList(readLong(bag, QStringLiteral("Countries"), GSEL_OnlyPT, GSEL_OnlyPT, GSEL_Custom));
     d->customCountryList = bag.ReadProperty(QStringLiteral("CustomCountryList"), QString()).toString();
     // The refresh raises events, in which the host may delete the control.
     const Private::Guard alive(this);

@@ -1,5 +1,7 @@
 #include "Settings.h"
 
+#include "platform/FileRead.h"
+
 #include <QFile>
 #include <QSettings>
 #include <QStandardPaths>
@@ -75,6 +77,10 @@ QString settingsFile(const QString &application)
 QString GetSetting(const QString &application, const QString &section, const QString &key, const QString &defaultValue)
 {
     const QString file = settingsFile(application);
+    // A store that is, or links to, a FIFO or a device is neither read (opening a FIFO waits
+    // for a writer) nor written (the new file would be renamed over it).
+    if (isSpecialFile(file))
+        return defaultValue;
     const QSettings store(file, QSettings::IniFormat);
     const QVariant value = store.value(settingsKey(section, key));
     if (!value.isValid())
@@ -89,6 +95,8 @@ QString GetSetting(const QString &application, const QString &section, const QSt
 
 bool SaveSetting(const QString &application, const QString &section, const QString &key, const QString &value)
 {
+    if (isSpecialFile(settingsFile(application)))
+        return false;
     QSettings store(settingsFile(application), QSettings::IniFormat);
     if (!writable(store))
         return false;
@@ -99,6 +107,8 @@ bool SaveSetting(const QString &application, const QString &section, const QStri
 
 bool DeleteSetting(const QString &application, const QString &section, const QString &key)
 {
+    if (isSpecialFile(settingsFile(application)))
+        return false;
     QSettings store(settingsFile(application), QSettings::IniFormat);
     if (!writable(store))
         return false;

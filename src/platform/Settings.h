@@ -7,6 +7,8 @@
 // Per-user application settings (application, section, key), kept as one INI file per
 // application under the XDG config folder. The application name is folded to lower case,
 // so "zEL" and "ZEL" share one store, as they did where these keys were case-insensitive.
+// A store that is a symbolic link is written through to the file it points at; one that is,
+// or leads to, a FIFO or a device is neither read nor written (reads give the default).
 namespace zelctl::platform {
 
 // A value is read whole, also when a person wrote it by hand with a comma or a semicolon

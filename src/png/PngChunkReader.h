@@ -13,6 +13,10 @@
 // and every understood ancillary chunk. Every length is checked against the file first.
 namespace zelctl::png {
 
+// The largest file LoadFile reads: far above any image the bitmap limits let through, and a
+// bound for a name that leads to /dev/zero or an endless file.
+inline constexpr qint64 MaxFileBytes = qint64(256) << 20;
+
 namespace reason {
 inline constexpr const char *HeaderCrc = "Corrupted Image Header (bad CRC). Cannot continue.";
 inline constexpr const char *HeaderCorrupt = "Corrupted Image Header. Cannot continue.";

@@ -5,11 +5,11 @@
 #include "PngImageStream.h"
 #include "PngProgressiveDisplay.h"
 #include "PngText.h"
+#include "platform/FileRead.h"
 #include "platform/OleColor.h"
 #include "platform/gdi/Gdi.h"
 #include "stdPNGdata.h"
 
-#include <QFile>
 #include <QGuiApplication>
 #include <QPointer>
 #include <QScreen>
@@ -270,16 +270,15 @@ bool StdPNG::LoadFile(const QString &FileName, bool ValidateAllData, bool Make32
 {
     if (d->stateFlags >= LoadInProgress)
         return false;
-    QFile file(FileName);
-    if (!file.open(QIODevice::ReadOnly)) {
+    // A FIFO or device is refused at once rather than waited on or read without end.
+    platform::FileRead file = platform::readFile(FileName, png::MaxFileBytes);
+    if (!file.ok()) {
         d->reset();
-        d->failure = QString::fromLatin1(png::reason::Unreadable);
+        d->failure = QString::fromLatin1(
+            file.status == platform::FileRead::TooLarge ? png::reason::TooLarge : png::reason::Unreadable);
         return false;
     }
-    QByteArray bytes = file.readAll();
-    if (file.error() != QFileDevice::NoError)
-        return d->fail(png::reason::Unreadable);
-    return d->load(std::move(bytes), ValidateAllData, Make32Bit, AlphaBlendValue);
+    return d->load(std::move(file.bytes), ValidateAllData, Make32Bit, AlphaBlendValue);
 }
 
 bool StdPNG::LoadData(const QByteArray &file, bool ValidateAllData, bool Make32Bit, quint8 AlphaBlendValue)

@@ -344,10 +344,7 @@ QString clsGFXSelection::SelectCountry(const GFXSelection &xListSettings, GSEL_C
 
     const QString flags = modFuncs::GetDataPath() + QStringLiteral("images/flags_iso/16/");
     QList<GFXItem> items;
-    // Lines end with CR LF; a bare LF is taken as well.
-    for (QStringView line : QStringView(text).split(QLatin1Char('\n'))) {
-        if (line.endsWith(QLatin1Char('\r')))
-            line.chop(1);
+    for (const QStringView line : modFuncs::textLines(text)) {
         const QList<QStringView> fields = line.split(QLatin1Char('\t'));
         // A line without a code and a name names no country.
         if (fields.size() < 4 || fields.at(1).isEmpty())

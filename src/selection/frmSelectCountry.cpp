@@ -193,10 +193,7 @@ void frmSelectCountry::RelistCountries()
     const QString text = modFuncs::ReadWholeFile(countryFile());
     if (d->filterMode == GSEL_OnlyPT)
         return;
-    // Lines end with CR LF; a bare LF is taken as well.
-    for (QStringView line : QStringView(text).split(QLatin1Char('\n'))) {
-        if (line.endsWith(QLatin1Char('\r')))
-            line.chop(1);
+    for (const QStringView line : modFuncs::textLines(text)) {
         const QList<QStringView> fields = line.split(QLatin1Char('\t'));
         // A line without a code and a name names no country.
         if (fields.size() < 4 || fields.at(1).isEmpty())

@@ -201,7 +201,7 @@ void skNumber::ReadProperties(const PropertyBag &bag)
     d->foreground = color("Foreground", DefaultForeground);
     d->backgroundActive = color("BackgroundActive", DefaultBackgroundActive);
     d->foregroundActive = color("ForegroundActive", DefaultForegroundActive);
-    d->active = bag.ReadProperty(QStringLiteral("Active"), false).toBool();
+    d->active = readBoolean(bag, QStringLiteral("Active"), false);
     d->skinId = bag.ReadProperty(QStringLiteral("SkinID"), QString()).toString();
     d->backStyle
         = bag.ReadProperty(QStringLiteral("BackStyle"), DefaultBackStyle).toInt() == Opaque ? Opaque : Transparent;

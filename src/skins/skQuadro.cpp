@@ -88,7 +88,7 @@ void skQuadro::InitProperties()
 void skQuadro::ReadProperties(const PropertyBag &bag)
 {
     d->transparencyColor = readColor(bag, QStringLiteral("TransparentBack"), 0);
-    d->debugDesign = bag.ReadProperty(QStringLiteral("DebugDesignImgID"), d->debugDesign).toInt();
+    d->debugDesign = readLong(bag, QStringLiteral("DebugDesignImgID"), d->debugDesign);
     loadDesignPreview();
     QPalette colours = palette();
     colours.setColor(QPalette::WindowText, Qt::black);

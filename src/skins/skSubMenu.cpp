@@ -11,12 +11,17 @@
 #include <QMouseEvent>
 #include <QPainter>
 
+#include <algorithm>
 #include <cmath>
 #include <optional>
 
 namespace zelctl {
 
 namespace {
+
+// The widest a control can be, in twips. A margin beyond it means nothing, and would
+// overflow the sums that lay the caption out.
+constexpr qint32 MaxMargin = QWIDGETSIZE_MAX * platform::TwipsPerPixel;
 
 constexpr platform::OleColor DefaultForeColor = 0xFFFFFF;
 constexpr platform::OleColor DefaultBackColor = 0xC3AB00;
@@ -75,7 +80,7 @@ qint32 skSubMenu::Margin() const
 
 void skSubMenu::setMargin(qint32 twips)
 {
-    d->margin = twips;
+    d->margin = std::clamp(twips, -MaxMargin, MaxMargin);
 }
 
 platform::OleColor skSubMenu::TransparencyColor() const
@@ -283,7 +288,7 @@ void skSubMenu::ReadProperties(const PropertyBag &bag)
     d->activeForeColor = color("ActiveForeColor", DefaultActiveForeColor);
     d->activeBackColor = color("ActiveBackColor", ReadActiveBackColor);
     d->caption = bag.ReadProperty(QStringLiteral("Caption"), ambient().DisplayName).toString();
-    d->margin = bag.ReadProperty(QStringLiteral("Margin"), 0).toInt();
+    d->margin = readLong(bag, QStringLiteral("Margin"), 0, -MaxMargin, MaxMargin, OutOfRange::Clamp);
     d->transparencyColor = color("TransparentBack", DefaultTransparencyColor);
     setForeColor(foreColor);
     setBackColor(backColor);

@@ -26,6 +26,8 @@ class skSubMenuPrivate;
 class ZELCTL_EXPORT skSubMenu : public gdi::SurfaceHost<UserControl>
 {
     Q_OBJECT
+    // Twips between the point or the left picture and the caption; clamped to ±251658225,
+    // the widest a control can be.
     Q_PROPERTY(qint32 Margin READ Margin WRITE setMargin)
     Q_PROPERTY(quint32 TransparencyColor READ TransparencyColor WRITE setTransparencyColor)
     Q_PROPERTY(quint32 ForeColor READ ForeColor WRITE setForeColor)

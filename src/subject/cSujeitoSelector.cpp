@@ -5,6 +5,7 @@
 #include "companion/CommandButton.h"
 #include "companion/CommandButtonArray.h"
 #include "companion/Declaration.h"
+#include "frame/PropertyReaders.h"
 #include "platform/Accessibility.h"
 #include "platform/Twips.h"
 
@@ -569,7 +570,7 @@ void cSujeitoSelector::ReadProperties(const PropertyBag &bag)
 {
     // Kept as the form stored it.
     d->possible = bag.ReadProperty(QStringLiteral("Possible"), defaultPossible).toString();
-    d->canSelectNone = bag.ReadProperty(QStringLiteral("CanSelectNone"), false).toBool();
+    d->canSelectNone = readBoolean(bag, QStringLiteral("CanSelectNone"), false);
     d->refresh();
 }
 

@@ -1,6 +1,7 @@
 #include "InfoButton.h"
 
 #include "common/modFuncs.h"
+#include "frame/PropertyReaders.h"
 #include "platform/Accessibility.h"
 #include "platform/KeyboardFocus.h"
 #include "platform/Shell.h"
@@ -239,13 +240,14 @@ void InfoButton::InitProperties()
 void InfoButton::ReadProperties(const PropertyBag &bag)
 {
     setAction(bag.ReadProperty(QStringLiteral("ibutton.action"), QString()).toString());
-    setStyle(IB_STYLE_ENUM(bag.ReadProperty(QStringLiteral("ibutton.bstyle"), qint32(IB_INFO)).toInt()));
-    setToolTipStyle(TT_STYLE_ENUM(bag.ReadProperty(QStringLiteral("ibutton.style"), qint32(TTS_BALLOON)).toInt()));
+    setStyle(IB_STYLE_ENUM(readLong(bag, QStringLiteral("ibutton.bstyle"), IB_INFO, IB_INFO, IB_ERROR)));
+    setToolTipStyle(
+        TT_STYLE_ENUM(readLong(bag, QStringLiteral("ibutton.style"), TTS_BALLOON, TTS_DEFAULT, TTS_BALLOON)));
     setToolTipTitle(bag.ReadProperty(QStringLiteral("ibutton.title"), QStringLiteral("Informação")).toString());
-    setEnabled(bag.ReadProperty(QStringLiteral("ibutton.enabled"), true).toBool());
+    setEnabled(readBoolean(bag, QStringLiteral("ibutton.enabled"), true));
     const QVariant plainTip = bag.ReadProperty(QStringLiteral("ToolTipText"), QString());
     setTipText(bag.ReadProperty(QStringLiteral("ibutton.tiptext"), plainTip).toString());
-    setTransparent(bag.ReadProperty(QStringLiteral("ibutton.transparent"), false).toBool());
+    setTransparent(readBoolean(bag, QStringLiteral("ibutton.transparent"), false));
 }
 
 void InfoButton::WriteProperties(PropertyBag &bag)

@@ -13,6 +13,8 @@
 
 #include <thread>
 
+#include <sys/stat.h>
+
 using namespace zelctl;
 using namespace zelctl::modFuncs;
 
@@ -100,6 +102,38 @@ TEST(ReadWholeFile, missingOrEmptyFileShowsTheMessageUnlessQuiet)
     EXPECT_EQ(ReadWholeFile(empty.fileName()), "");
     EXPECT_EQ(boxes.shown().size(), 2) << "an empty file is treated as a missing one";
     EXPECT_EQ(SafeFileLength(dir.path()), 0) << "a folder has no length";
+
+    // A FIFO would make the reader wait for a writer; a huge file would fill the memory.
+    const QString fifo = dir.filePath("fifo.txt");
+    ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
+    QFile huge(dir.filePath("huge.txt"));
+    ASSERT_TRUE(huge.open(QIODevice::WriteOnly) && huge.resize(MaxDataFileBytes + 1));
+    huge.close();
+    for (const QString &path : { fifo, huge.fileName(), QStringLiteral("/dev/zero") })
+        EXPECT_EQ(ReadWholeFile(path), "") << path.toStdString();
+    EXPECT_EQ(boxes.shown().size(), 5);
+}
+
+TEST(TextLines, splitAtLineFeedsWithOrWithoutCarriageReturns)
+{
+    const struct
+    {
+        const char *text;
+        QStringList lines;
+    } cases[] = {
+        { "724\tES\r\n300\tEL\r\n", { "724\tES", "300\tEL", "" } },
+        { "724\tES\n300\tEL", { "724\tES", "300\tEL" } },
+        { "a\r\nb\nc\r", { "a", "b", "c" } },
+        { "a\rb", { "a\rb" } },
+        { "", { "" } },
+    };
+    for (const auto &c : cases) {
+        const QString text = QString::fromLatin1(c.text);
+        QStringList lines;
+        for (const QStringView line : textLines(text))
+            lines << line.toString();
+        EXPECT_EQ(lines, c.lines) << c.text;
+    }
 }
 
 TEST(FormatShortName, shortensAndCapitalises)

@@ -3,11 +3,14 @@
 
 #include "support/TestSupport.h"
 
+#include <QFileInfo>
 #include <QSignalSpy>
 #include <QTemporaryDir>
 #include <QTest>
 
 #include <gtest/gtest.h>
+
+#include <sys/stat.h>
 
 using namespace zelctl;
 using namespace zelctl::companion;
@@ -56,11 +59,19 @@ TEST(DirectoryNIFGrabber, finishesAlsoWhenNothingIsFound)
     EXPECT_EQ(log.events, QStringList({ "Starting", "Finished" }));
     EXPECT_EQ(grabber.GetField("NOME"), "") << "the fields answer for the last fetch, which found nothing";
 
-    DirectoryNIFGrabber missing("/nonexistent/contribuintes.json");
-    EventLog missingLog(missing);
-    missing.Fetch("PT210345675");
-    ASSERT_TRUE(QTest::qWaitFor([&] { return !missing.IsBusy(); }));
-    EXPECT_EQ(missingLog.events, QStringList({ "Starting", "Finished" }));
+    // A directory that is missing, a FIFO (which would block the reading thread) or a
+    // device (which would fill the memory) answers nothing.
+    QTemporaryDir dir;
+    const QString fifo = dir.filePath("contribuintes.json");
+    ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
+    for (const QString &path :
+        { QStringLiteral("/nonexistent/contribuintes.json"), fifo, QStringLiteral("/dev/zero") }) {
+        DirectoryNIFGrabber unreadable(path);
+        EventLog unreadableLog(unreadable);
+        unreadable.Fetch("PT210345675");
+        ASSERT_TRUE(QTest::qWaitFor([&] { return !unreadable.IsBusy(); })) << path.toStdString();
+        EXPECT_EQ(unreadableLog.events, QStringList({ "Starting", "Finished" }));
+    }
 }
 
 TEST(DirectoryNIFGrabber, factoryCanBeReplacedByTheHost)
@@ -126,8 +137,12 @@ TEST(JsonDeclaration, savesWhatItHoldsAndRejectsBadFilesWithoutLosingData)
     ASSERT_TRUE(broken.open(QIODevice::WriteOnly));
     broken.write("{ not json");
     broken.close();
-    EXPECT_FALSE(reloaded.load(broken.fileName()));
-    EXPECT_FALSE(reloaded.load(dir.filePath("missing.json")));
+    const QString fifo = dir.filePath("fifo.json");
+    ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
+    for (const QString &path : { broken.fileName(), dir.filePath("missing.json"), fifo, QStringLiteral("/dev/zero") })
+        EXPECT_FALSE(reloaded.load(path)) << path.toStdString();
+    EXPECT_FALSE(reloaded.save(fifo)) << "a save never replaces a FIFO";
+    EXPECT_TRUE(QFileInfo(fifo).exists() && !QFileInfo(fifo).isFile());
     EXPECT_EQ(reloaded.DeclarationData().Dependants(), 2) << "a failed load keeps the declaration";
 }
 

@@ -11,6 +11,8 @@
 
 #include <functional>
 
+#include <sys/stat.h>
+
 using namespace zelctl;
 using namespace zelctl::companion;
 using namespace zelctl::test;
@@ -82,7 +84,9 @@ TEST_F(NifCacheLookup, directoryAnswersAreStoredForEveryFetcherOfTheProcess)
     fetch(first, DirectoryHolder);
     EXPECT_EQ(first.GetField("SOURCE"), "Diretório local");
 
-    lookup.directoryFile = folder.filePath("gone.json");
+    // The directory is now a FIFO, which is refused rather than waited on.
+    lookup.directoryFile = folder.filePath("fifo.json");
+    ASSERT_EQ(::mkfifo(QFile::encodeName(lookup.directoryFile).constData(), 0600), 0);
     ChainedNIFGrabber second(lookup);
     fetch(second, DirectoryHolder);
     EXPECT_EQ(second.HolderName(), "ANA MARIA FERREIRA LOPES");

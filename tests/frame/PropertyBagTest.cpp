@@ -1,6 +1,7 @@
 #include "frame/PropertyBag.h"
 
 #include <QJsonDocument>
+#include <QJsonObject>
 
 #include <gtest/gtest.h>
 
@@ -28,14 +29,38 @@ TEST(PropertyBag, skipsValuesEqualToTheWriteDefault)
     EXPECT_TRUE(bag.contains("Always")) << "without a default every value is written";
 }
 
-TEST(PropertyBag, keepsTheOrderOfFirstWrites)
+TEST(PropertyBag, keepsTheOrderOfFirstWritesWhenNamesComeAndGo)
 {
     PropertyBag bag;
     bag.WriteProperty("Zeta", 1);
     bag.WriteProperty("Alpha", 2);
-    bag.WriteProperty("Zeta", 3);
-    EXPECT_EQ(bag.names(), QStringList({ "Zeta", "Alpha" }));
-    EXPECT_EQ(bag.ReadProperty("Zeta").toInt(), 3);
+    bag.WriteProperty("Beta", 3);
+    bag.WriteProperty("Zeta", 4);
+    EXPECT_EQ(bag.names(), QStringList({ "Zeta", "Alpha", "Beta" }));
+    EXPECT_EQ(bag.ReadProperty("Zeta").toInt(), 4);
+
+    bag.WriteProperty("Zeta", 0, 0);
+    bag.WriteProperty("Beta", 5);
+    bag.WriteProperty("Gamma", 6);
+    EXPECT_EQ(bag.names(), QStringList({ "Alpha", "Beta", "Gamma" }));
+    EXPECT_EQ(bag.ReadProperty("Alpha").toInt(), 2);
+    EXPECT_EQ(bag.ReadProperty("Beta").toInt(), 5);
+    EXPECT_EQ(bag.ReadProperty("Gamma").toInt(), 6);
+    EXPECT_FALSE(bag.contains("Zeta"));
+}
+
+TEST(PropertyBag, holdsAtMostItsCapOfNames)
+{
+    // 80,000 names, as a hostile form may hold, of which one is written twice.
+    QJsonArray json;
+    for (int i = 0; i < 80000; ++i)
+        json.append(QJsonObject { { "name", QStringLiteral("P%1").arg(i) }, { "value", i } });
+    json.append(QJsonObject { { "name", "P7" }, { "value", -7 } });
+    const PropertyBag bag = PropertyBag::fromJson(json);
+    ASSERT_EQ(bag.names().size(), PropertyBag::MaxEntries);
+    EXPECT_EQ(bag.names().last(), QStringLiteral("P%1").arg(PropertyBag::MaxEntries - 1));
+    EXPECT_EQ(bag.ReadProperty("P7").toInt(), -7) << "a later value of a kept name still counts";
+    EXPECT_FALSE(bag.contains(QStringLiteral("P%1").arg(PropertyBag::MaxEntries)));
 }
 
 TEST(PropertyBag, survivesAJsonRoundTripWithEveryValueKind)

@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <limits>
 #include <memory>
 
 using namespace zelctl;
@@ -85,4 +86,79 @@ TEST(PropertyReaders, readBooleansWrittenAsTextOrNumbers)
         EXPECT_FALSE(readBoolean(bagWith("B", no), "B", true)) << no.toString().toStdString();
     EXPECT_TRUE(readBoolean(bagWith("B", "talvez"), "B", true));
     EXPECT_FALSE(readBoolean(PropertyBag(), "B", false));
+}
+
+TEST(PropertyReaders, readLongsIntoTheirRange)
+{
+    const struct
+    {
+        QVariant stored;
+        OutOfRange rule;
+        qint32 value;
+    } cases[] = {
+        { 70, OutOfRange::Refuse, 70 },
+        { "  70 ", OutOfRange::Refuse, 70 },
+        { 70.5, OutOfRange::Refuse, 70 }, // halves to even
+        { 71.5, OutOfRange::Refuse, 72 },
+        { 10, OutOfRange::Refuse, 10 },
+        { 9, OutOfRange::Refuse, -1 },
+        { 9, OutOfRange::Clamp, 10 },
+        { 101, OutOfRange::Clamp, 100 },
+        { 1e300, OutOfRange::Clamp, 100 },
+        { -1e300, OutOfRange::Clamp, 10 },
+        { 1e300, OutOfRange::Refuse, -1 },
+        { "1e300", OutOfRange::Refuse, -1 },
+        { qint64(1) << 62, OutOfRange::Clamp, 100 },
+        { quint64(1) << 63, OutOfRange::Refuse, -1 },
+        { std::numeric_limits<double>::quiet_NaN(), OutOfRange::Clamp, -1 },
+        { std::numeric_limits<double>::infinity(), OutOfRange::Clamp, -1 },
+        { "inf", OutOfRange::Clamp, -1 },
+        { "setenta", OutOfRange::Clamp, -1 },
+        { QByteArray("70"), OutOfRange::Clamp, -1 },
+    };
+    for (const auto &c : cases) {
+        EXPECT_EQ(readLong(bagWith("N", c.stored), "N", -1, 10, 100, c.rule), c.value)
+            << c.stored.toString().toStdString();
+    }
+    EXPECT_EQ(readLong(PropertyBag(), "N", -1, 10, 100, OutOfRange::Clamp), -1);
+    EXPECT_EQ(readLong(bagWith("N", -2147483648.0), "N", 0), std::numeric_limits<qint32>::min());
+    EXPECT_EQ(readLong(bagWith("N", 2147483648.0), "N", 0), 0);
+    EXPECT_EQ(readColor(bagWith("C", 1e300), "C", 7), 7u) << "no out-of-range conversion";
+}
+
+// Every persisted number of every control, beyond its range: the control keeps a value
+// of the range, as its setter would.
+TEST(PropertyReaders, everyControlReadsItsNumbersIntoRange)
+{
+    const struct
+    {
+        const char *control;
+        const char *name;
+        const char *property;
+        QVariant stored;
+        qint64 value;
+    } numbers[] = {
+        { "ucAniGIF", "Delay", "MinFrameDelay", 40000, 32700 },
+        { "ucAniGIF", "Delay", "MinFrameDelay", -1e300, 10 },
+        { "ucAniGIF", "Stretch", "Stretch", 9.3e18, 1 },
+        { "ucAniGIF", "DelayLoad", "DelayAnimation", -1, 1 },
+        { "ucAniGIF", "Mirror", "Mirrored", 5, 0 },
+        { "ucAniGIF", "MousePointer", "MousePointer", 1e300, 0 },
+        { "ucAniGIF", "OffsetX", "OffsetX", 2147483648.0, 0 },
+        { "ucAniGIF", "OffsetY", "OffsetY", -2147483649.0, 0 },
+        { "ucAniGIF", "Loops", "Loops", -2147483648.0, 2147483647 },
+        { "ucAniGIF", "Loops", "Loops", 1e300, 0 },
+        { "skSubMenu", "Margin", "Margin", 1e300, 251658225 },
+        { "skQuadro", "DebugDesignImgID", "DebugDesign", -1e300, 0 },
+        { "InfoButton", "ibutton.bstyle", "Style", 3, 0 },
+        { "InfoButton", "ibutton.style", "ToolTipStyle", 2, 1 },
+        { "cNIF", "Countries", "Countries", 4294967296.0, 0 },
+    };
+    for (const auto &n : numbers) {
+        std::unique_ptr<QObject> object(CreateObject(QString::fromLatin1(n.control)));
+        auto *control = qobject_cast<UserControl *>(object.get());
+        ASSERT_NE(control, nullptr) << n.control;
+        control->Load(bagWith(QString::fromLatin1(n.name), n.stored));
+        EXPECT_EQ(control->property(n.property).toLongLong(), n.value) << n.control << " " << n.name;
+    }
 }

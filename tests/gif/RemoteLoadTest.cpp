@@ -1,6 +1,8 @@
 #include "GifFiles.h"
 
+#include "gif/GifRemoteLoader.h"
 #include "gif/ucAniGIF.h"
+#include "platform/Settings.h"
 #include "platform/Twips.h"
 
 #include <QMap>
@@ -12,17 +14,24 @@
 
 #include <gtest/gtest.h>
 
+#include <functional>
+
+#include <sys/stat.h>
+
 using namespace zelctl;
 using zelctl::test::GifBuilder;
 
 namespace {
 
-// A minimal HTTP server on 127.0.0.1 that answers each path with a fixed body, or 404.
+// A minimal HTTP server on 127.0.0.1: each path has a handler that answers on the socket
+// once the request is complete; an unknown path gets 404.
 class TinyHttpServer : public QObject
 {
 public:
-    explicit TinyHttpServer(QMap<QString, QByteArray> bodies)
-        : m_bodies(std::move(bodies))
+    using Handler = std::function<void(QTcpSocket *)>;
+
+    explicit TinyHttpServer(QMap<QString, Handler> handlers)
+        : m_handlers(std::move(handlers))
     {
         connect(&m_server, &QTcpServer::newConnection, this, [this] {
             while (QTcpSocket *socket = m_server.nextPendingConnection()) {
@@ -33,9 +42,21 @@ public:
     }
 
     bool listen() { return m_server.listen(QHostAddress::LocalHost); }
+    void close() { m_server.close(); }
     QString url(const QString &path) const
     {
         return QStringLiteral("http://127.0.0.1:%1%2").arg(m_server.serverPort()).arg(path);
+    }
+    int requests() const { return m_count; }
+
+    // A whole body with its length, then the connection closes.
+    static Handler body(const QByteArray &bytes)
+    {
+        return [bytes](QTcpSocket *socket) {
+            socket->write("HTTP/1.1 200 OK\r\nContent-Type: image/gif\r\nConnection: close\r\nContent-Length: "
+                + QByteArray::number(bytes.size()) + "\r\n\r\n" + bytes);
+            socket->disconnectFromHost();
+        };
     }
 
 private:
@@ -46,32 +67,40 @@ private:
         if (!request.contains("\r\n\r\n"))
             return;
         const QString path = QString::fromLatin1(request.split(' ').value(1));
-        QByteArray response;
-        if (m_bodies.contains(path)) {
-            const QByteArray &body = m_bodies[path];
-            response = "HTTP/1.1 200 OK\r\nContent-Type: image/gif\r\nConnection: close\r\nContent-Length: "
-                + QByteArray::number(body.size()) + "\r\n\r\n" + body;
-        } else {
-            response = "HTTP/1.1 404 Not Found\r\nConnection: close\r\nContent-Length: 0\r\n\r\n";
-        }
         m_requests.remove(socket);
-        socket->write(response);
+        ++m_count;
+        const auto handler = m_handlers.constFind(path);
+        if (handler != m_handlers.cend()) {
+            (*handler)(socket);
+            return;
+        }
+        socket->write("HTTP/1.1 404 Not Found\r\nConnection: close\r\nContent-Length: 0\r\n\r\n");
         socket->disconnectFromHost();
     }
 
     QTcpServer m_server;
-    QMap<QString, QByteArray> m_bodies;
+    QMap<QString, Handler> m_handlers;
     QMap<QTcpSocket *, QByteArray> m_requests;
+    int m_count = 0;
 };
 
 const QByteArray twoFrames = GifBuilder(7, 5, { 0xFF0000, 0x00FF00 }).solid(0, 0, 7, 5, 0).solid(1, 1, 2, 2, 1).bytes();
+
+// The transfer timeout for the tests that wait for it, back to the default afterwards.
+class TimeoutSetting
+{
+public:
+    explicit TimeoutSetting(const QString &seconds) { platform::SaveSetting("ZEL", "Config", "giftimeout", seconds); }
+    ~TimeoutSetting() { platform::DeleteSetting("ZEL", "Config", "giftimeout"); }
+};
 
 } // namespace
 
 TEST(RemoteLoad, readsAGifOverHttpWithoutBlocking)
 {
     TinyHttpServer server(
-        { { "/anim.gif", twoFrames }, { "/short.gif", "GIF89a\7\0\5\0" }, { "/text", "no GIF here at all" } });
+        { { "/anim.gif", TinyHttpServer::body(twoFrames) }, { "/short.gif", TinyHttpServer::body("GIF89a\7\0\5\0") },
+            { "/text", TinyHttpServer::body("no GIF here at all") } });
     ASSERT_TRUE(server.listen());
     ucAniGIF gif;
     gif.setStretch(ucAniGIF::gfsClip);
@@ -85,48 +114,142 @@ TEST(RemoteLoad, readsAGifOverHttpWithoutBlocking)
 
     gif.LoadAnimatedGIF_Remote(server.url("/anim.gif"));
     EXPECT_EQ(gif.FrameCount(), 0) << "the call returns before the data arrives";
-    QTRY_COMPARE(gif.FrameCount(), 2);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return gif.FrameCount() == 2; }));
     ASSERT_EQ(announced.size(), 1);
     EXPECT_EQ(announced[0], std::make_pair(platform::twipsFromPixels(7), platform::twipsFromPixels(5)));
 
     cancel = true;
     ASSERT_TRUE(gif.LoadAnimatedGIF_Array(GifBuilder(2, 2, { 0, 0xFFFFFF }).solid(0, 0, 2, 2, 1).bytes()));
     gif.LoadAnimatedGIF_Remote(server.url("/anim.gif"));
-    QTRY_COMPARE(announced.size(), 2);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return announced.size() == 2; }));
     EXPECT_EQ(gif.FrameCount(), 1) << "a cancelled load keeps the GIF shown";
 
     for (const char *path : { "/short.gif", "/text", "/missing.gif" }) {
-        const int before = int(failed.count());
+        const qsizetype before = failed.count();
         gif.LoadAnimatedGIF_Remote(server.url(path));
-        QTRY_COMPARE(failed.count(), before + 1);
+        ASSERT_TRUE(QTest::qWaitFor([&] { return failed.count() == before + 1; })) << path;
         EXPECT_EQ(gif.FrameCount(), 1) << path << " changed nothing";
     }
     EXPECT_EQ(announced.size(), 2);
 }
 
-TEST(RemoteLoad, readsLocalPathsAndFileAddresses)
+TEST(RemoteLoad, readsLocalPathsAndFileAddressesButNoFifo)
 {
     QTemporaryDir dir;
     QFile file(dir.filePath("local.gif"));
     ASSERT_TRUE(file.open(QIODevice::WriteOnly));
     file.write(twoFrames);
     file.close();
+    const QString fifo = dir.filePath("fifo.gif");
+    ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
 
     ucAniGIF gif;
     QSignalSpy complete(&gif, &ucAniGIF::RemoteLoadComplete);
     QSignalSpy failed(&gif, &ucAniGIF::RemoteLoadFailure);
     gif.LoadAnimatedGIF_Remote(file.fileName());
-    QTRY_COMPARE(gif.FrameCount(), 2);
-    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(QByteArray()) == false);
+    EXPECT_EQ(gif.FrameCount(), 0) << "a local file is read later too";
+    ASSERT_TRUE(QTest::qWaitFor([&] { return gif.FrameCount() == 2; }));
+    ASSERT_FALSE(gif.LoadAnimatedGIF_Array(QByteArray()));
     gif.LoadAnimatedGIF_Remote(QUrl::fromLocalFile(file.fileName()).toString());
-    QTRY_COMPARE(gif.FrameCount(), 2);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return gif.FrameCount() == 2; }));
     EXPECT_EQ(complete.count(), 2);
 
-    gif.LoadAnimatedGIF_Remote(dir.filePath("absent.gif"));
-    QTRY_COMPARE(failed.count(), 1);
+    // A FIFO without a writer would block the reading thread for ever.
+    for (const QString &path : { dir.filePath("absent.gif"), fifo, QUrl::fromLocalFile(fifo).toString() }) {
+        const qsizetype before = failed.count();
+        gif.LoadAnimatedGIF_Remote(path);
+        ASSERT_TRUE(QTest::qWaitFor([&] { return failed.count() == before + 1; })) << path.toStdString();
+    }
     gif.LoadAnimatedGIF_Remote("ftp://127.0.0.1/x.gif");
-    EXPECT_EQ(failed.count(), 2) << "an address that cannot be read fails at once";
+    EXPECT_EQ(failed.count(), 4) << "an address that cannot be read fails at once";
     gif.LoadAnimatedGIF_Remote("");
     QTest::qWait(20);
-    EXPECT_EQ(failed.count(), 2) << "an empty path does nothing";
+    EXPECT_EQ(failed.count(), 4) << "an empty path does nothing";
+    EXPECT_EQ(complete.count(), 2);
+}
+
+// Transfers that would never end, or end far beyond what a GIF may hold, fail.
+TEST(RemoteLoad, endsStalledHugeEndlessAndCircularTransfers)
+{
+    qint64 endlessSent = 0;
+    TinyHttpServer server({
+        // Announces 100 bytes and sends 20.
+        { "/stalled.gif",
+            [](QTcpSocket *socket) {
+                socket->write("HTTP/1.1 200 OK\r\nContent-Length: 100\r\n\r\n" + twoFrames.left(20));
+            } },
+        // Announces 2 GB and sends one chunk.
+        { "/huge.gif",
+            [](QTcpSocket *socket) {
+                socket->write("HTTP/1.1 200 OK\r\nContent-Length: 2147483648\r\n\r\n" + twoFrames);
+            } },
+        // A body without a length that never ends: a new chunk whenever the last is out.
+        { "/endless.gif",
+            [&](QTcpSocket *socket) {
+                const QByteArray chunk = twoFrames + QByteArray(64 * 1024, 'x');
+                socket->write("HTTP/1.1 200 OK\r\nConnection: close\r\n\r\n" + chunk);
+                QObject::connect(socket, &QTcpSocket::bytesWritten, socket, [socket, chunk, &endlessSent](qint64 n) {
+                    endlessSent += n;
+                    if (socket->bytesToWrite() == 0 && socket->state() == QAbstractSocket::ConnectedState)
+                        socket->write(chunk);
+                });
+            } },
+        { "/loop.gif",
+            [](QTcpSocket *socket) {
+                socket->write("HTTP/1.1 302 Found\r\nLocation: /loop.gif\r\nContent-Length: 0\r\n\r\n");
+                socket->disconnectFromHost();
+            } },
+    });
+    ASSERT_TRUE(server.listen());
+
+    {
+        const TimeoutSetting timeout("1");
+        ucAniGIF gif;
+        QSignalSpy failed(&gif, &ucAniGIF::RemoteLoadFailure);
+        gif.LoadAnimatedGIF_Remote(server.url("/stalled.gif"));
+        ASSERT_TRUE(QTest::qWaitFor([&] { return failed.count() == 1; }, 10000)) << "the transfer timeout ends it";
+    }
+
+    ucAniGIF gif;
+    QSignalSpy failed(&gif, &ucAniGIF::RemoteLoadFailure);
+    QSignalSpy complete(&gif, &ucAniGIF::RemoteLoadComplete);
+    gif.LoadAnimatedGIF_Remote(server.url("/huge.gif"));
+    ASSERT_TRUE(QTest::qWaitFor([&] { return failed.count() == 1; }, 10000))
+        << "refused once the length is known, long before the 30 s timeout";
+
+    const int before = server.requests();
+    gif.LoadAnimatedGIF_Remote(server.url("/loop.gif"));
+    ASSERT_TRUE(QTest::qWaitFor([&] { return failed.count() == 2; }));
+    EXPECT_LE(server.requests() - before, GifRemoteLoader::MaxRedirects + 1);
+    EXPECT_TRUE(complete.isEmpty());
+
+    // The control's own limit is 256 MiB; a loader with a smaller one shows the same rule
+    // without sending that much.
+    GifRemoteLoader loader;
+    loader.setMaxBytes(1 << 20);
+    QSignalSpy loaderFailed(&loader, &GifRemoteLoader::failed);
+    ASSERT_TRUE(loader.start(server.url("/endless.gif")));
+    ASSERT_TRUE(QTest::qWaitFor([&] { return loaderFailed.count() == 1; }, 10000));
+    EXPECT_LT(endlessSent, 16 << 20) << "abandoned once past the limit";
+}
+
+TEST(RemoteLoad, aKeptCopyStandsInWhenTheNetworkFails)
+{
+    TinyHttpServer server({ { "/anim.gif", TinyHttpServer::body(twoFrames) } });
+    ASSERT_TRUE(server.listen());
+    const QString url = server.url("/anim.gif");
+    const QString other = server.url("/other.gif");
+    ucAniGIF gif;
+    QSignalSpy complete(&gif, &ucAniGIF::RemoteLoadComplete);
+    QSignalSpy failed(&gif, &ucAniGIF::RemoteLoadFailure);
+    gif.LoadAnimatedGIF_Remote(url);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return gif.FrameCount() == 2; }));
+
+    server.close();
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(GifBuilder(2, 2, { 0, 0xFFFFFF }).solid(0, 0, 2, 2, 1).bytes()));
+    gif.LoadAnimatedGIF_Remote(url);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return complete.count() == 2; })) << "the kept copy is loaded";
+    EXPECT_EQ(gif.FrameCount(), 2);
+    gif.LoadAnimatedGIF_Remote(other);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return failed.count() == 1; })) << "nothing is kept for another address";
 }

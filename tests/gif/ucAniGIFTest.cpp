@@ -2,6 +2,7 @@
 
 #include "gif/GifCanvas.h"
 #include "gif/GifFrames.h"
+#include "gif/GifLimits.h"
 #include "gif/ucAniGIF.h"
 #include "platform/Twips.h"
 
@@ -12,6 +13,10 @@
 #include <QTest>
 
 #include <gtest/gtest.h>
+
+#include <limits>
+
+#include <sys/stat.h>
 
 using namespace zelctl;
 using zelctl::test::GifBuilder;
@@ -186,14 +191,28 @@ TEST_F(AniGif, stretchModesSizeAndScaleThePicture)
     gif.setOffsetX(2);
     gif.setOffsetY(-1);
     EXPECT_EQ(picture(), QStringList({ "..RRR.", "..RRR.", "..RRR.", "......" }));
+    // Any Long is an offset; a picture wholly beside the control is simply not seen.
+    const QStringList nothing = { "......", "......", "......", "......" };
+    for (const auto &[x, y] :
+        { std::pair { std::numeric_limits<qint32>::min(), 0 }, { std::numeric_limits<qint32>::max(), 0 },
+            { 0, std::numeric_limits<qint32>::min() }, { -6, std::numeric_limits<qint32>::max() }, { 6, 0 } }) {
+        gif.setOffsetX(x);
+        gif.setOffsetY(y);
+        EXPECT_EQ(picture(), nothing) << x << ", " << y;
+    }
 }
 
 TEST_F(AniGif, timerRules)
 {
     gif.setMinFrameDelay(5);
     EXPECT_EQ(gif.MinFrameDelay(), 10);
-    gif.setMinFrameDelay(32767);
+    gif.setMinFrameDelay(40000);
     EXPECT_EQ(gif.MinFrameDelay(), 32700);
+    for (const int milliseconds : { 40000, 70000 }) {
+        gif.setMinFrameDelay(10);
+        ASSERT_TRUE(gif.setProperty("MinFrameDelay", milliseconds));
+        EXPECT_EQ(gif.property("MinFrameDelay").toInt(), 32700) << "set by name to " << milliseconds;
+    }
     gif.setMinFrameDelay(10);
 
     const QByteArray three = GifBuilder(2, 2, palette)
@@ -360,12 +379,27 @@ TEST_F(AniGif, badInputLoadsNothing)
     QTemporaryDir dir;
     const QByteArray good = layeredGif();
     ASSERT_TRUE(gif.LoadAnimatedGIF_Array(good));
-    EXPECT_FALSE(gif.LoadAnimatedGIF_File(dir.filePath("missing.gif")));
-    EXPECT_EQ(gif.FrameCount(), 4) << "a file that cannot be read loses nothing";
+    // A load that fails releases the GIF shown, so FrameCount tells the host it failed.
+    QFile empty(dir.filePath("empty.gif"));
+    ASSERT_TRUE(empty.open(QIODevice::WriteOnly));
+    empty.close();
+    const QString fifo = dir.filePath("fifo.gif");
+    ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
+    QFile large(dir.filePath("large.gif"));
+    ASSERT_TRUE(large.open(QIODevice::WriteOnly));
+    ASSERT_TRUE(large.write(good) == good.size() && large.resize(gifLimits::MaxFileBytes + 1));
+    large.close();
+    for (const QString &path : { dir.filePath("missing.gif"), empty.fileName(), dir.path(), fifo,
+             QStringLiteral("/dev/zero"), large.fileName() }) {
+        ASSERT_TRUE(gif.LoadAnimatedGIF_Array(good));
+        EXPECT_FALSE(gif.LoadAnimatedGIF_File(path)) << path.toStdString();
+        EXPECT_EQ(gif.FrameCount(), 0) << path.toStdString();
+        EXPECT_EQ(gif.LoopsRemaining(), -1);
+    }
+    EXPECT_EQ(picture(), QStringList({ "......", "......", "......", "......" }));
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(good));
     EXPECT_FALSE(gif.LoadAnimatedGIF_Array(QByteArray("GIF89a")));
     EXPECT_EQ(gif.FrameCount(), 0) << "bytes without a frame empty the control";
-    EXPECT_EQ(gif.LoopsRemaining(), -1);
-    EXPECT_EQ(picture(), QStringList({ "......", "......", "......", "......" }));
 
     QFile file(dir.filePath("cut.gif"));
     ASSERT_TRUE(file.open(QIODevice::WriteOnly));

@@ -1,5 +1,6 @@
 #include "PngTestFiles.h"
 
+#include "png/PngChunkReader.h"
 #include "png/StdPNG.h"
 #include "support/TestSupport.h"
 
@@ -7,6 +8,8 @@
 #include <QTemporaryDir>
 
 #include <gtest/gtest.h>
+
+#include <sys/stat.h>
 
 using namespace zelctl;
 using namespace zelctl::test;
@@ -326,7 +329,19 @@ TEST(PngReader, loadsFromDiskAndReportsFilesItCannotOpen)
     EXPECT_EQ(image.FailureReason(), "");
     EXPECT_FALSE(image.LoadFile(folder.filePath("missing.png")));
     EXPECT_EQ(image.FailureReason(), "The file cannot be read.");
-    EXPECT_FALSE(image.LoadFile(folder.path()));
+    // Nothing that is not a file of a bounded size is read: a directory, a FIFO without a
+    // writer (which would block), an endless device, a file past the bound.
+    const QString fifo = folder.filePath("fifo");
+    ASSERT_EQ(mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
+    for (const QString &notAFile : { folder.path(), fifo, QStringLiteral("/dev/zero") }) {
+        EXPECT_FALSE(image.LoadFile(notAFile));
+        EXPECT_EQ(image.FailureReason(), "The file cannot be read.");
+    }
+    QFile huge(folder.filePath("huge.png"));
+    ASSERT_TRUE(huge.open(QIODevice::WriteOnly) && huge.write(smallFile()) > 0 && huge.resize(png::MaxFileBytes + 1));
+    huge.close();
+    EXPECT_FALSE(image.LoadFile(huge.fileName()));
+    EXPECT_EQ(image.FailureReason(), "Image is too large to process. Cannot continue.");
 }
 
 TEST(PngReader, replaysEveryFileTheFuzzerFound)

@@ -1,0 +1,133 @@
+#include "platform/FileRead.h"
+#include "platform/Settings.h"
+
+#include <QDir>
+#include <QFile>
+#include <QFileInfo>
+#include <QTemporaryDir>
+
+#include <gtest/gtest.h>
+
+#include <thread>
+
+#include <csignal>
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+using namespace zelctl::platform;
+
+namespace {
+
+QString writeFile(const QString &path, const QByteArray &bytes)
+{
+    QFile file(path);
+    EXPECT_TRUE(file.open(QIODevice::WriteOnly));
+    file.write(bytes);
+    return path;
+}
+
+bool makeFifo(const QString &path)
+{
+    return ::mkfifo(QFile::encodeName(path).constData(), 0600) == 0;
+}
+
+} // namespace
+
+TEST(FileRead, readsRegularFilesWithinTheBoundAndRefusesTheRestAtOnce)
+{
+    QTemporaryDir dir;
+    const QString fifo = dir.filePath("fifo");
+    ASSERT_TRUE(makeFifo(fifo));
+    const QString link = dir.filePath("link");
+    ASSERT_TRUE(QFile::link(fifo, link));
+
+    const struct
+    {
+        QString path;
+        FileRead::Status status;
+        QByteArray bytes;
+    } cases[] = {
+        { writeFile(dir.filePath("ten"), "0123456789"), FileRead::Ok, "0123456789" },
+        { writeFile(dir.filePath("empty"), ""), FileRead::Ok, "" },
+        { writeFile(dir.filePath("eleven"), "0123456789A"), FileRead::TooLarge, "" },
+        { dir.filePath("missing"), FileRead::Unreadable, "" },
+        { dir.path(), FileRead::NotRegularFile, "" },
+        { fifo, FileRead::NotRegularFile, "" },
+        { link, FileRead::NotRegularFile, "" },
+        { "/dev/zero", FileRead::NotRegularFile, "" },
+    };
+    for (const auto &c : cases) {
+        const FileRead read = readFile(c.path, 10);
+        EXPECT_EQ(read.status, c.status) << c.path.toStdString();
+        EXPECT_EQ(read.bytes, c.bytes) << c.path.toStdString();
+        EXPECT_EQ(read.ok(), read.message(10).isEmpty());
+        // What a save must not replace; a missing file may be made.
+        EXPECT_EQ(isSpecialFile(c.path), c.status == FileRead::NotRegularFile) << c.path.toStdString();
+    }
+    EXPECT_EQ(readFile(dir.filePath("missing"), 10).message(10), QStringLiteral("No such file or directory"));
+    EXPECT_EQ(readFile("/dev/zero", 10).message(10), QStringLiteral("is not a regular file"));
+    EXPECT_EQ(readFile(dir.filePath("eleven"), 10).message(10), QStringLiteral("is larger than 10 bytes"));
+
+    // Files under /proc report no size, yet have content; and no more than the bound is read.
+    const FileRead status = readFile("/proc/self/status", 1 << 20);
+    ASSERT_TRUE(status.ok());
+    EXPECT_TRUE(status.bytes.startsWith("Name:"));
+    EXPECT_EQ(readFile("/proc/self/status", 10).status, FileRead::TooLarge);
+}
+
+TEST(FileRead, readsAPipeOnlyWhenAskedAndOnlyUpToTheBound)
+{
+    int ends[2];
+    ASSERT_EQ(::pipe(ends), 0);
+    const QString path = QStringLiteral("/proc/self/fd/%1").arg(ends[0]);
+    EXPECT_EQ(readFile(path, 1 << 20).status, FileRead::NotRegularFile);
+
+    // An endless writer: the read stops one byte past the bound.
+    std::signal(SIGPIPE, SIG_IGN);
+    std::thread writer([fd = ends[1]] {
+        const QByteArray block(4096, 'z');
+        while (::write(fd, block.constData(), size_t(block.size())) > 0) { }
+        ::close(fd);
+    });
+    const FileRead endless = readFile(path, 1 << 20, Pipes::Read);
+    ::close(ends[0]);
+    writer.join();
+    EXPECT_EQ(endless.status, FileRead::TooLarge);
+
+    ASSERT_EQ(::pipe(ends), 0);
+    ASSERT_EQ(::write(ends[1], "GIF89a", 6), 6);
+    ::close(ends[1]);
+    const FileRead six = readFile(QStringLiteral("/proc/self/fd/%1").arg(ends[0]), 10, Pipes::Read);
+    ::close(ends[0]);
+    EXPECT_EQ(six.bytes, QByteArray("GIF89a"));
+}
+
+// A settings file that is a link: to a regular file it is written through, keeping the
+// link; to a FIFO it is neither read (which would wait for a writer) nor replaced.
+TEST(Settings, aLinkedStoreIsWrittenThroughOrLeftAlone)
+{
+    QTemporaryDir dir;
+    const QString store = settingsFile("zEL-linked");
+    ASSERT_TRUE(QDir().mkpath(QFileInfo(store).absolutePath()));
+    const QString target = writeFile(dir.filePath("kept.ini"), "[Setup]\nOther=1\n");
+    ASSERT_TRUE(QFile::link(target, store));
+    SaveSetting("zEL-linked", "Setup", "RootPath", "/opt/zel/");
+    EXPECT_TRUE(QFileInfo(store).isSymLink());
+    EXPECT_EQ(GetSetting("zEL-linked", "Setup", "RootPath"), QStringLiteral("/opt/zel/"));
+    QFile written(target);
+    ASSERT_TRUE(written.open(QIODevice::ReadOnly));
+    const QByteArray text = written.readAll();
+    EXPECT_TRUE(text.contains("RootPath=/opt/zel/") && text.contains("Other=1")) << text.toStdString();
+
+    ASSERT_TRUE(QFile::remove(store));
+    const QString fifo = dir.filePath("fifo.ini");
+    ASSERT_TRUE(makeFifo(fifo));
+    ASSERT_TRUE(QFile::link(fifo, store));
+    EXPECT_EQ(GetSetting("zEL-linked", "Setup", "RootPath", "none"), QStringLiteral("none"));
+    SaveSetting("zEL-linked", "Setup", "RootPath", "/opt/zel/");
+    DeleteSetting("zEL-linked", "Setup", "RootPath");
+    EXPECT_TRUE(QFileInfo(store).isSymLink());
+    EXPECT_TRUE(isSpecialFile(fifo)) << "the FIFO was not replaced";
+    QFile::remove(store);
+}
