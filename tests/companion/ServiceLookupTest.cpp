@@ -167,17 +167,17 @@ TEST_F(ServiceLookup, theFormMayGoWhileTheServiceIsAskedOrFromTheLookupsEvents)
     {
         NifForm nif;
         QTest::keyClicks(nif.control->findChild<QLineEdit *>("nif"), "123456789");
-        QTRY_COMPARE(service.requests().size(), 1);
+        ASSERT_TRUE(QTest::qWaitFor([&] { return service.requests().size() == 1; }));
     }
     // The request went with the control.
-    QTRY_COMPARE(service.abandoned(), 1);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return service.abandoned() == 1; }));
 
     service.answerWith(FakeVatService::holder("ANA", "1000-001 LISBOA"));
     auto *form = new NifForm;
     QObject::connect(form->control, &cNIF::DataFinished, [form] { delete form; });
     QPointer<cNIF> control(form->control);
     QTest::keyClicks(control->findChild<QLineEdit *>("nif"), "123456789");
-    QTRY_VERIFY(control.isNull());
+    ASSERT_TRUE(QTest::qWaitFor([&] { return control.isNull(); }));
 
     EXPECT_FALSE(finishesWhenDeletedFrom(settings(), &NIFGrabber::Starting));
     EXPECT_FALSE(finishesWhenDeletedFrom(settings(), &NIFGrabber::ReceivedInformation));

@@ -74,12 +74,12 @@ TEST(UserControlLifeCycle, newControlRunsInitPropertiesThenLayoutThenSaveThenTer
     control->resize(40, 20);
     form.show();
     ASSERT_TRUE(QTest::qWaitForWindowExposed(&form));
-    QTRY_VERIFY(calls.contains("Paint"));
+    ASSERT_TRUE(QTest::qWaitFor([&] { return calls.contains("Paint"); }));
     const PropertyBag saved = control->Save();
     control->Release();
     control->Release();
     QSignalSpy gone(control, &QObject::destroyed);
-    QTRY_COMPARE(gone.count(), 1);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return gone.count() == 1; }));
 
     EXPECT_EQ(calls,
         QStringList({ "Initialize", "InitProperties", "Resize", "Show", "Paint", "WriteProperties", "Terminate" }));

@@ -32,7 +32,7 @@ TEST(GifAnimator, loopsEndOnTheFirstFrameAfterTheLastLoop)
     QSignalSpy ended(&clock, &GifAnimator::loopsEnded);
     ASSERT_TRUE(clock.start());
     EXPECT_FALSE(clock.start()) << "already playing";
-    QTRY_COMPARE_WITH_TIMEOUT(ended.count(), 1, 5000);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return ended.count() == 1; }, 5000));
     EXPECT_EQ(shown, QList<int>({ 2, 3, 1, 2, 3, 1 }));
     EXPECT_EQ(clock.state(), GifAnimator::Stopped);
     EXPECT_EQ(clock.loopsDone(), 0) << "the count starts again";

@@ -236,7 +236,7 @@ TEST_F(AniGif, timerRules)
     QSignalSpy ended(&gif, &ucAniGIF::LoopsEnded);
     gif.setAction(ucAniGIF::gfaPlay);
     EXPECT_EQ(gif.Action(), ucAniGIF::gfaPlay);
-    QTRY_COMPARE_WITH_TIMEOUT(ended.count(), 1, 5000);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return ended.count() == 1; }, 5000));
     EXPECT_EQ(frames, QList<int>({ 2, 3, 1, 2, 3, 1 }));
     EXPECT_EQ(gif.LoopsRemaining(), 2) << "the count was reset";
     EXPECT_EQ(gif.Action(), ucAniGIF::gfaStop);
@@ -264,7 +264,7 @@ TEST_F(AniGif, startsByItselfAfterTheFirstFrameUnlessAskedNotTo)
     ASSERT_TRUE(gif.LoadAnimatedGIF_Array(two));
     EXPECT_EQ(picture(), QStringList({ "RR", "RR" })) << "the first frame shows at once";
     EXPECT_EQ(gif.Action(), ucAniGIF::gfaStop);
-    QTRY_COMPARE(gif.Action(), ucAniGIF::gfaPlay);
+    ASSERT_TRUE(QTest::qWaitFor([&] { return gif.Action() == ucAniGIF::gfaPlay; }));
 
     gif.setDelayAnimation(ucAniGIF::gfdDoNotAnimate);
     ASSERT_TRUE(gif.LoadAnimatedGIF_Array(two));
@@ -498,6 +498,6 @@ TEST(AniGifLifetime, theHostMayDeleteItInMouseUpClickOrRemoteLoadComplete)
             gif->LoadAnimatedGIF_Remote(file.fileName());
         else
             QTest::mouseClick(gif, Qt::LeftButton, {}, QPoint(2, 2));
-        QTRY_VERIFY2(alive.isNull(), event);
+        ASSERT_TRUE(QTest::qWaitFor([&] { return alive.isNull(); })) << event;
     }
 }

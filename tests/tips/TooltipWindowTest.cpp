@@ -46,18 +46,18 @@ TEST_F(HoverTip, appearsAfterTheInitialDelayAndHidesAfterTheDisplayTime)
     EXPECT_FALSE(window()->isVisible());
     QTest::mouseMove(tool, QPoint(30, 10));
     EXPECT_FALSE(window()->isVisible()) << "the pointer has not rested yet";
-    QTRY_VERIFY(window()->isVisible());
+    ASSERT_TRUE(QTest::qWaitFor([&] { return window()->isVisible(); }));
     // The stem points at the pointer; the balloon lies below it.
     EXPECT_EQ(window()->anchor(), tool->mapToGlobal(QPoint(30, 10)));
     EXPECT_TRUE(window()->placement().stemUp);
     EXPECT_GT(window()->geometry().bottom(), window()->anchor().y());
-    QTRY_VERIFY(!window()->isVisible());
+    ASSERT_TRUE(QTest::qWaitFor([&] { return !window()->isVisible(); }));
 
     // Resting on after the display time brings no second tip; leaving and coming back does.
     QTest::mouseMove(tool, QPoint(31, 10));
     QTest::mouseMove(&form, QPoint(250, 150));
     QTest::mouseMove(tool, QPoint(40, 12));
-    QTRY_VERIFY(window()->isVisible());
+    ASSERT_TRUE(QTest::qWaitFor([&] { return window()->isVisible(); }));
 }
 
 TEST_F(HoverTip, leavingOrPressingOnTheToolHidesTheTip)
@@ -65,12 +65,12 @@ TEST_F(HoverTip, leavingOrPressingOnTheToolHidesTheTip)
     tip.SetTimeout(50, 60000);
     tip.Create();
     QTest::mouseMove(tool, QPoint(10, 10));
-    QTRY_VERIFY(window()->isVisible());
+    ASSERT_TRUE(QTest::qWaitFor([&] { return window()->isVisible(); }));
     QTest::mouseMove(&form, QPoint(250, 150));
     EXPECT_FALSE(window()->isVisible());
 
     QTest::mouseMove(tool, QPoint(12, 10));
-    QTRY_VERIFY(window()->isVisible());
+    ASSERT_TRUE(QTest::qWaitFor([&] { return window()->isVisible(); }));
     QTest::mousePress(tool, Qt::LeftButton, {}, QPoint(12, 10));
     EXPECT_FALSE(window()->isVisible());
     QTest::mouseRelease(tool, Qt::LeftButton, {}, QPoint(12, 10));
@@ -95,7 +95,7 @@ TEST_F(HoverTip, centredTipSitsUnderTheMiddleOfTheTool)
     tip.setCentered(true);
     tip.Create();
     QTest::mouseMove(tool, QPoint(5, 5));
-    QTRY_VERIFY(window()->isVisible());
+    ASSERT_TRUE(QTest::qWaitFor([&] { return window()->isVisible(); }));
     EXPECT_EQ(window()->anchor(), tool->mapToGlobal(QPoint(49, 39)));
     EXPECT_GE(window()->geometry().top(), window()->anchor().y());
 }
@@ -112,7 +112,7 @@ TEST_F(HoverTip, aToolByRectangleKeepsTheAreaOfCreate)
     QCoreApplication::processEvents();
     EXPECT_FALSE(window()->isVisible());
     QTest::mouseMove(tool, QPoint(50, 10));
-    QTRY_VERIFY(window()->isVisible());
+    ASSERT_TRUE(QTest::qWaitFor([&] { return window()->isVisible(); }));
 }
 
 TEST(TipShape, balloonStaysOnTheScreenAndPointsAtTheAnchor)
