@@ -12,15 +12,14 @@ Coverage::Coverage(const QRect &bounds)
 void Coverage::mark(int x, int y)
 {
     if (m_bounds.contains(x, y))
-        keep(y, x);
+        keep(y, x, x);
 }
 
-void Coverage::keep(int y, int x)
+void Coverage::keep(int y, int x0, int x1)
 {
-    const std::pair point(y, x);
-    if (!m_points.empty() && !(m_points.back() < point))
+    if (!m_spans.empty() && (y < m_spans.back().y || (y == m_spans.back().y && x0 <= m_spans.back().x1)))
         m_ordered = false;
-    m_points.push_back(point);
+    m_spans.push_back({ y, x0, x1 });
 }
 
 void Coverage::addPoint(int x, int y)
@@ -42,13 +41,21 @@ void Coverage::addDot(int x, int y, int diameter)
     const int reach = diameter / 2 + 1;
     const int top = std::max(y - reach, m_bounds.top()), bottom = std::min(y + reach, m_bounds.bottom());
     const int left = std::max(x - reach, m_bounds.left()), right = std::min(x + reach, m_bounds.right());
+    const auto inside = [&](int px, qint64 dy) {
+        const qint64 dx = 2 * qint64(px) + 1 - cx;
+        return dx * dx + dy * dy <= limit;
+    };
     for (int py = top; py <= bottom; ++py) {
         const qint64 dy = 2 * qint64(py) + 1 - cy;
-        for (int px = left; px <= right; ++px) {
-            const qint64 dx = 2 * qint64(px) + 1 - cx;
-            if (dx * dx + dy * dy <= limit)
-                keep(py, px);
-        }
+        // A row of a disc is one run: its first and last pixel inside the circle.
+        int first = left;
+        while (first <= right && !inside(first, dy))
+            ++first;
+        int last = right;
+        while (last >= first && !inside(last, dy))
+            --last;
+        if (first <= last)
+            keep(py, first, last);
     }
 }
 
@@ -94,21 +101,28 @@ void Coverage::addLine(int x0, int y0, int x1, int y1, int width)
 
 void Coverage::apply(const Surface &surface, quint32 value, PenMode mode) const
 {
-    // Each pixel once, so XOR marks it once; a single dot or straight line comes in order.
-    std::vector<std::pair<int, int>> sorted;
-    if (!m_ordered) {
-        sorted = m_points;
-        std::sort(sorted.begin(), sorted.end());
-        sorted.erase(std::unique(sorted.begin(), sorted.end()), sorted.end());
-    }
-    const std::vector<std::pair<int, int>> &points = m_ordered ? m_points : sorted;
     // XOR leaves the alpha of a 32-bit pixel as it was.
     const quint32 xorMask = surface.bpp == 32 ? value & 0xFFFFFFu : value;
-    for (const auto &[y, x] : points) {
+    const auto set = [&](int y, int x) {
         uchar *row = surface.row(y);
         const quint32 old = readPixel(row, x, surface.bpp);
         writePixel(row, x, surface.bpp, mode == PenMode::Xor ? old ^ xorMask : value);
+    };
+    // Each pixel once, so XOR marks it once; a single dot or straight line comes in order.
+    if (m_ordered) {
+        for (const Span &span : m_spans)
+            for (int x = span.x0; x <= span.x1; ++x)
+                set(span.y, x);
+        return;
     }
+    std::vector<std::pair<int, int>> points; // (y, x)
+    for (const Span &span : m_spans)
+        for (int x = span.x0; x <= span.x1; ++x)
+            points.emplace_back(span.y, x);
+    std::sort(points.begin(), points.end());
+    points.erase(std::unique(points.begin(), points.end()), points.end());
+    for (const auto &[y, x] : points)
+        set(y, x);
 }
 
 } // namespace zelctl::gdi::detail
