@@ -161,8 +161,35 @@ void painterAlpha(benchmark::State &state, quint8 constant)
     countPixels(state);
 }
 
+// The arrow box of a sub-menu item a host stretched to 4 × 60000 pixels: long pen lines,
+// nearly all of them beside the narrow target.
+void gdiLinesBesideTheTarget(benchmark::State &state)
+{
+    Pair dst(4, 60000, 32);
+    for (auto _ : state) {
+        for (int i = 0; i < 30000; i += 8) {
+            MoveToEx(dst.dc, i, i, nullptr);
+            LineTo(dst.dc, i, 60000 - i);
+        }
+    }
+}
+
+// The disc of a number badge a host made 3000 pixels wide.
+void gdiLargeDot(benchmark::State &state)
+{
+    Pair dst(3000, 3000, 32);
+    const HPEN pen = CreatePen(PS_SOLID, 2999, 0x404040);
+    SelectObject(dst.dc, pen);
+    for (auto _ : state)
+        benchmark::DoNotOptimize(PSet(dst.dc, 1500, 1500, 0x404040));
+    SelectObject(dst.dc, GetStockObject(BLACK_PEN));
+    DeleteObject(pen);
+}
+
 } // namespace
 
+BENCHMARK(gdiLinesBesideTheTarget)->Name("Gdi_LinesBesideTheTarget")->Unit(benchmark::kMillisecond);
+BENCHMARK(gdiLargeDot)->Name("Gdi_LargeDot")->Unit(benchmark::kMillisecond);
 BENCHMARK_CAPTURE(gdiBlit, Copy, 32, 32, SRCCOPY)->Name("Gdi_Copy")->Unit(benchmark::kMillisecond)->UseRealTime();
 BENCHMARK_CAPTURE(painterBlit, Copy, 32, 32, QPainter::CompositionMode_Source)
     ->Name("QPainter_Copy")

@@ -5,6 +5,7 @@
 #include <array>
 #include <atomic>
 #include <memory>
+#include <vector>
 
 namespace zelctl {
 
@@ -33,11 +34,32 @@ const std::array<ClassInfo, 15> publicClasses = {{
 std::atomic<int> liveObjects { 0 };
 std::atomic<int> locks { 0 };
 
-// Factories of the classes built into the library, keyed by class name.
-QHash<QString, std::shared_ptr<ClassFactory>> &factories()
+// Factories of the classes built into the library. A host may hold any factory it got from
+// DllGetClassObject for as long as the library is loaded, so one that is replaced stays
+// alive; `current` names the one each class uses now.
+struct Factories
 {
-    static QHash<QString, std::shared_ptr<ClassFactory>> table;
+    std::vector<std::unique_ptr<ClassFactory>> all;
+    QHash<QString, const ClassFactory *> current;
+};
+
+Factories &factories()
+{
+    static Factories table;
     return table;
+}
+
+// The documented name of a class, given its name or prog id in any case; null when none.
+const char *canonicalName(const QString &nameOrProgId)
+{
+    const QString prefix = QLatin1String(ClassRegistry::LibraryName) + QLatin1Char('.');
+    const QString name
+        = nameOrProgId.startsWith(prefix, Qt::CaseInsensitive) ? nameOrProgId.mid(prefix.size()) : nameOrProgId;
+    for (const ClassInfo &info : publicClasses) {
+        if (name.compare(QLatin1String(info.name), Qt::CaseInsensitive) == 0)
+            return info.name;
+    }
+    return nullptr;
 }
 
 } // namespace
@@ -54,7 +76,14 @@ QObject *ClassFactory::CreateInstance(QWidget *parent) const
 
 void ClassFactory::LockServer(bool lock)
 {
-    locks += lock ? 1 : -1;
+    if (lock) {
+        ++locks;
+        return;
+    }
+    // An unbalanced unlock is ignored: a count below zero would let the library unload
+    // under the next host that locks it.
+    int count = locks;
+    while (count > 0 && !locks.compare_exchange_weak(count, count - 1)) { }
 }
 
 int ClassFactory::serverLocks()
@@ -78,7 +107,9 @@ bool provide(const char *name, ClassCreator creator)
 {
     for (const ClassInfo &info : publicClasses) {
         if (qstrcmp(info.name, name) == 0) {
-            factories().insert(QLatin1String(name), std::make_shared<ClassFactory>(info, std::move(creator)));
+            Factories &table = factories();
+            table.all.push_back(std::make_unique<ClassFactory>(info, std::move(creator)));
+            table.current.insert(QLatin1String(info.name), table.all.back().get());
             return true;
         }
     }
@@ -89,16 +120,15 @@ const ClassFactory *factoryFor(const QUuid &classId)
 {
     for (const ClassInfo &info : publicClasses) {
         if (info.classId == classId)
-            return factories().value(QLatin1String(info.name)).get();
+            return factories().current.value(QLatin1String(info.name));
     }
     return nullptr;
 }
 
 const ClassFactory *factoryFor(const QString &nameOrProgId)
 {
-    const QString prefix = QLatin1String(LibraryName) + QLatin1Char('.');
-    const QString name = nameOrProgId.startsWith(prefix) ? nameOrProgId.mid(prefix.size()) : nameOrProgId;
-    return factories().value(name).get();
+    const char *name = canonicalName(nameOrProgId);
+    return name ? factories().current.value(QLatin1String(name)) : nullptr;
 }
 
 } // namespace ClassRegistry

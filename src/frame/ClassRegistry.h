@@ -40,7 +40,8 @@ public:
     // A new object, owned by the caller (or its parent). Never nullptr.
     QObject *CreateInstance(QWidget *parent = nullptr) const;
 
-    // Keeps the library loaded while a host holds factories for later use.
+    // Keeps the library loaded while a host holds factories for later use. An unlock
+    // without a lock before it is ignored.
     static void LockServer(bool lock);
     static int serverLocks();
 
@@ -58,17 +59,20 @@ ZELCTL_EXPORT QUuid typeLibraryId();
 // Every public class of the library, in their documented order.
 ZELCTL_EXPORT std::span<const ClassInfo> classes();
 
-// The factory of a class that is built into this library, or nullptr.
+// The factory of a class that is built into this library, or nullptr. Names and prog ids
+// are matched in any case, as prog ids are looked up on the original platform.
 ZELCTL_EXPORT const ClassFactory *factoryFor(const QUuid &classId);
 ZELCTL_EXPORT const ClassFactory *factoryFor(const QString &nameOrProgId);
 
-// Called once per class (through ZELCTL_REGISTER_CLASS) when the library loads.
+// Called once per class (through ZELCTL_REGISTER_CLASS) when the library loads. A later
+// call gives the class a new factory; the one it replaces stays valid while the library is
+// loaded, since a host may still hold it.
 ZELCTL_EXPORT bool provide(const char *name, ClassCreator creator);
 
 } // namespace ClassRegistry
 
-// Creates a public class by its name ("cNIF") or programmatic id ("UKAZELCTL.cNIF"), as a
-// script host would; nullptr for a name the library does not serve.
+// Creates a public class by its name ("cNIF") or programmatic id ("UKAZELCTL.cNIF"), in any
+// case, as a script host would; nullptr for a name the library does not serve.
 ZELCTL_EXPORT QObject *CreateObject(const QString &nameOrProgId, QWidget *parent = nullptr);
 
 // Counts the library's live public objects, so a host knows when it may unload it.

@@ -2,7 +2,7 @@
 
 #include "platform/WindowHandles.h"
 
-#include <QScopedValueRollback>
+#include <QPointer>
 
 namespace zelctl {
 
@@ -15,15 +15,23 @@ UserControl::~UserControl() = default;
 
 void UserControl::InitNew()
 {
-    // Taking the defaults or the saved values changes nothing the container must save.
-    const QScopedValueRollback quiet(m_quiet, true);
-    InitProperties();
+    quietly([this] { InitProperties(); });
 }
 
 void UserControl::Load(const PropertyBag &bag)
 {
-    const QScopedValueRollback quiet(m_quiet, true);
-    ReadProperties(bag);
+    quietly([this, &bag] { ReadProperties(bag); });
+}
+
+void UserControl::quietly(const std::function<void()> &step)
+{
+    // Taking the defaults or the saved values changes nothing the container must save. The
+    // step may raise events in which the host deletes the control.
+    const QPointer<UserControl> alive(this);
+    const bool wasQuiet = std::exchange(m_quiet, true);
+    step();
+    if (alive)
+        m_quiet = wasQuiet;
 }
 
 void UserControl::PropertyChanged(const QString &name)

@@ -9,6 +9,8 @@
 
 #include <QWidget>
 
+#include <functional>
+
 namespace zelctl {
 
 // Base of every control. It runs the life cycle a container expects:
@@ -62,6 +64,8 @@ protected:
     void PropertyChanged(const QString &name);
 
 private:
+    void quietly(const std::function<void()> &step);
+
     LiveObject m_live;
     Ambient m_ambient;
     Extender m_extender;

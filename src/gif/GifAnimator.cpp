@@ -1,5 +1,7 @@
 #include "GifAnimator.h"
 
+#include <QPointer>
+
 #include <algorithm>
 
 namespace zelctl {
@@ -89,7 +91,11 @@ void GifAnimator::tick()
     }
     if (ended)
         m_state = Stopped;
+    // The host may delete the control, and this animator with it, while the frame is drawn.
+    const QPointer<GifAnimator> alive(this);
     Q_EMIT advanced();
+    if (!alive)
+        return;
     if (ended)
         Q_EMIT loopsEnded();
     else if (m_state == Playing)

@@ -13,9 +13,11 @@
 
 #include <QBuffer>
 #include <QMouseEvent>
+#include <QPointer>
 #include <QTimer>
 
 #include <cmath>
+#include <cstdlib>
 #include <limits>
 
 namespace zelctl {
@@ -276,8 +278,9 @@ void ucAniGIF::Private::remoteArrived(const QByteArray &bytes)
     const int width = quint8(bytes[6]) | quint8(bytes[7]) << 8;
     const int height = quint8(bytes[8]) | quint8(bytes[9]) << 8;
     bool cancel = false;
+    const QPointer<ucAniGIF> alive(q);
     Q_EMIT q->RemoteLoadComplete(twipsFromPixels(width), twipsFromPixels(height), cancel);
-    if (!cancel)
+    if (alive && !cancel)
         load(bytes);
 }
 
@@ -621,7 +624,7 @@ void ucAniGIF::WriteProperties(PropertyBag &bag)
         bag.WriteProperty("MouseIcon", png);
     }
     bag.WriteProperty("MousePointer", d->mousePointer, 0);
-    bag.WriteProperty("Enabled", isEnabled(), true);
+    bag.WriteProperty("Enabled", Enabled(), true);
     bag.WriteProperty("OffsetX", d->offsetX, 0);
     bag.WriteProperty("OffsetY", d->offsetY, 0);
 }
@@ -706,11 +709,18 @@ void ucAniGIF::mousePressEvent(QMouseEvent *event)
 void ucAniGIF::mouseReleaseEvent(QMouseEvent *event)
 {
     const QPointF at = event->position();
+    const bool click
+        = std::exchange(d->pressed, false) && event->button() == Qt::LeftButton && rect().contains(at.toPoint());
+    const QPointer<ucAniGIF> alive(this);
     Q_EMIT MouseUp(buttonsOf(event->button()), shiftOf(event->modifiers()), float(twipsFromPixels(1) * at.x()),
         float(twipsFromPixels(1) * at.y()));
-    if (d->pressed && event->button() == Qt::LeftButton && rect().contains(at.toPoint()))
+    if (alive && click)
         Q_EMIT Click();
-    d->pressed = false;
+}
+
+void ucAniGIF::mouseDoubleClickEvent(QMouseEvent *)
+{
+    // The second press of a double click makes no second Click.
 }
 
 void ucAniGIF::mouseMoveEvent(QMouseEvent *event)

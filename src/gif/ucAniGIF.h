@@ -120,7 +120,8 @@ public:
     void setMouseIcon(const Picture &icon);
     qint32 MousePointer() const;
     void setMousePointer(qint32 pointer);
-    bool Enabled() const { return isEnabled(); }
+    // The control's own setting: a disabled form around it leaves this alone.
+    bool Enabled() const { return !testAttribute(Qt::WA_ForceDisabled); }
     qint32 OffsetX() const;
     void setOffsetX(qint32 pixels);
     qint32 OffsetY() const;
@@ -165,6 +166,7 @@ protected:
     void mousePressEvent(QMouseEvent *event) override;
     void mouseReleaseEvent(QMouseEvent *event) override;
     void mouseMoveEvent(QMouseEvent *event) override;
+    void mouseDoubleClickEvent(QMouseEvent *event) override;
 
 private:
     class Private;

@@ -287,7 +287,9 @@ QString cNIB::Text() const
 void cNIB::setText(const QString &text)
 {
     const bool complete = text.size() >= fullLength;
-    for (size_t i = 0; i < boxes.size(); ++i)
+    // Each box raises Changed, in which the host may delete the control.
+    const QPointer<cNIB> alive(this);
+    for (size_t i = 0; i < boxes.size() && alive; ++i)
         d->nib[i]->setText(complete ? text.mid(boxes[i].first, boxes[i].maxLength) : QString());
 }
 

@@ -21,7 +21,6 @@
 
 #include <QAction>
 #include <QClipboard>
-#include <QContextMenuEvent>
 #include <QGuiApplication>
 #include <QLineEdit>
 #include <QMimeData>
@@ -505,11 +504,11 @@ bool cNIF::eventFilter(QObject *watched, QEvent *event)
     const Private::Guard alive(this);
     switch (event->type()) {
     case QEvent::MouseButtonPress:
-        if (static_cast<QMouseEvent *>(event)->button() == Qt::RightButton) {
-            if (isEnabled())
-                PopupContextMenu();
+        // The right button's menu opens on the context menu event Qt sends right after the
+        // press: Qt touches the pressed box no more after that one, so the host may delete
+        // the control while its menu is open.
+        if (static_cast<QMouseEvent *>(event)->button() == Qt::RightButton)
             return true;
-        }
         break;
     case QEvent::MouseButtonRelease: {
         const auto *mouse = static_cast<QMouseEvent *>(event);
@@ -543,9 +542,8 @@ bool cNIF::eventFilter(QObject *watched, QEvent *event)
         break;
     }
     case QEvent::ContextMenu:
-        // The control's own menu replaces the box's: the right button opens it when pressed,
-        // the menu key here.
-        if (static_cast<QContextMenuEvent *>(event)->reason() == QContextMenuEvent::Keyboard && isEnabled())
+        // The control's own menu replaces the box's, for the right button and the menu key.
+        if (isEnabled())
             PopupContextMenu();
         return true;
     case QEvent::FocusIn:
@@ -657,8 +655,10 @@ void cNIF::setBackColor(OleColor color)
         setPalette(palette);
         PropertyChanged(QStringLiteral("BackColor"));
     }
+    const Private::Guard alive(this);
     setCountryID(d->country);
-    RefreshMe();
+    if (alive)
+        RefreshMe();
 }
 
 QString cNIF::CountryID() const
@@ -1006,9 +1006,12 @@ void cNIF::ReadProperties(const PropertyBag &bag)
     d->filter
         = GSEL_CountryFilterList(readLong(bag, QStringLiteral("Countries"), GSEL_OnlyPT, GSEL_OnlyPT, GSEL_Custom));
     d->customCountryList = bag.ReadProperty(QStringLiteral("CustomCountryList"), QString()).toString();
+    // The refresh raises events, in which the host may delete the control.
+    const Private::Guard alive(this);
     setBackColor(readColor(bag, QStringLiteral("BackColor"), White));
     // "Country" is what a saved control holds; a "CountryID" from the container wins.
-    setCountryID(bag.ReadProperty(QStringLiteral("CountryID"), saved).toString());
+    if (alive)
+        setCountryID(bag.ReadProperty(QStringLiteral("CountryID"), saved).toString());
 }
 
 void cNIF::WriteProperties(PropertyBag &bag)

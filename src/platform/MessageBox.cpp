@@ -2,6 +2,7 @@
 
 #include <QApplication>
 #include <QMessageBox>
+#include <QPointer>
 
 namespace zelctl::platform {
 
@@ -39,11 +40,32 @@ QMessageBox::StandardButtons qtButtons(MsgButtons buttons)
     return QMessageBox::Ok;
 }
 
+// What a box answers when it goes without the user's answer: its Escape button's answer.
+MsgResult unanswered(MsgButtons buttons)
+{
+    switch (buttons) {
+    case MsgButtons::OkCancel:
+    case MsgButtons::YesNoCancel:
+        return MsgResult::Cancel;
+    case MsgButtons::YesNo:
+        return MsgResult::No;
+    case MsgButtons::Ok:
+        break;
+    }
+    return MsgResult::Ok;
+}
+
 MsgResult showWithQt(const MessageBoxRequest &request)
 {
-    QMessageBox box(
+    // On the heap: the host may close the window it belongs to while it is open, which takes
+    // the box with it.
+    const QPointer<QMessageBox> box = new QMessageBox(
         qtIcon(request.icon), request.title, request.text, qtButtons(request.buttons), QApplication::activeWindow());
-    switch (box.exec()) {
+    const int answer = box->exec();
+    if (!box)
+        return unanswered(request.buttons);
+    delete box.data();
+    switch (answer) {
     case QMessageBox::Cancel:
         return MsgResult::Cancel;
     case QMessageBox::Yes:

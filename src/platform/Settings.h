@@ -11,11 +11,15 @@
 // or leads to, a FIFO or a device is neither read nor written (reads give the default).
 namespace zelctl::platform {
 
+// A value is read whole, also when a person wrote it by hand with a comma or a semicolon
+// in it; an absent key gives defaultValue.
 ZELCTL_EXPORT QString GetSetting(
     const QString &application, const QString &section, const QString &key, const QString &defaultValue = QString());
-ZELCTL_EXPORT void SaveSetting(
+// False, and nothing written, when the store could not be read or written: a user's file
+// that this library did not understand is never written over.
+ZELCTL_EXPORT bool SaveSetting(
     const QString &application, const QString &section, const QString &key, const QString &value);
-ZELCTL_EXPORT void DeleteSetting(const QString &application, const QString &section, const QString &key);
+ZELCTL_EXPORT bool DeleteSetting(const QString &application, const QString &section, const QString &key);
 
 // The INI file that holds an application's settings.
 ZELCTL_EXPORT QString settingsFile(const QString &application);

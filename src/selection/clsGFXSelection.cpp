@@ -37,6 +37,7 @@ struct Session
     QList<GFXItem> items;
     int pressed = -1;
     bool closing = false;
+    Session *outer = nullptr; // the dialog this one was opened from, if any
 
     QList<GFXItem> selection() const
     {
@@ -135,7 +136,17 @@ clsGFXSelection::clsGFXSelection(QObject *parent)
     , d(std::make_unique<clsGFXSelectionPrivate>())
 { }
 
-clsGFXSelection::~clsGFXSelection() = default;
+clsGFXSelection::~clsGFXSelection()
+{
+    // A host that drops the object while its dialogs are open gets them closed: nobody is
+    // left to read their answer.
+    for (Session *session = d->session; session; session = session->outer) {
+        if (session->form) {
+            session->form->setOwner(nullptr);
+            session->form->QDialog::done(QDialog::Rejected);
+        }
+    }
+}
 
 GFXResult clsGFXSelection::SelectFrom(const GFXSelection &s, const QList<GFXItem> &Items)
 {
@@ -156,14 +167,17 @@ GFXResult clsGFXSelection::SelectFrom(const GFXSelection &s, const QList<GFXItem
     Session session;
     session.form = new frmSelector(parentWindow);
     session.items = Items;
-    Session *const outer = d->session;
+    session.outer = d->session;
     d->session = &session;
     frmSelector &form = *session.form;
     form.setOwner(this);
 
+    // The host may delete this object from any of its events, or while the dialog is open;
+    // then the dialog closes and nothing of the object is touched again.
+    const QPointer<clsGFXSelection> alive(this);
     Q_EMIT Opening();
 
-    if (parentObject && session.form) {
+    if (alive && parentObject && session.form) {
         const QRect target
             = keptOnScreen(placeBeside(parentRect, form.width(), form.height(), s.WindowPositionRelation), parentRect);
         const QVariant backColor = parentObject->property("BackColor");
@@ -172,7 +186,7 @@ GFXResult clsGFXSelection::SelectFrom(const GFXSelection &s, const QList<GFXItem
         form.ZoomForm(parentRect, { target.left(), target.top(), target.right() + 1, target.bottom() + 1 });
     }
 
-    if (session.form) {
+    if (alive && session.form) {
         if (!s.Title.isEmpty())
             form.setWindowTitle(s.Title);
         auto *title = form.findChild<QLabel *>(QStringLiteral("lblTITLE"));
@@ -220,7 +234,12 @@ GFXResult clsGFXSelection::SelectFrom(const GFXSelection &s, const QList<GFXItem
         platform::showModal(form);
     }
 
-    d->session = outer;
+    if (!alive) {
+        delete session.form.data();
+        result.Canceled = true;
+        return result;
+    }
+    d->session = session.outer;
     if (session.form && session.form->Tag() == Ok) {
         result.Accepted = true;
         result.SelectedItems = session.selection();
@@ -251,8 +270,9 @@ void clsGFXSelection::OnSelectorEvent(QObject *source, const QString &eventName,
         QList<GFXItem> selected = session->selection();
         qint32 count = qint32(selected.size());
         bool cancelClose = false;
+        const QPointer<clsGFXSelection> alive(this);
         Q_EMIT Closing(count, selected, cancelClose);
-        if (cancelClose || d->session != session || !session->form)
+        if (!alive || cancelClose || d->session != session || !session->form)
             return;
         session->closing = true;
         form.setTag(eventName);
@@ -279,6 +299,7 @@ void clsGFXSelection::OnSelectorEvent(QObject *source, const QString &eventName,
         if (CommandButton *released = form.btnSelector()(previous))
             released->setValue(false);
         session->pressed = index;
+        const QPointer<clsGFXSelection> alive(this);
         if (previous >= 0) {
             GFXItem item = session->items.at(previous);
             item.Selected = false;
@@ -286,8 +307,12 @@ void clsGFXSelection::OnSelectorEvent(QObject *source, const QString &eventName,
         }
         GFXItem item = session->items.at(index);
         item.Selected = true;
-        Q_EMIT ItemChecked(item);
-        Q_EMIT ItemChanged(item);
+        if (alive)
+            Q_EMIT ItemChecked(item);
+        if (alive)
+            Q_EMIT ItemChanged(item);
+        if (!alive)
+            return;
     }
     if (doubleClick && d->session == session)
         OnSelectorEvent(source, Ok, {});

@@ -300,11 +300,16 @@ void frmSelector::ReArrange()
         return;
     d->grid->widget()->resize(pixelsFromTwips(layout.content.width()), pixelsFromTwips(layout.content.height()));
     const QPoint origin = layout.grid.topLeft();
+    // One paint for the whole pane once every item is in place: painting each item as it
+    // moves repaints every item it still overlaps, which for a long list is minutes.
+    QWidget *pane = d->grid->widget();
+    pane->setUpdatesEnabled(false);
     for (int i = 0; i < items.size(); ++i) {
         const QRect place = layout.items.at(i).translated(-origin);
         items[i]->Move(place.left(), place.top(), place.width(), place.height());
         items[i]->Refresh();
     }
+    pane->setUpdatesEnabled(true);
 }
 
 void frmSelector::applyFilter(const QString &text)

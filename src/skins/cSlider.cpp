@@ -58,6 +58,10 @@ cSlider::cSlider(QWidget *parent)
     styleButton(false);
     connect(d->cc, &CommandButton::Click, this, [this] { setSlideOpen(!d->open); });
     connect(d->cc, &CommandButton::MouseHover, this, [this](bool hovering) { styleButton(hovering); });
+    // Focus given to the slider (a label's buddy, a host's setFocus) lands on its button;
+    // Tab reaches the button and the host's controls inside, never the bare container.
+    setFocusPolicy(Qt::TabFocus);
+    setFocusProxy(d->cc);
     // The keyboard reaching a control hidden in the closed slider opens it, so the focus shows.
     connect(qApp, &QApplication::focusChanged, this, [this](QWidget *, QWidget *now) {
         if (!d->open && now && now != d->cc && isAncestorOf(now))
@@ -69,7 +73,11 @@ cSlider::cSlider(QWidget *parent)
     QMetaObject::invokeMethod(this, &cSlider::Slided, Qt::QueuedConnection);
 }
 
-cSlider::~cSlider() = default;
+cSlider::~cSlider()
+{
+    // A control inside gives up the focus while QWidget's destructor deletes it, after d is gone.
+    disconnect(qApp, &QApplication::focusChanged, this, nullptr);
+}
 
 bool cSlider::SlideOpen() const
 {

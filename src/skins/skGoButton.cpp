@@ -228,8 +228,8 @@ void skGoButton::resizeEvent(QResizeEvent *event)
 
 void skGoButton::mouseMoveEvent(QMouseEvent *event)
 {
-    skinCommon::raiseMouse(this, &skGoButton::MouseMove, event);
-    d->hover->moved(event);
+    if (skinCommon::raiseMouse(this, &skGoButton::MouseMove, event))
+        d->hover->moved(event);
 }
 
 void skGoButton::leaveEvent(QEvent *event)
@@ -240,7 +240,8 @@ void skGoButton::leaveEvent(QEvent *event)
 
 void skGoButton::mousePressEvent(QMouseEvent *event)
 {
-    skinCommon::raiseMouse(this, &skGoButton::MouseDown, event);
+    if (!skinCommon::raiseMouse(this, &skGoButton::MouseDown, event))
+        return;
     d->hover->pressed(event);
     if (event->button() == Qt::LeftButton) {
         if (!d->active) {
@@ -250,10 +251,15 @@ void skGoButton::mousePressEvent(QMouseEvent *event)
     }
 }
 
+void skGoButton::mouseDoubleClickEvent(QMouseEvent *)
+{
+    // The second press of a double click starts no click of its own: the first press already
+    // made one, and the button raises no double click.
+}
+
 void skGoButton::mouseReleaseEvent(QMouseEvent *event)
 {
-    skinCommon::raiseMouse(this, &skGoButton::MouseUp, event);
-    if (event->button() != Qt::LeftButton)
+    if (!skinCommon::raiseMouse(this, &skGoButton::MouseUp, event) || event->button() != Qt::LeftButton)
         return;
     if (d->active) {
         setActive(false);
@@ -304,8 +310,10 @@ void skGoButton::click()
     }
     if (changed)
         Repaint();
+    const QPointer<skGoButton> alive(this);
     Q_EMIT Click();
-    Q_EMIT MouseOut();
+    if (alive)
+        Q_EMIT MouseOut();
 }
 
 ZELCTL_REGISTER_CLASS(skGoButton)

@@ -6,6 +6,7 @@
 #include "frame/PropertyReaders.h"
 
 #include <QLabel>
+#include <QPointer>
 
 #include <array>
 
@@ -166,8 +167,10 @@ void skGrowth::WriteProperties(PropertyBag &bag)
 void skGrowth::resizeEvent(QResizeEvent *event)
 {
     SurfaceHost::resizeEvent(event);
+    const QPointer<skGrowth> alive(this);
     Q_EMIT Resize();
-    Repaint();
+    if (alive)
+        Repaint();
 }
 
 ZELCTL_REGISTER_CLASS(skGrowth)

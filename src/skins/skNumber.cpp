@@ -283,8 +283,7 @@ void skNumber::mousePressEvent(QMouseEvent *event)
 
 void skNumber::mouseReleaseEvent(QMouseEvent *event)
 {
-    skinCommon::raiseMouse(this, &skNumber::MouseUp, event);
-    if (d->hover->releasedForClick(event))
+    if (skinCommon::raiseMouse(this, &skNumber::MouseUp, event) && d->hover->releasedForClick(event))
         Q_EMIT Clicked();
 }
 

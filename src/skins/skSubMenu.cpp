@@ -345,8 +345,8 @@ void skSubMenu::focusOutEvent(QFocusEvent *event)
 
 void skSubMenu::mouseMoveEvent(QMouseEvent *event)
 {
-    skinCommon::raiseMouse(this, &skSubMenu::MouseMove, event);
-    d->hover->moved(event);
+    if (skinCommon::raiseMouse(this, &skSubMenu::MouseMove, event))
+        d->hover->moved(event);
 }
 
 void skSubMenu::leaveEvent(QEvent *event)
@@ -361,9 +361,15 @@ void skSubMenu::mousePressEvent(QMouseEvent *event)
     skinCommon::raiseMouse(this, &skSubMenu::MouseDown, event);
 }
 
+void skSubMenu::mouseDoubleClickEvent(QMouseEvent *)
+{
+    // The second press of a double click starts no second click.
+}
+
 void skSubMenu::mouseReleaseEvent(QMouseEvent *event)
 {
-    skinCommon::raiseMouse(this, &skSubMenu::MouseUp, event);
+    if (!skinCommon::raiseMouse(this, &skSubMenu::MouseUp, event))
+        return;
     d->active = false;
     d->hovering = false;
     Redraw();
@@ -401,7 +407,10 @@ void skSubMenu::clearHover()
 
 void skSubMenu::click()
 {
+    const QPointer<skSubMenu> alive(this);
     Q_EMIT Clicked();
+    if (!alive)
+        return;
     d->active = false;
     d->hovering = false;
     Redraw();

@@ -58,8 +58,10 @@ void HoverTracker::moved(const QMouseEvent *event)
     const bool inside = pointerInside(m_control, event->globalPosition());
     if (inside && !m_hovering) {
         m_hovering = true;
+        const QPointer<QWidget> alive(m_control);
         m_handlers.mouseIn();
-        m_handlers.repaint();
+        if (alive)
+            m_handlers.repaint();
     } else if (!inside && m_hovering) {
         left(held);
     } else if (!inside && !held) {
@@ -75,7 +77,10 @@ void HoverTracker::windowLeft()
 
 void HoverTracker::left(bool held)
 {
+    const QPointer<QWidget> alive(m_control);
     m_handlers.mouseOut();
+    if (!alive)
+        return;
     if (!held || m_heldLeave == HeldLeave::ReleaseCapture)
         platform::releaseCapture();
     m_hovering = false;
@@ -90,8 +95,11 @@ void HoverTracker::pressed(const QMouseEvent *event)
 
 bool HoverTracker::releasedForClick(const QMouseEvent *event)
 {
-    return event->button() == Qt::LeftButton && std::exchange(m_pressedHere, false)
+    const bool click = event->button() == Qt::LeftButton && std::exchange(m_pressedHere, false)
         && pointerInside(m_control, event->globalPosition());
+    if (click && platform::capturedWidget() == m_control)
+        platform::releaseCapture();
+    return click;
 }
 
 MouseArgs mouseArgs(const QMouseEvent *event)

@@ -9,6 +9,7 @@
 #include <QFont>
 #include <QImage>
 #include <QPointF>
+#include <QPointer>
 #include <QString>
 #include <QVariant>
 
@@ -43,9 +44,11 @@ ZELCTL_EXPORT bool pointerInside(const QWidget *control, QPointF global);
 
 // Hovering and clicking for a control that raises MouseIn and MouseOut itself. It takes
 // the pointer capture on a move (so the control hears of the pointer leaving) and gives
-// it back when the pointer is off an idle control, so an idle control never keeps the
-// application's pointer input. The hovering flag belongs to the control; the tracker
-// keeps it up to date.
+// it back when the pointer is off an idle control, and before a click is raised, so an
+// idle control never keeps the application's pointer input and a host may open a modal
+// form from the click. The hovering flag belongs to the control; the tracker keeps it up
+// to date. The host may delete the control from MouseIn or MouseOut: the tracker, which
+// the control owns, then stops at once.
 class ZELCTL_EXPORT HoverTracker
 {
 public:
@@ -71,7 +74,8 @@ public:
     // From mousePressEvent: remembers a left press on the control.
     void pressed(const QMouseEvent *event);
     // From mouseReleaseEvent: whether this release ends a left press on the control
-    // inside it, i.e. makes a click. A left release forgets the press either way.
+    // inside it, i.e. makes a click; the capture is given back first. A left release
+    // forgets the press either way.
     bool releasedForClick(const QMouseEvent *event);
 
 private:
@@ -97,11 +101,14 @@ struct MouseArgs
 ZELCTL_EXPORT MouseArgs mouseArgs(const QMouseEvent *event);
 
 // Raises one of a control's mouse events (MouseDown, MouseUp, MouseMove) for an event.
+// False when the host deleted the control in its handler: the caller must not touch it.
 template <typename Control>
-void raiseMouse(Control *control, void (Control::*event)(qint16 &, qint16 &, float &, float &), const QMouseEvent *from)
+bool raiseMouse(Control *control, void (Control::*event)(qint16 &, qint16 &, float &, float &), const QMouseEvent *from)
 {
     MouseArgs args = mouseArgs(from);
+    const QPointer<Control> alive(control);
     Q_EMIT(control->*event)(args.Button, args.Shift, args.X, args.Y);
+    return !alive.isNull();
 }
 
 // The four picture slots that ImageFile(nIndex) fills: setting a slot to a new path empties

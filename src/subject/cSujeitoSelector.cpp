@@ -225,6 +225,7 @@ void cSujeitoSelector::Private::refresh()
     }
 
     int left = 0;
+    CommandButton *focusTarget = nullptr;
     for (int i = 0; i < kindCount; ++i) {
         CommandButton *b = button(i);
         if (!possible.contains(kinds[i])) {
@@ -239,7 +240,12 @@ void cSujeitoSelector::Private::refresh()
         nameButton(i, pressed);
         b->show();
         left += width;
+        if (!focusTarget || i == pressed)
+            focusTarget = b;
     }
+    // Focus given to the control (a label's buddy, a host's setFocus) lands on the pressed
+    // button, as on the checked one of a group of radio buttons.
+    q->setFocusProxy(focusTarget);
 
     if (pressed >= 0 && !button(pressed)->isHidden()) {
         const CommandButton *b = button(pressed);
@@ -288,14 +294,19 @@ void cSujeitoSelector::Private::click(int i)
             before = kinds[j];
     }
 
+    // The host may delete the control in any of its events, or while its list is open.
+    const QPointer<cSujeitoSelector> alive(q);
     if (canSelectNone && wasPressed && clicked->Tag() == lastClickedTag) {
-        q->setSelectedSujeito(QString());
         lastClickedTag.clear();
-        Q_EMIT q->Changed();
+        q->setSelectedSujeito(QString());
+        if (alive)
+            Q_EMIT q->Changed();
         return;
     }
     lastClickedTag = clicked->Tag();
     Q_EMIT q->Clicked();
+    if (!alive)
+        return;
 
     if (clicked->Value()) {
         for (int j = 0; j < kindCount; ++j) {
@@ -312,6 +323,8 @@ void cSujeitoSelector::Private::click(int i)
         refresh();
         if (isListed(now) && index == 0) {
             chooseFromList(pressedButton());
+            if (!alive)
+                return;
             if (index == 0)
                 setIndex(1);
         }
@@ -393,7 +406,10 @@ void cSujeitoSelector::Private::chooseFromList(int pressed)
     listItem(0)->setEnabled(false);
 
     const CommandButton *b = button(pressed);
+    const QPointer<cSujeitoSelector> alive(q);
     QAction *chosen = subject::showListMenu(*mnu_listagem, q->mapToGlobal(QPoint(b->x(), b->height())));
+    if (!alive)
+        return;
     const int k = chosen ? int(mnu_list.indexOf(chosen)) : -1;
     if (k >= 1 && k <= count) {
         index = qint16(k);
@@ -407,6 +423,7 @@ cSujeitoSelector::cSujeitoSelector(QWidget *parent)
     , d(std::make_unique<Private>(this))
 {
     setFixedHeight(pixelsFromTwips(buttonHeight + heightMargin));
+    setFocusPolicy(Qt::TabFocus);
     d->refresh();
 }
 

@@ -332,10 +332,19 @@ void InfoButton::mousePressEvent(QMouseEvent *event)
 
 void InfoButton::mouseReleaseEvent(QMouseEvent *event)
 {
+    // Accepted, so the release does not travel on to the container, which the host may
+    // have deleted together with the button in Click.
+    event->accept();
     if (event->button() == Qt::LeftButton && std::exchange(d->pressed, false)
         && rect().contains(event->position().toPoint()))
         click();
-    UserControl::mouseReleaseEvent(event);
+}
+
+void InfoButton::mouseDoubleClickEvent(QMouseEvent *event)
+{
+    // The second press of a double click is not a new press: one double click opens the
+    // Action once.
+    event->accept();
 }
 
 void InfoButton::paintIcon()

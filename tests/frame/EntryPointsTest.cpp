@@ -128,6 +128,30 @@ TEST_F(EntryPoints, createsEveryBuiltClassCountsItUntilReleasedAndRefusesTheRest
     }
 }
 
+TEST_F(EntryPoints, aFactoryTheHostHoldsOutlivesItsReplacement)
+{
+    const GUID id = toGuid(ClassRegistry::factoryFor(QStringLiteral("cSlider"))->info().classId);
+    void *raw = nullptr;
+    ASSERT_EQ(getClassObject(&id, &IID_IClassFactory, &raw), S_OK);
+    const auto *held = static_cast<const ClassFactory *>(raw);
+    ASSERT_TRUE(ClassRegistry::provide("cSlider", [held](QWidget *parent) { return held->CreateInstance(parent); }));
+
+    EXPECT_NE(ClassRegistry::factoryFor(QStringLiteral("cSlider")), held) << "new lookups get the new factory";
+    std::unique_ptr<QObject> made(held->CreateInstance());
+    EXPECT_STREQ(made->metaObject()->className(), "zelctl::cSlider");
+}
+
+TEST_F(EntryPoints, anUnbalancedUnlockDoesNotOutweighTheNextLock)
+{
+    ASSERT_EQ(canUnloadNow(), S_OK);
+    ClassFactory::LockServer(false);
+    EXPECT_EQ(canUnloadNow(), S_OK);
+    ClassFactory::LockServer(true);
+    EXPECT_EQ(canUnloadNow(), S_FALSE) << "the host's lock holds";
+    ClassFactory::LockServer(false);
+    EXPECT_EQ(canUnloadNow(), S_OK);
+}
+
 TEST_F(EntryPoints, liveControlsKeepTheLibraryLoaded)
 {
     ASSERT_EQ(canUnloadNow(), S_OK);
@@ -176,8 +200,13 @@ TEST(ClassRegistry, holdsTheFifteenPublicClassesWithTheirIdentities)
     }
 }
 
-TEST(ClassRegistry, onlyServesNamesOfTheTable)
+TEST(ClassRegistry, servesNamesOfTheTableInAnyCase)
 {
+    for (const char *name : { "cslider", "UKAZELCTL.CSLIDER", "ukazelctl.cSlider" }) {
+        std::unique_ptr<QObject> made(CreateObject(QLatin1String(name)));
+        ASSERT_NE(made, nullptr) << name;
+        EXPECT_STREQ(made->metaObject()->className(), "zelctl::cSlider");
+    }
     EXPECT_FALSE(ClassRegistry::provide("cUnknown", [](QWidget *) { return new QObject; }));
     EXPECT_EQ(CreateObject("cUnknown"), nullptr);
     EXPECT_EQ(CreateObject("UKAZELCTL.cUnknown"), nullptr);

@@ -7,6 +7,7 @@
 #include "platform/Twips.h"
 
 #include <QHash>
+#include <QPointer>
 #include <QSignalSpy>
 #include <QTemporaryDir>
 #include <QTest>
@@ -464,4 +465,46 @@ TEST_F(AniGif, forwardsMouseEventsInTwips)
     QTest::mouseClick(&gif, Qt::RightButton, Qt::NoModifier, QPoint(1, 1));
     EXPECT_EQ(downs.last().first(), 2.0f);
     EXPECT_EQ(clicks.count(), 1) << "only the left button clicks";
+    QTest::mouseClick(&gif, Qt::LeftButton, {}, QPoint(1, 1));
+    QTest::mouseDClick(&gif, Qt::LeftButton, {}, QPoint(1, 1));
+    QTest::mouseRelease(&gif, Qt::LeftButton, {}, QPoint(1, 1));
+    EXPECT_EQ(clicks.count(), 2) << "a double click is one click";
+}
+
+TEST_F(AniGif, anOffsetFarBeyondAnyBitmapDrawsNothing)
+{
+    ASSERT_TRUE(gif.LoadAnimatedGIF_Array(layeredGif()));
+    gif.setOffsetX(std::numeric_limits<qint32>::max());
+    gif.setOffsetY(std::numeric_limits<qint32>::min());
+    EXPECT_EQ(picture(), QStringList(4, "......"));
+}
+
+TEST(AniGifLifetime, theHostMayDeleteItInMouseUpClickOrRemoteLoadComplete)
+{
+    QTemporaryDir dir;
+    QFile file(dir.filePath("layered.gif"));
+    ASSERT_TRUE(file.open(QIODevice::WriteOnly));
+    file.write(layeredGif());
+    file.close();
+    for (const char *event : { "MouseUp", "Click", "RemoteLoadComplete" }) {
+        QWidget form;
+        auto *gif = new ucAniGIF(&form);
+        gif->InitNew();
+        gif->resize(20, 20);
+        form.show();
+        ASSERT_TRUE(QTest::qWaitForWindowExposed(&form));
+        QPointer<ucAniGIF> alive(gif);
+        const auto remove = [&alive] { delete alive.data(); };
+        if (qstrcmp(event, "MouseUp") == 0)
+            QObject::connect(gif, &ucAniGIF::MouseUp, remove);
+        else if (qstrcmp(event, "Click") == 0)
+            QObject::connect(gif, &ucAniGIF::Click, remove);
+        else
+            QObject::connect(gif, &ucAniGIF::RemoteLoadComplete, remove);
+        if (qstrcmp(event, "RemoteLoadComplete") == 0)
+            gif->LoadAnimatedGIF_Remote(file.fileName());
+        else
+            QTest::mouseClick(gif, Qt::LeftButton, {}, QPoint(2, 2));
+        ASSERT_TRUE(QTest::qWaitFor([&] { return alive.isNull(); })) << event;
+    }
 }

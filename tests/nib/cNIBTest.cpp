@@ -200,27 +200,63 @@ TEST_F(NibControl, keepsItsSizeAndPersistsItsBackColour)
 }
 
 // A host may delete the control from its Changed event, wherever the user's editing raised
-// it: the last character typed, the check digits filled in on leaving, the last one erased.
+// it: the last character typed, the check digits filled in on leaving, the last one erased;
+// and the whole form it sits on where typing raised it. (Leaving hands the focus to another
+// widget of the form: Qt goes on with that one after the event, as with any focus change.)
 TEST_F(NibControl, survivesBeingDeletedFromItsChangedEvent)
 {
+    QPointer<cNIB> alive;
+    const auto keys = [&](const QString &text) {
+        for (const QChar c : text) {
+            if (alive && c == u'\b')
+                QTest::keyClick(QApplication::focusWidget(), Qt::Key_Backspace);
+            else if (alive)
+                QTest::keyClick(QApplication::focusWidget(), c.toLatin1());
+        }
+    };
+    QPointer<QWidget> page;
+    QLineEdit *neighbour = nullptr;
     const struct
     {
-        QString before, after;
-        bool leave;
-    } paths[] = {
-        { "", number, false },
-        { bankBranchAccount, "", true },
-        { number, QString(24, u'\b'), false },
+        bool typed;
+        std::function<void()> prepare;
+        std::function<void()> act;
+    } raisers[] = {
+        { true, [&] { box(0)->setFocus(); }, [&] { keys(number); } },
+        { false,
+            [&] {
+                box(0)->setFocus();
+                keys(bankBranchAccount);
+            },
+            [&] { neighbour->setFocus(); } },
+        { true,
+            [&] {
+                nib->setText(number);
+                box(3)->setFocus();
+                QTest::keyClick(box(3), Qt::Key_End);
+            },
+            [&] { keys(QString(24, u'\b')); } },
     };
-    for (const auto &path : paths) {
-        const QPointer<cNIB> alive = nib = new cNIB(&form);
-        box(0)->setFocus();
-        type(path.before);
-        QObject::connect(nib, &cNIB::Changed, nib, [alive] { delete alive.data(); });
-        type(path.after);
-        if (path.leave)
-            other->setFocus();
-        QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
-        EXPECT_TRUE(alive.isNull()) << path.after.size();
+    for (const bool wholeForm : { false, true }) {
+        for (const auto &raiser : raisers) {
+            if (wholeForm && !raiser.typed)
+                continue;
+            page = new QWidget;
+            nib = new cNIB(page);
+            neighbour = new QLineEdit(page);
+            neighbour->move(0, 40);
+            page->show();
+            QApplication::setActiveWindow(page);
+            ASSERT_TRUE(QTest::qWaitForWindowActive(page));
+            alive = nib;
+            raiser.prepare();
+            QObject::connect(nib, &cNIB::Changed, nib, [&] { delete (wholeForm ? page.data() : nib); });
+            raiser.act();
+            QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
+            EXPECT_TRUE(alive.isNull());
+            EXPECT_EQ(page.isNull(), wholeForm);
+            delete page.data();
+            nib = nullptr;
+        }
     }
 }

@@ -103,6 +103,21 @@ TEST_F(NifLifetime, deletedFromInsideEachOfItsEvents)
     }
 }
 
+TEST_F(NifLifetime, deletedFromAnEventRaisedWhileItLoads)
+{
+    for (const bool wholeWindow : { false, true }) {
+        reset();
+        control->setValue("PT" + PlainNif);
+        const PropertyBag saved = control->Save();
+        // Loading refreshes the valid number it holds, which raises NIFIndicated.
+        deleteOn(&cNIF::NIFIndicated, wholeWindow);
+        control->Load(saved);
+        runDeferredDeletes();
+        EXPECT_TRUE(control.isNull());
+        EXPECT_EQ(window.isNull(), wholeWindow);
+    }
+}
+
 TEST_F(NifLifetime, deletedWhileSomethingOfItsOwnIsPending)
 {
     const struct
@@ -110,7 +125,7 @@ TEST_F(NifLifetime, deletedWhileSomethingOfItsOwnIsPending)
         const char *pending;
         std::function<void()> open;
     } cases[] = {
-        { "its menu", [&] { QTest::mousePress(box(), Qt::RightButton); } },
+        { "its menu", [&] { rightClick(box()); } },
         { "its country list",
             [&] {
                 control->setCountries(GSEL_All);

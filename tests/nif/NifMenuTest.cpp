@@ -40,7 +40,7 @@ protected:
 TEST_F(NifMenu, offersItsEntriesOnTheBoxAndTheFlag)
 {
     MenuChooser chooser;
-    QTest::mouseClick(box, Qt::RightButton);
+    rightClick(box);
     ASSERT_EQ(chooser.shown, 1);
     EXPECT_EQ(chooser.entries,
         QStringList({ "mnu_undo|&Desfazer|Ctrl+Z|off", "mnu_blank00|||on", "mnu_cut|&Cortar|Ctrl+X|on",
@@ -51,7 +51,7 @@ TEST_F(NifMenu, offersItsEntriesOnTheBoxAndTheFlag)
     EXPECT_EQ(chooser.defaultEntry, "mnu_paste");
 
     QTest::keyClicks(box, PlainNif);
-    QTest::mouseClick(control->findChild<QWidget *>("cPicture"), Qt::RightButton);
+    rightClick(control->findChild<QWidget *>("cPicture"));
     EXPECT_EQ(chooser.shown, 2);
     EXPECT_TRUE(chooser.offered("mnu_ficha")) << "a valid number has a record";
     EXPECT_TRUE(chooser.offered("mnu_undo"));
@@ -78,8 +78,8 @@ TEST_F(NifMenu, disabledMenuShowsNoMenuAtAll)
             popup->close();
         }
     });
-    QTest::mouseClick(box, Qt::RightButton);
-    QTest::mouseClick(control->findChild<QWidget *>("cPicture"), Qt::RightButton);
+    rightClick(box);
+    rightClick(control->findChild<QWidget *>("cPicture"));
     QContextMenuEvent byKey(QContextMenuEvent::Keyboard, QPoint(5, 5), box->mapToGlobal(QPoint(5, 5)));
     QApplication::sendEvent(box, &byKey);
     QMetaObject::invokeMethod(control, "PopupContextMenu");

@@ -108,6 +108,13 @@ inline QLineEdit *entryBox(cNIF &control)
     return control.findChild<QLineEdit *>(QStringLiteral("nif"));
 }
 
+// A right click as the window system delivers it: the press, then Qt's context menu event.
+inline void rightClick(QWidget *widget)
+{
+    QWidget *window = widget->window();
+    QTest::mouseClick(window->windowHandle(), Qt::RightButton, {}, widget->mapTo(window, widget->rect().center()));
+}
+
 // Deletes what deleteLater left, as the event loop would.
 inline void runDeferredDeletes()
 {

@@ -476,8 +476,8 @@ TEST(NifLayout, keepsItsHeightAndLooksDisabledInADisabledParent)
     EXPECT_EQ(backColour(*control), Grey);
     EXPECT_TRUE(control->Enabled()) << "the host's own setting is unchanged";
     MenuChooser menu;
-    QTest::mouseClick(entryBox(*control), Qt::RightButton);
-    QTest::mouseClick(control->findChild<QWidget *>("cPicture"), Qt::RightButton);
+    rightClick(entryBox(*control));
+    rightClick(control->findChild<QWidget *>("cPicture"));
     EXPECT_EQ(menu.shown, 0);
     form.setEnabled(true);
     EXPECT_EQ(backColour(*control), White);

@@ -1,11 +1,21 @@
+#include "common/modFuncs.h"
+#include "platform/MessageBox.h"
 #include "platform/OleColor.h"
 #include "platform/Settings.h"
 #include "platform/Shell.h"
 
+#include <QApplication>
+#include <QDir>
 #include <QFile>
+#include <QFileInfo>
+#include <QPointer>
 #include <QStandardPaths>
+#include <QTest>
+#include <QTimer>
 
 #include <gtest/gtest.h>
+
+#include <thread>
 
 using namespace zelctl::platform;
 
@@ -21,6 +31,100 @@ TEST(Settings, liveInThePrivateConfigFolderAndFoldTheApplicationName)
     EXPECT_TRUE(QFile::exists(settingsFile("ZeL")));
     DeleteSetting("zEL", "Config", "allowautonif");
     EXPECT_EQ(GetSetting("ZEL", "Config", "allowautonif", "1"), "1");
+}
+
+TEST(Settings, aHandEditedValueIsReadWholeAndNeverWrittenOver)
+{
+    const auto contents = [](const QString &path) {
+        QFile file(path);
+        return file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray();
+    };
+    const auto write = [](const QString &path, const QByteArray &bytes) {
+        QFile file(path);
+        ASSERT_TRUE(file.open(QIODevice::WriteOnly | QIODevice::Truncate));
+        file.write(bytes);
+    };
+    const QString path = settingsFile("zEL");
+    const QByteArray original = contents(path);
+    const QByteArray edited = "[Setup]\nRootPath=/opt/zel,2024\nSkinPreviewPath = /srv/skins;old \n";
+    write(path, edited);
+
+    EXPECT_EQ(GetSetting("zEL", "Setup", "RootPath"), "/opt/zel,2024");
+    EXPECT_EQ(GetSetting("zEL", "Setup", "SkinPreviewPath"), "/srv/skins;old");
+    // Each thread keeps its own root path, so a new one reads the setting afresh.
+    QString root;
+    std::thread([&root] { root = zelctl::modFuncs::GetRootPath(); }).join();
+    EXPECT_EQ(root, "/opt/zel,2024/");
+    EXPECT_EQ(contents(path), edited) << "the user's setting stays as written";
+
+    EXPECT_TRUE(SaveSetting("zEL", "Setup", "Mixed", "a,b;c"));
+    EXPECT_EQ(GetSetting("zEL", "Setup", "Mixed"), "a,b;c") << "what the library writes reads back the same";
+    write(path, original);
+}
+
+TEST(Settings, aStoreThatCannotBeReadIsNeverWrittenOver)
+{
+    const QString path = settingsFile("zEL");
+    QFile original(path);
+    ASSERT_TRUE(original.rename(path + ".kept"));
+    const auto rootPathInANewThread = [] {
+        // Each thread keeps its own root path, so a new one reads the setting afresh.
+        QString root;
+        std::thread([&root] { root = zelctl::modFuncs::GetRootPath(); }).join();
+        return root;
+    };
+    const auto bytes = [&] {
+        QFile file(path);
+        return file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray("(unreadable)");
+    };
+
+    // A folder where the file should be: nothing can be read, nothing may be put there.
+    ASSERT_TRUE(QDir().mkpath(path + "/kept"));
+    EXPECT_EQ(rootPathInANewThread().toStdString(), (QDir::currentPath() + '/').toStdString())
+        << "the session still has a root";
+    EXPECT_FALSE(SaveSetting("zEL", "Setup", "RootPath", "/tmp/"));
+    EXPECT_FALSE(DeleteSetting("zEL", "Setup", "RootPath"));
+    EXPECT_TRUE(QFileInfo(path + "/kept").isDir());
+    ASSERT_TRUE(QDir(path).removeRecursively());
+
+    // A person's typos, which the reader passes over or reads round: the file stays as typed.
+    const struct
+    {
+        QByteArray typed;
+        QString root;
+    } typos[] = {
+        { "[Setup]\nRootPath /opt/zel\nSkinPreviewPath=/srv/skins\n", QDir::currentPath() + '/' },
+        { "[Setup\nRootPath=/opt/zel\nSkinPreviewPath=/srv/skins\n", "/opt/zel/" },
+    };
+    for (const auto &typo : typos) {
+        {
+            QFile file(path);
+            ASSERT_TRUE(file.open(QIODevice::WriteOnly | QIODevice::Truncate));
+            file.write(typo.typed);
+        }
+        EXPECT_EQ(rootPathInANewThread().toStdString(), typo.root.toStdString());
+        EXPECT_FALSE(SaveSetting("zEL", "Setup", "SkinPreviewPath", "/tmp/"));
+        EXPECT_FALSE(DeleteSetting("zEL", "Setup", "SkinPreviewPath"));
+        EXPECT_EQ(bytes(), typo.typed);
+    }
+    QFile::remove(path);
+    original.rename(path);
+}
+
+TEST(MessageBox, closingTheWindowItBelongsToWhileItIsOpenAnswersAsEscape)
+{
+    const MessageBoxPresenter recorder = setMessageBoxPresenter({});
+    for (const auto &[buttons, answer] : { std::pair { MsgButtons::OkCancel, MsgResult::Cancel },
+             std::pair { MsgButtons::YesNo, MsgResult::No }, std::pair { MsgButtons::Ok, MsgResult::Ok } }) {
+        const QPointer<QWidget> window = new QWidget;
+        window->show();
+        QApplication::setActiveWindow(window);
+        ASSERT_TRUE(QTest::qWaitForWindowActive(window));
+        QTimer::singleShot(0, window, [&] { delete window.data(); });
+        EXPECT_EQ(messageBox(MsgIcon::Question, "Sair", "Sair sem guardar?", buttons), answer);
+        EXPECT_TRUE(window.isNull());
+    }
+    setMessageBoxPresenter(recorder);
 }
 
 TEST(OleColor, resolvesSystemColoursAndConvertsToQColor)

@@ -323,6 +323,51 @@ TEST_F(SelectionTest, theDialogIsPlacedAgainstItsParent)
     }
 }
 
+TEST_F(SelectionTest, aLongListThatGrowsOpenIsPaintedOnceNotOncePerItemLaidOut)
+{
+    // Growing open shows the form before its items are laid out; painting each item as it
+    // moved repainted every item it still overlapped.
+    QWidget parent;
+    parent.setGeometry(100, 100, 200, 50);
+    parent.show();
+    parent.setProperty("hWnd", platform::handleOf(&parent));
+    QList<GFXItem> items = numberedItems(120);
+    for (GFXItem &item : items)
+        item.Title += QString(2000, u'x');
+    GFXSelection s;
+    s.ParentObj = &parent;
+
+    struct PaintCounter : QObject
+    {
+        bool eventFilter(QObject *watched, QEvent *event) override
+        {
+            if (event->type() == QEvent::Paint && watched->objectName() == QLatin1String("btnSelector"))
+                ++paints;
+            return false;
+        }
+        int paints = 0;
+    } counter;
+    qApp->installEventFilter(&counter);
+    int paintsBeforeShown = -1;
+    select(s, items, [&](QDialog &dialog) {
+        paintsBeforeShown = counter.paints;
+        cancelButton(dialog)->click();
+    });
+    qApp->removeEventFilter(&counter);
+    EXPECT_LT(paintsBeforeShown, 2 * int(items.size()));
+}
+
+TEST_F(SelectionTest, theUnbuiltListsAnswerEmpty)
+{
+    EXPECT_EQ(selection.QuickSelectFrom(QStringLiteral("a\tb\tc")), "");
+    EXPECT_EQ(selection.SelectCAErev3(), "");
+    EXPECT_EQ(selection.SelectCTA(), "");
+    EXPECT_EQ(selection.SelectDistrito(), "");
+    EXPECT_EQ(selection.SelectLocalidade(QStringLiteral("Lisboa")), "");
+    EXPECT_EQ(selection.SelectFreguesia(QStringLiteral("Sintra")), "");
+    EXPECT_EQ(shown, 0);
+}
+
 using SelectCountryTest = SelectionTest;
 
 // How the lists look (titles, flags, the filter box) is in the golden pictures.

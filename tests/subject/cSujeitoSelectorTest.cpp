@@ -10,6 +10,7 @@
 #include <QAction>
 #include <QFrame>
 #include <QMenu>
+#include <QPointer>
 #include <QTest>
 
 #include <gtest/gtest.h>
@@ -279,6 +280,28 @@ TEST_F(SubjectSelector, listOfDependants)
     ASSERT_EQ(menu.shown, 1);
     EXPECT_EQ(menu.items.filter("[x]"), QStringList()) << "nothing is chosen after A";
     EXPECT_EQ(selector->SelectedSujeito(), "D1") << "a dismissed list chooses the first";
+}
+
+TEST_F(SubjectSelector, theHostMayDeleteItInClickedOrWhileItsListIsOpen)
+{
+    auto declaration
+        = declarationWith({ { "D1", "234567813", "ANA RITA LOPES" }, { "D2", "246813571", "TIAGO LOPES" } });
+    selector->setIRSClass(declaration.get());
+    QPointer<cSujeitoSelector> alive(selector);
+    const subject::ListMenuPresenter previous = subject::setListMenuPresenter([&](QMenu &, const QPoint &) {
+        delete alive.data();
+        return nullptr;
+    });
+    click(u"D");
+    subject::setListMenuPresenter(previous);
+    EXPECT_TRUE(alive.isNull());
+
+    selector = new cSujeitoSelector(&form);
+    selector->show();
+    alive = selector;
+    QObject::connect(selector, &cSujeitoSelector::Clicked, [&] { delete alive.data(); });
+    click(u"B");
+    EXPECT_TRUE(alive.isNull());
 }
 
 TEST_F(SubjectSelector, listsOfAscendantsAndEstates)

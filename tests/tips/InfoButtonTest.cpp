@@ -128,7 +128,10 @@ TEST_F(PlacedButton, clickDependsOnTheActionWhichIsKeptTrimmed)
         EXPECT_EQ(button->Action(), action.trimmed());
         EXPECT_EQ(button->cursor().shape(), Qt::PointingHandCursor);
         QSignalSpy clicked(button, &InfoButton::Click);
+        // A double click acts once: its second press is no new press.
         QTest::mouseClick(button, Qt::LeftButton, {}, QPoint(8, 8));
+        QTest::mouseDClick(button, Qt::LeftButton, {}, QPoint(8, 8));
+        QTest::mouseRelease(button, Qt::LeftButton, {}, QPoint(8, 8));
         EXPECT_EQ(clicked.count(), clicks);
         EXPECT_EQ(shell.opened.join('|'), opened);
     }

@@ -456,8 +456,7 @@ int FillRect(HDC hdc, const RECT &rect, HBRUSH handle)
         return 0;
     if (!brush->null) {
         const Surface &surface = dc->bitmap.object->surface;
-        const QRect area(QPoint(rect.left, rect.top), QPoint(rect.right - 1, rect.bottom - 1));
-        fillRect(surface, area, valueOf(surface, brush->color));
+        fillRect(surface, rect.left, rect.top, rect.right, rect.bottom, valueOf(surface, brush->color));
     }
     return 1;
 }
@@ -477,8 +476,7 @@ bool Rectangle(HDC hdc, int left, int top, int right, int bottom)
     const bool outlined = pen.style != PS_NULL;
     if (!brush.null) {
         const int inset = outlined ? 1 : 0;
-        const QRect inside(QPoint(left + inset, top + inset), QPoint(right - 1 - inset, bottom - 1 - inset));
-        fillRect(surface, inside, valueOf(surface, brush.color));
+        fillRect(surface, left + inset, top + inset, right - inset, bottom - inset, valueOf(surface, brush.color));
     }
     if (outlined && right > left && bottom > top) {
         Coverage outline(QRect(0, 0, surface.width, surface.height));

@@ -896,6 +896,8 @@ bool alphaBlend(const Surface &dst, Extent to, const Surface &src, Extent from, 
     const Surface &source = detachSource(dst, src, x, y, shot);
     const AxisMap xs = mapAxis(x, dst.width, source.width);
     const AxisMap ys = mapAxis(y, dst.height, source.height);
+    if (xs.src.empty() || ys.src.empty())
+        return true; // wholly clipped
     const int n = int(xs.src.size());
     const bool opaqueSource = !perPixel || source.bpp != 32;
     const bool span = xs.isSpan();
@@ -922,16 +924,15 @@ bool alphaBlend(const Surface &dst, Extent to, const Surface &src, Extent from, 
     return true;
 }
 
-void fillRect(const Surface &dst, const QRect &rect, quint32 value)
+void fillRect(const Surface &dst, int left, int top, int right, int bottom, quint32 value)
 {
-    if (rect.isEmpty())
-        return; // QRect's intersection would turn an inverted rectangle round
-    const QRect area = rect & QRect(0, 0, dst.width, dst.height);
-    if (area.isEmpty())
+    const int x0 = std::clamp(left, 0, dst.width), x1 = std::clamp(right, 0, dst.width);
+    const int y0 = std::clamp(top, 0, dst.height), y1 = std::clamp(bottom, 0, dst.height);
+    if (x0 >= x1 || y0 >= y1)
         return;
-    std::vector<quint32> values(size_t(area.width()), value);
-    for (int y = area.top(); y <= area.bottom(); ++y)
-        storeValues(dst, dst.row(y), area.left(), area.width(), values.data(), Rop::Copy);
+    std::vector<quint32> values(size_t(x1 - x0), value);
+    for (int y = y0; y < y1; ++y)
+        storeValues(dst, dst.row(y), x0, x1 - x0, values.data(), Rop::Copy);
 }
 
 } // namespace zelctl::gdi::detail

@@ -2,8 +2,6 @@
 
 #include "platform/gdi/Surface.h"
 
-#include <QRect>
-
 // The pixel routines behind BitBlt, StretchBlt, AlphaBlend and the fills. They work on
 // surfaces only, so they need neither handles nor a QGuiApplication.
 namespace zelctl::gdi::detail {
@@ -29,7 +27,8 @@ bool stretchBlit(const Surface &dst, Extent to, const Surface &src, Extent from,
 // outside src.
 bool alphaBlend(const Surface &dst, Extent to, const Surface &src, Extent from, quint8 constantAlpha, bool perPixel);
 
-// Sets every pixel of rect (clipped) to a pixel value.
-void fillRect(const Surface &dst, const QRect &rect, quint32 value);
+// Sets every pixel of [left, right) × [top, bottom), clipped to dst, to a pixel value. Any
+// coordinates will do: an inverted rectangle or one wholly outside dst fills nothing.
+void fillRect(const Surface &dst, int left, int top, int right, int bottom, quint32 value);
 
 } // namespace zelctl::gdi::detail

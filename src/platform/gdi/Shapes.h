@@ -30,10 +30,19 @@ public:
     void apply(const Surface &surface, quint32 value, PenMode mode) const;
 
 private:
+    // Pixels left to right on one row, from x0 to x1 inclusive.
+    struct Span
+    {
+        int y, x0, x1;
+    };
+
     void mark(int x, int y);
+    void keep(int y, int x0, int x1);
 
     QRect m_bounds;
-    std::vector<std::pair<int, int>> m_points; // (y, x)
+    std::vector<Span> m_spans;
+    // Whether each span lies after the one before it on the page, so no pixel repeats.
+    bool m_ordered = true;
 };
 
 } // namespace zelctl::gdi::detail

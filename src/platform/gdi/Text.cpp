@@ -10,6 +10,7 @@
 #include <QPainter>
 #include <QWidget>
 
+#include <algorithm>
 #include <cmath>
 #include <cstring>
 
@@ -21,6 +22,8 @@ namespace {
 
 // Point sizes are meant for a 96 dots-per-inch screen.
 constexpr int DotsPerMeter = 3780;
+
+constexpr int MaxTextReach = 1 << 20;
 
 // Fonts need the application's font database.
 bool fontsAvailable()
@@ -61,6 +64,10 @@ bool TextOut(HDC hdc, int x, int y, const QString &text)
     const Surface &surface = dc->bitmap.object->surface;
     if (surface.bpp != 24 && surface.bpp != 32)
         return false;
+    // Text that starts past the bitmap, or so far before it that no string reaches in, is
+    // wholly clipped; QPainter's fixed-point coordinates would overflow out there anyway.
+    if (x >= surface.width || y >= surface.height || x < -MaxTextReach || y < -MaxTextReach)
+        return true;
     // QPainter draws straight into a top-down bitmap's memory. A bottom-up bitmap is drawn
     // on a top-down copy, because glyphs drawn through a flipping transform come out
     // rasterised differently.
@@ -105,8 +112,17 @@ bool RedrawWindow(HWND window, const RECT *rect, quint32 flags)
     QWidget *widget = platform::widgetOf(window);
     if (!widget)
         return false;
-    const QRect area
-        = rect ? QRect(QPoint(rect->left, rect->top), QPoint(rect->right - 1, rect->bottom - 1)) : widget->rect();
+    QRect area = widget->rect();
+    if (rect) {
+        // Clamped first, so that no coordinate a host passes can overflow the arithmetic.
+        const auto clampX = [&](qint32 v) { return std::clamp(v, 0, widget->width()); };
+        const auto clampY = [&](qint32 v) { return std::clamp(v, 0, widget->height()); };
+        const int left = clampX(rect->left), right = clampX(rect->right);
+        const int top = clampY(rect->top), bottom = clampY(rect->bottom);
+        if (left >= right || top >= bottom)
+            return true;
+        area = QRect(left, top, right - left, bottom - top);
+    }
     if (flags & RDW_UPDATENOW)
         widget->repaint(area);
     else if (flags & RDW_INVALIDATE)

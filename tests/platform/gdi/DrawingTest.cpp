@@ -117,6 +117,25 @@ TEST(Lines, stopBeforeTheEndPointAndXorOnce)
     MoveToEx(b.dc, 0, 3, nullptr);
     LineTo(b.dc, 4, 3);
     EXPECT_EQ(b.rgb(1, 3), 0x000000u);
+
+    // Straight lines reaching far beyond the bitmap draw only their part inside it, in
+    // either direction; a line wholly beside it draws nothing.
+    SetROP2(b.dc, R2_COPYPEN);
+    MoveToEx(b.dc, 1, -1000000, nullptr);
+    LineTo(b.dc, 1, 1000000);
+    MoveToEx(b.dc, 1000000, 3, nullptr);
+    LineTo(b.dc, 2, 3);
+    MoveToEx(b.dc, 0, 2, nullptr);
+    LineTo(b.dc, -1000000, 2);
+    MoveToEx(b.dc, 5, -1000000, nullptr);
+    LineTo(b.dc, -1000000, 1000000);
+    MoveToEx(b.dc, 900, -5, nullptr);
+    LineTo(b.dc, 900, 1000000);
+    EXPECT_EQ(picture(b, 4, 0xFF0000),
+        "##.#\n"
+        ".#.#\n"
+        "###.\n"
+        ".#.#\n");
     SelectObject(b.dc, GetStockObject(BLACK_PEN));
 }
 

@@ -1,0 +1,61 @@
+#include "companion/CommandButton.h"
+#include "skins/cSlider.h"
+
+#include <QApplication>
+#include <QLabel>
+#include <QLineEdit>
+#include <QSignalSpy>
+#include <QTest>
+
+#include <gtest/gtest.h>
+
+using namespace zelctl;
+
+// A label's buddy and a host's setFocus land on the slider's button, which Space presses.
+TEST(SliderFocus, focusGivenToTheSliderLandsOnItsButton)
+{
+    QWidget form;
+    auto *first = new QLineEdit(&form);
+    auto *label = new QLabel(QStringLiteral("&Mais:"), &form);
+    label->move(0, 30);
+    auto *slider = new cSlider(&form);
+    slider->move(0, 60);
+    auto *inside = new QLineEdit(slider);
+    inside->move(5, 5);
+    label->setBuddy(slider);
+    form.resize(300, 200);
+    form.show();
+    form.activateWindow();
+    ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
+    auto *button = slider->findChild<CommandButton *>(QStringLiteral("cc"));
+    QSignalSpy slided(slider, &cSlider::Slided);
+
+    QTest::keyClick(first, Qt::Key_M, Qt::AltModifier);
+    EXPECT_EQ(QApplication::focusWidget(), button) << "the label's mnemonic";
+    QTest::keyClick(button, Qt::Key_Space);
+    EXPECT_TRUE(slider->SlideOpen());
+    EXPECT_EQ(slided.count(), 1);
+    first->setFocus();
+    slider->setFocus();
+    EXPECT_EQ(QApplication::focusWidget(), button);
+}
+
+// A host may delete the slider while one of the controls it placed inside has the focus.
+TEST(SliderFocus, deletedWhileAControlInsideHasTheFocus)
+{
+    QWidget form;
+    auto *first = new QLineEdit(&form);
+    auto *slider = new cSlider(&form);
+    slider->move(0, 40);
+    auto *inside = new QLineEdit(slider);
+    form.resize(300, 200);
+    form.show();
+    form.activateWindow();
+    ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
+    inside->setFocus();
+    ASSERT_TRUE(inside->hasFocus());
+    EXPECT_TRUE(slider->SlideOpen()) << "the focus inside opens the slider";
+    delete slider;
+    QTest::keyClicks(first, "ok");
+    EXPECT_EQ(first->text(), "ok") << "the form lives on";
+}
