@@ -110,7 +110,10 @@ TEST_F(NifLifetime, deletedFromAnEventRaisedWhileItLoads)
         control->setValue("PT" + PlainNif);
         const PropertyBag saved = control->Save();
         // Loading refreshes the valid number it holds, which raises NIFIndicated.
-        deleteOn(&cNIF::NIFIndicated, wholeWindow);
+        onEveryEvent(*control, [this, wholeWindow](const QString &raised) {
+            if (raised.section(':', 0, 0) == "NIFIndicated")
+                goAway(wholeWindow);
+        });
         control->Load(saved);
         runDeferredDeletes();
         EXPECT_TRUE(control.isNull());
