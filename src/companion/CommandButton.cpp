@@ -68,7 +68,10 @@ QSize CommandButton::sizeFor(const QString &text) const
         width = iconSize().width() + 4;
         height = iconSize().height();
     }
-    const QSize textSize = fontMetrics().size(Qt::TextShowMnemonic, text.isEmpty() ? QStringLiteral("XXXX") : text);
+    // An empty caption still gets the height and, without an icon, the width of "XXXX", as
+    // QPushButton measures it.
+    const QString measured = text.isEmpty() ? QStringLiteral("XXXX") : text;
+    const QSize textSize = fontMetrics().size(Qt::TextShowMnemonic, measured);
     if (!text.isEmpty() || width == 0)
         width += textSize.width();
     if (!text.isEmpty() || height == 0)
