@@ -21,15 +21,6 @@ using namespace zelctl::stress;
 
 namespace {
 
-std::vector<std::string> servedClasses()
-{
-    std::vector<std::string> names;
-    for (const ClassInfo &info : ClassRegistry::classes())
-        if (ClassRegistry::factoryFor(info.classId))
-            names.emplace_back(info.name);
-    return names;
-}
-
 void runFor(int milliseconds)
 {
     QDeadlineTimer deadline(milliseconds);

@@ -18,15 +18,6 @@ using namespace zelctl::stress;
 
 namespace {
 
-std::vector<std::string> servedClasses()
-{
-    std::vector<std::string> names;
-    for (const ClassInfo &info : ClassRegistry::classes())
-        if (ClassRegistry::factoryFor(info.classId))
-            names.emplace_back(info.name);
-    return names;
-}
-
 quint64 mix(quint64 value)
 {
     // splitmix64: neighbouring inputs give unrelated seeds.

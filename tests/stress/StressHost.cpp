@@ -1209,4 +1209,13 @@ EpisodeResult runEpisode(const QString &className, quint64 seed, int steps)
     return result;
 }
 
+std::vector<std::string> servedClasses()
+{
+    std::vector<std::string> names;
+    for (const ClassInfo &info : ClassRegistry::classes())
+        if (ClassRegistry::factoryFor(info.classId))
+            names.emplace_back(info.name);
+    return names;
+}
+
 } // namespace zelctl::stress

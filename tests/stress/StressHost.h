@@ -162,6 +162,9 @@ struct EpisodeResult
     QStringList faults;
 };
 
+// The names of the classes the registry can create in this build.
+std::vector<std::string> servedClasses();
+
 EpisodeResult runEpisode(const QString &className, quint64 seed, int steps);
 
 } // namespace zelctl::stress
