@@ -205,15 +205,6 @@ TEST_F(NibControl, keepsItsSizeAndPersistsItsBackColour)
 // widget of the form: Qt goes on with that one after the event, as with any focus change.)
 TEST_F(NibControl, survivesBeingDeletedFromItsChangedEvent)
 {
-    QPointer<cNIB> alive;
-    const auto keys = [&](const QString &text) {
-        for (const QChar c : text) {
-            if (alive && c == u'\b')
-                QTest::keyClick(QApplication::focusWidget(), Qt::Key_Backspace);
-            else if (alive)
-                QTest::keyClick(QApplication::focusWidget(), c.toLatin1());
-        }
-    };
     QPointer<QWidget> page;
     QLineEdit *neighbour = nullptr;
     const struct
@@ -222,11 +213,11 @@ TEST_F(NibControl, survivesBeingDeletedFromItsChangedEvent)
         std::function<void()> prepare;
         std::function<void()> act;
     } raisers[] = {
-        { true, [&] { box(0)->setFocus(); }, [&] { keys(number); } },
+        { true, [&] { box(0)->setFocus(); }, [&] { type(number); } },
         { false,
             [&] {
                 box(0)->setFocus();
-                keys(bankBranchAccount);
+                type(bankBranchAccount);
             },
             [&] { neighbour->setFocus(); } },
         { true,
@@ -235,7 +226,7 @@ TEST_F(NibControl, survivesBeingDeletedFromItsChangedEvent)
                 box(3)->setFocus();
                 QTest::keyClick(box(3), Qt::Key_End);
             },
-            [&] { keys(QString(24, u'\b')); } },
+            [&] { type(QString(24, u'\b')); } },
     };
     for (const bool wholeForm : { false, true }) {
         for (const auto &raiser : raisers) {
@@ -248,7 +239,7 @@ TEST_F(NibControl, survivesBeingDeletedFromItsChangedEvent)
             page->show();
             QApplication::setActiveWindow(page);
             ASSERT_TRUE(QTest::qWaitForWindowActive(page));
-            alive = nib;
+            const QPointer<cNIB> alive = nib;
             raiser.prepare();
             QObject::connect(nib, &cNIB::Changed, nib, [&] { delete (wholeForm ? page.data() : nib); });
             raiser.act();
