@@ -5,6 +5,7 @@
 #include <climits>
 #include <cmath>
 #include <limits>
+#include <tuple>
 
 using namespace zelctl::nifValidator;
 
@@ -36,20 +37,15 @@ TEST(CheckTaxNumber, acceptsAnyTextForACountryWithoutARoutineButNoEmptyTextForOn
 
 TEST(IsNumericFrom, takesTheLenientReadingOfTheRequestedPart)
 {
-    struct Row
-    {
-        const char *text;
-        int start, length;
-        bool numeric;
-    };
-    const Row rows[] = { { "123456789", 1, 0, true }, { "", 1, 0, false }, { "   ", 1, 0, false },
-        { " 12 ", 1, 0, true }, { "12-", 1, 0, true }, { "-12-", 1, 0, false }, { "1,5", 1, 0, true },
-        { "1.5.1", 1, 0, false }, { "1e-5", 1, 0, true }, { "1E", 1, 0, false }, { "1 2", 1, 0, false },
-        { "U12345678", 2, 0, true }, { "12345678A", 1, 8, true }, { "12345678A", 1, 9, false }, { "123", 4, 0, false },
-        { "123", 0, 0, false }, { "123", 2, 99, true }, { "123", 1, -3, true } };
-    for (const Row &row : rows)
-        EXPECT_EQ(IsNumericFrom(QString(row.text), row.start, row.length), row.numeric)
-            << '"' << row.text << "\" from " << row.start << " length " << row.length;
+    // The text, the start and length asked for, and whether that part reads as a number.
+    const std::tuple<const char *, int, int, bool> rows[] = { { "123456789", 1, 0, true }, { "", 1, 0, false },
+        { "   ", 1, 0, false }, { " 12 ", 1, 0, true }, { "12-", 1, 0, true }, { "-12-", 1, 0, false },
+        { "1,5", 1, 0, true }, { "1.5.1", 1, 0, false }, { "1e-5", 1, 0, true }, { "1E", 1, 0, false },
+        { "1 2", 1, 0, false }, { "U12345678", 2, 0, true }, { "12345678A", 1, 8, true }, { "12345678A", 1, 9, false },
+        { "123", 4, 0, false }, { "123", 0, 0, false }, { "123", 2, 99, true }, { "123", 1, -3, true } };
+    for (const auto &[text, start, length, numeric] : rows)
+        EXPECT_EQ(IsNumericFrom(QString(text), start, length), numeric)
+            << '"' << text << "\" from " << start << " length " << length;
     EXPECT_FALSE(IsNumericFrom(QString::fromUtf8("١٢٣"), 1, 0)) << "only ASCII digits";
 }
 
