@@ -1,6 +1,5 @@
 #include "NifTestSupport.h"
 
-#include "companion/CommandButton.h"
 #include "nif/frmEditNIF.h"
 #include "selection/frmSelectCountry.h"
 #include "support/TestSupport.h"
@@ -103,31 +102,10 @@ TEST_F(NifLifetime, deletedFromInsideEachOfItsEvents)
     }
 }
 
-TEST_F(NifLifetime, deletedFromAnEventRaisedWhileItLoads)
+TEST_F(NifLifetime, deletedWhileSomethingOfItsOwnIsPendingOrLoading)
 {
-    for (const bool wholeWindow : { false, true }) {
-        reset();
-        control->setValue("PT" + PlainNif);
-        const PropertyBag saved = control->Save();
-        // Loading refreshes the valid number it holds, which raises NIFIndicated.
-        onEveryEvent(*control, [this, wholeWindow](const QString &raised) {
-            if (raised.section(':', 0, 0) == "NIFIndicated")
-                goAway(wholeWindow);
-        });
-        control->Load(saved);
-        runDeferredDeletes();
-        EXPECT_TRUE(control.isNull());
-        EXPECT_EQ(window.isNull(), wholeWindow);
-    }
-}
-
-TEST_F(NifLifetime, deletedWhileSomethingOfItsOwnIsPending)
-{
-    const struct
-    {
-        const char *pending;
-        std::function<void()> open;
-    } cases[] = {
+    bool wholeWindow = false;
+    const std::pair<const char *, std::function<void()>> cases[] = {
         { "its menu", [&] { rightClick(box()); } },
         { "its country list",
             [&] {
@@ -141,18 +119,31 @@ TEST_F(NifLifetime, deletedWhileSomethingOfItsOwnIsPending)
                 MenuChooser chooser("mnu_ficha");
                 control->PopupContextMenu();
             } },
+        // Loading refreshes the valid number it holds, which raises NIFIndicated.
+        { "its loading",
+            [&] {
+                control->setValue("PT" + PlainNif);
+                const PropertyBag saved = control->Save();
+                onEveryEvent(*control, [&](const QString &raised) {
+                    if (raised == "NIFIndicated")
+                        goAway(wholeWindow);
+                });
+                control->Load(saved);
+            } },
     };
-    for (const bool wholeWindow : { false, true }) {
-        for (const auto &c : cases) {
+    for (const bool whole : { false, true }) {
+        wholeWindow = whole;
+        for (const auto &[pending, open] : cases) {
             reset();
             MenuChooser menu({}, [&] { goAway(wholeWindow); });
             ModalDriver dialogs([&](QDialog &) {
                 goAway(wholeWindow);
                 return int(QDialog::Rejected);
             });
-            c.open();
+            open();
             runDeferredDeletes();
-            EXPECT_TRUE(control.isNull()) << c.pending;
+            EXPECT_TRUE(control.isNull()) << pending;
+            EXPECT_EQ(window.isNull(), wholeWindow) << pending;
         }
     }
 
@@ -171,12 +162,6 @@ TEST_F(NifLifetime, deletedWhileSomethingOfItsOwnIsPending)
 TEST_F(NifLifetime, recordFormSurvivesItsHostsEvents)
 {
     control->setValue("PT" + PlainNif);
-    const auto press = [](frmEditNIF &form, int index) {
-        for (auto *button : form.findChildren<CommandButton *>()) {
-            if (button->Index() == index)
-                return QTest::mouseClick(button, Qt::LeftButton);
-        }
-    };
     // The host closes the form, or deletes the control, when the name it confirmed arrives.
     QPointer<frmEditNIF> form = new frmEditNIF(window);
     form->SetNIFControl(control);

@@ -1,15 +1,17 @@
 #include "NifTestSupport.h"
 
 #include "nif/PopupMenuPresenter.h"
-#include "nif/frmEditNIF.h"
 #include "support/TestSupport.h"
 
 #include <QAction>
 #include <QClipboard>
 #include <QContextMenuEvent>
+#include <QDialog>
 #include <QMenu>
 #include <QMimeData>
 #include <QTimer>
+
+#include <tuple>
 
 using namespace zelctl;
 using namespace zelctl::test;
@@ -33,6 +35,22 @@ protected:
     }
 
     static QString clipboard() { return QGuiApplication::clipboard()->text(); }
+
+    // Every way the user pastes the clipboard into the box (the middle click is an X11 test).
+    const std::pair<const char *, std::function<void()>> pasteRoutes[4] = {
+        { "menu Paste", [this] { choose("mnu_paste"); } },
+        { "Ctrl+V", [this] { QTest::keyClick(box, Qt::Key_V, Qt::ControlModifier); } },
+        { "Shift+Insert", [this] { QTest::keyClick(box, Qt::Key_Insert, Qt::ShiftModifier); } },
+        { "drop",
+            [this] {
+                QMimeData data;
+                data.setText(clipboard());
+                QDragEnterEvent enter(QPoint(5, 5), Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+                QApplication::sendEvent(box, &enter);
+                QDropEvent drop(QPointF(5, 5), Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+                QApplication::sendEvent(box, &drop);
+            } },
+    };
 };
 
 } // namespace
@@ -53,16 +71,13 @@ TEST_F(NifMenu, offersItsEntriesOnTheBoxAndTheFlag)
     QTest::keyClicks(box, PlainNif);
     rightClick(control->findChild<QWidget *>("cPicture"));
     EXPECT_EQ(chooser.shown, 2);
-    EXPECT_TRUE(chooser.offered("mnu_ficha")) << "a valid number has a record";
     EXPECT_TRUE(chooser.offered("mnu_undo"));
-
-    QTest::keyClick(box, Qt::Key_Backspace);
-    control->PopupContextMenu();
-    EXPECT_FALSE(chooser.offered("mnu_ficha")) << "an invalid number has no record";
-    QTest::keyClicks(box, "9");
-    erase();
-    control->PopupContextMenu();
-    EXPECT_FALSE(chooser.offered("mnu_ficha")) << "nor has an empty box";
+    // Only a valid number has a record.
+    for (const auto &[number, record] : { std::pair { PlainNif, true }, { PlainNif.left(8), false }, { "", false } }) {
+        box->setText(number);
+        control->PopupContextMenu();
+        EXPECT_EQ(chooser.offered("mnu_ficha"), record) << number.toStdString();
+    }
 }
 
 TEST_F(NifMenu, disabledMenuShowsNoMenuAtAll)
@@ -92,93 +107,23 @@ TEST_F(NifMenu, disabledMenuShowsNoMenuAtAll)
     EXPECT_EQ(chooser.shown, 1) << "the menu key opens the control's menu";
 }
 
-TEST_F(NifMenu, copyAndCutTakeTheWholeNumber)
+TEST_F(NifMenu, editingEntriesByMenuAndKey)
 {
     QTest::keyClicks(box, PlainNif);
     box->setSelection(2, 3);
     choose("mnu_Copy");
-    EXPECT_EQ(clipboard(), PlainNif) << "no country code, selection ignored";
+    EXPECT_EQ(clipboard(), PlainNif) << "the whole number, no country code, selection ignored";
     EXPECT_EQ(box->text(), PlainNif);
-
     QGuiApplication::clipboard()->clear();
     box->setSelection(2, 3);
     choose("mnu_cut");
     EXPECT_EQ(clipboard(), PlainNif);
     EXPECT_EQ(box->text(), "126789") << "only the selection goes";
-
     box->deselect();
     choose("mnu_cut");
     EXPECT_EQ(clipboard(), "126789");
     EXPECT_EQ(box->text(), "");
-}
 
-TEST_F(NifMenu, pasteReadsTheCountryCode)
-{
-    struct Case
-    {
-        const char *rule;
-        QString clipboard;
-        QString country;
-        QString text;
-    };
-    const QString longNumber = "US" + QString(298, '7');
-    const Case cases[] = {
-        { "a member state's number", "ES12345678Z", "ES", "12345678Z" },
-        { "a bare number is Portuguese", PlainNif, "PT", PlainNif },
-        { "any code before digits", "us123456", "US", "123456" },
-        { "the first 100 characters", longNumber, "US", QString(98, '7') },
-        { "an empty clipboard", "", "PT", "" },
-        { "text without a code", "abc", "PT", "abc" },
-        { "another country's code only before a number", "US1A", "PT", "US1A" },
-    };
-    for (const Case &c : cases) {
-        control->setCountryID("FR");
-        box->setText("0000");
-        paste(c.clipboard);
-        EXPECT_EQ(control->CountryID(), c.country) << c.rule;
-        EXPECT_EQ(box->text(), c.text) << c.rule;
-    }
-    paste("US123456");
-    EXPECT_TRUE(control->IsValid()) << "numbers of a country without a check are valid";
-
-    // Every way of pasting reads the code, and no character is lost to the Portuguese limit.
-    const std::pair<const char *, std::function<void()>> routes[] = {
-        { "Ctrl+V", [&] { QTest::keyClick(box, Qt::Key_V, Qt::ControlModifier); } },
-        { "Shift+Insert", [&] { QTest::keyClick(box, Qt::Key_Insert, Qt::ShiftModifier); } },
-        { "a host's paste()",
-            [&] {
-                box->selectAll();
-                box->paste();
-            } },
-        { "drop",
-            [&] {
-                QMimeData data;
-                data.setText(clipboard());
-                QDragEnterEvent enter(QPoint(5, 5), Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
-                QApplication::sendEvent(box, &enter);
-                QDropEvent drop(QPointF(5, 5), Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
-                QApplication::sendEvent(box, &drop);
-            } },
-    };
-    const Case everyRoute[] = {
-        { "a member state's number", "ES12345678Z", "ES", "12345678Z" },
-        { "a Portuguese number", PlainNif, "PT", PlainNif },
-        { "a long number is cut to nine", "1234567890123", "PT", PlainNif },
-    };
-    for (const auto &[route, paste] : routes) {
-        for (const Case &c : everyRoute) {
-            control->setCountryID("PT");
-            box->setText("0000");
-            QGuiApplication::clipboard()->setText(c.clipboard);
-            paste();
-            EXPECT_EQ(control->CountryID(), c.country) << route << ": " << c.rule;
-            EXPECT_EQ(box->text(), c.text) << route << ": " << c.rule;
-        }
-    }
-}
-
-TEST_F(NifMenu, deleteSelectAllAndUndoByMenuAndKey)
-{
     QTest::keyClicks(box, "12345");
     choose("mnu_selectall");
     EXPECT_EQ(box->selectedText(), "12345");
@@ -186,9 +131,7 @@ TEST_F(NifMenu, deleteSelectAllAndUndoByMenuAndKey)
     EXPECT_EQ(box->text(), "");
     choose("mnu_undo");
     EXPECT_EQ(box->text(), "12345") << "undo takes the last edit back";
-
     paste("ES12345678Z");
-    EXPECT_EQ(box->text(), "12345678Z");
     choose("mnu_undo");
     EXPECT_EQ(box->text(), "12345");
 
@@ -201,50 +144,100 @@ TEST_F(NifMenu, deleteSelectAllAndUndoByMenuAndKey)
     EXPECT_EQ(control->Value(), "ES12345678Z");
 }
 
-// Locked, disabled, or in a disabled form: only the host's code changes the number.
+// Every route reads the country code and loses no character to the Portuguese limit.
+TEST_F(NifMenu, pasteByEveryRouteReadsTheCountryCode)
+{
+    // The rule, the clipboard, then the country and the text after pasting.
+    const std::tuple<const char *, QString, QString, QString> cases[] = {
+        { "a member state's number", "ES12345678Z", "ES", "12345678Z" },
+        { "a bare number is Portuguese", PlainNif, "PT", PlainNif },
+        { "a long bare number is cut to nine", "1234567890123", "PT", PlainNif },
+        { "any code before digits", "us123456", "US", "123456" },
+        { "the first 100 characters", "US" + QString(298, '7'), "US", QString(98, '7') },
+        { "an empty clipboard", "", "PT", "" },
+        { "text without a code", "abc", "PT", "abc" },
+        { "another country's code only before a number", "US1A", "PT", "US1A" },
+    };
+    for (const auto &[route, pasteBy] : pasteRoutes) {
+        for (const auto &[rule, text, country, after] : cases) {
+            control->setCountryID("FR");
+            box->setText("0000");
+            QGuiApplication::clipboard()->setText(text);
+            pasteBy();
+            EXPECT_EQ(control->CountryID(), country) << route << ": " << rule;
+            EXPECT_EQ(box->text(), after) << route << ": " << rule;
+        }
+    }
+    paste("US123456");
+    EXPECT_TRUE(control->IsValid()) << "numbers of a country without a check are valid";
+
+    // A host's own paste() is read as typing is: a member state's code switches, the limit holds.
+    const std::tuple<const char *, const char *, const char *> pastedByTheHost[]
+        = { { "ES12345678Z", "ES", "12345678Z" }, { "123456789", "PT", "123456789" },
+              { "1234567890123", "PT", "123456789" } };
+    for (const auto &[text, country, after] : pastedByTheHost) {
+        control->setCountryID("PT");
+        box->setText("0000");
+        QGuiApplication::clipboard()->setText(text);
+        box->selectAll();
+        box->paste();
+        EXPECT_EQ(control->CountryID(), country) << text;
+        EXPECT_EQ(box->text(), after) << text;
+    }
+}
+
+// Locked, disabled, or in a disabled form: no route of the user's changes the number.
 TEST_F(NifMenu, aBoxTheUserMayNotChangeKeepsItsText)
 {
-    const struct
-    {
-        const char *state;
-        std::function<void(bool)> set;
-    } states[] = {
-        { "locked", [&](bool on) { control->setLocked(on); } },
-        { "disabled", [&](bool on) { control->setEnabled(!on); } },
+    // The state, how to set it, the background it gives and the menus a right click opens
+    // (a disabled box still offers Copy; a disabled form takes no click).
+    const std::tuple<const char *, std::function<void(bool)>, platform::OleColor, int> states[] = {
+        { "locked", [&](bool on) { control->setLocked(on); }, 0xFFFFFF, 1 },
+        { "disabled", [&](bool on) { control->setEnabled(!on); }, 0xC8C8C8, 1 },
+        { "in a disabled form",
+            [&](bool on) {
+                form.setEnabled(!on);
+                EXPECT_TRUE(control->Enabled()) << "the host's own setting is unchanged";
+            },
+            0xC8C8C8, 0 },
     };
     control->setCountries(GSEL_OnlyEU);
-    for (const auto &state : states) {
+    for (const auto &[state, set, back, menus] : states) {
         control->setValue("ES12345678Z");
-        state.set(true);
+        set(true);
+        EXPECT_EQ(backColour(*control), back) << state;
         MenuChooser chooser;
+        rightClick(box);
+        EXPECT_EQ(chooser.shown, menus) << state;
         control->PopupContextMenu();
         for (const char *entry : { "mnu_undo", "mnu_cut", "mnu_paste", "mnu_Delete" })
-            EXPECT_FALSE(chooser.offered(entry)) << state.state << ": " << entry;
-        EXPECT_TRUE(chooser.offered("mnu_Copy")) << state.state;
+            EXPECT_FALSE(chooser.offered(entry)) << state << ": " << entry;
+        EXPECT_TRUE(chooser.offered("mnu_Copy")) << state;
 
         QGuiApplication::clipboard()->setText("PT" + PlainNif);
-        QTest::keyClick(box, Qt::Key_V, Qt::ControlModifier);
+        for (const auto &[route, pasteBy] : pasteRoutes) {
+            pasteBy();
+            EXPECT_EQ(control->Value(), "ES12345678Z") << state << ": " << route;
+        }
         QTest::keyClick(box, Qt::Key_X, Qt::ControlModifier);
         QTest::mouseClick(control->findChild<QWidget *>("cPicture"), Qt::LeftButton);
-        EXPECT_EQ(control->Value(), "ES12345678Z") << state.state << ": the flag opens no list";
-        EXPECT_EQ(clipboard(), "PT" + PlainNif) << state.state;
-        state.set(false);
+        EXPECT_EQ(control->Value(), "ES12345678Z") << state << ": the flag opens no list";
+        EXPECT_EQ(clipboard(), "PT" + PlainNif) << state;
+        set(false);
     }
+    EXPECT_EQ(backColour(*control), 0xFFFFFFu);
 }
 
 TEST_F(NifMenu, refreshAndRecordEntriesServeTheHolder)
 {
     control->setValue("PT" + AnaNif);
-    ScriptedGrabber *grabber = grabbers.last;
-    grabber->answer("PT" + AnaNif, {});
+    grabbers.last->answer("PT" + AnaNif, {});
     choose("mnu_RefreshNIFInfo");
-    EXPECT_EQ(grabber->fetched, QStringList({ "PT" + AnaNif, "PT" + AnaNif }));
-
-    ModalDriver driver([](QDialog &dialog) {
-        EXPECT_EQ(dialog.windowTitle(), "Editar informação de contribuinte");
+    EXPECT_EQ(grabbers.last->fetched, QStringList({ "PT" + AnaNif, "PT" + AnaNif }));
+    ModalDriver recordForm([](QDialog &dialog) {
         EXPECT_EQ(dialog.findChild<cNIF *>("cNIF1")->Value(), "PT" + AnaNif);
         return int(QDialog::Rejected);
     });
     choose("mnu_ficha");
-    EXPECT_EQ(driver.shownCount(), 1);
+    EXPECT_EQ(recordForm.shownCount(), 1);
 }

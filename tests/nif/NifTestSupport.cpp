@@ -1,10 +1,10 @@
 #include "NifTestSupport.h"
 
+#include "companion/CommandButton.h"
 #include "nif/PopupMenuPresenter.h"
 #include "tips/clsBalloonTip.h"
 
 #include <QAction>
-#include <QPalette>
 #include <QRegularExpression>
 
 namespace zelctl::test {
@@ -94,35 +94,18 @@ void NifFixture::replaceControl()
     log = std::make_unique<EventLog>(*control);
 }
 
-platform::OleColor textColour(cNIF &control)
-{
-    return platform::fromQColor(entryBox(control)->palette().color(QPalette::Text));
-}
-
-platform::OleColor backColour(cNIF &control)
-{
-    return platform::fromQColor(entryBox(control)->palette().color(QPalette::Base));
-}
-
-platform::OleColor statusColour(cNIF &control)
-{
-    return control.findChild<QWidget *>(QStringLiteral("Shape1"))->property("BorderColor").toUInt();
-}
-
 QString tipText(cNIF &control)
 {
     const auto *tip = control.findChild<clsBalloonTip *>(QStringLiteral("tip"));
     return tip ? tip->TipText() : QStringLiteral("<no tip>");
 }
 
-void storeInfo(companion::Declaration &declaration, const QString &key, const QString &value)
+void press(const QWidget &form, int index)
 {
-    declaration.DeclarationData().NifInfoStore().Write(key, value);
-}
-
-QString storedInfo(companion::Declaration &declaration, const QString &key)
-{
-    return declaration.DeclarationData().NifInfoStore().Read(key).toString();
+    for (auto *button : form.findChildren<CommandButton *>()) {
+        if (button->Index() == index)
+            return QTest::mouseClick(button, Qt::LeftButton); // the click may delete the form
+    }
 }
 
 } // namespace zelctl::test

@@ -9,6 +9,7 @@
 #include <QHash>
 #include <QLineEdit>
 #include <QMenu>
+#include <QPalette>
 #include <QStringList>
 #include <QTest>
 
@@ -121,10 +122,26 @@ inline void runDeferredDeletes()
     QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
 }
 
-platform::OleColor textColour(cNIF &control);
-platform::OleColor backColour(cNIF &control);
-platform::OleColor statusColour(cNIF &control);
+inline platform::OleColor colourOf(QWidget *widget, QPalette::ColorRole role)
+{
+    return platform::fromQColor(widget->palette().color(role));
+}
+inline platform::OleColor textColour(cNIF &control)
+{
+    return colourOf(entryBox(control), QPalette::Text);
+}
+inline platform::OleColor backColour(cNIF &control)
+{
+    return colourOf(entryBox(control), QPalette::Base);
+}
+inline platform::OleColor statusColour(cNIF &control)
+{
+    return control.findChild<QWidget *>(QStringLiteral("Shape1"))->property("BorderColor").toUInt();
+}
 QString tipText(cNIF &control);
+
+// Clicks the record form's command button of that index (0 Apply, 1 OK, 2 Cancel, 3 public information).
+void press(const QWidget &form, int index);
 
 // A shown, active form holding a fresh control (focused) and another input to move focus to.
 class NifFixture : public ::testing::Test
@@ -156,9 +173,15 @@ protected:
     companion::JsonDeclaration declaration;
 };
 
-// Writes a value into a declaration's NIF information store.
-void storeInfo(companion::Declaration &declaration, const QString &key, const QString &value);
-QString storedInfo(companion::Declaration &declaration, const QString &key);
+// A declaration's NIF information store.
+inline void storeInfo(companion::Declaration &declaration, const QString &key, const QString &value)
+{
+    declaration.DeclarationData().NifInfoStore().Write(key, value);
+}
+inline QString storedInfo(companion::Declaration &declaration, const QString &key)
+{
+    return declaration.DeclarationData().NifInfoStore().Read(key).toString();
+}
 
 // Valid Portuguese numbers.
 inline const QString AnaNif = QStringLiteral("210345675");

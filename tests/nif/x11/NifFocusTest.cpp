@@ -40,6 +40,7 @@ protected:
 
 TEST_F(NifFocus, focusGivenToTheControlLandsInTheBoxAndWritesMoveNone)
 {
+    EXPECT_EQ(control->height(), 21) << "one line high in a column";
     control->setFocus();
     EXPECT_EQ(QApplication::focusWidget(), entryBox(*control));
     first->setFocus();
