@@ -115,7 +115,7 @@ TEST_F(AttachedTip, createSendsTheWholeTipAndChangesAreSentOnlyWhenTheyShow)
     }
 }
 
-TEST_F(AttachedTip, createTwiceKeepsOneWindowAndOneCountAndReleasingATipGivesBoth)
+TEST_F(AttachedTip, oneWindowAndOneCountPerTipAndNoneWithoutAParentWindow)
 {
     const qint32 before = tip.TooltipCount();
     ASSERT_TRUE(tip.Create());
@@ -139,14 +139,11 @@ TEST_F(AttachedTip, createTwiceKeepsOneWindowAndOneCountAndReleasingATipGivesBot
     }
     EXPECT_TRUE(window.isNull());
     EXPECT_EQ(tip.TooltipCount(), before);
-}
 
-TEST_F(AttachedTip, withoutAParentWindowCreateCountsButMakesNoWindowAndNothingIsSent)
-{
+    // Without a parent window Create counts but makes no window, and nothing is sent.
     QObject windowless;
     tip.setParentControl(&windowless);
     EXPECT_EQ(tip.mvarParentControlhwnd(), 0);
-    const qint32 before = tip.TooltipCount();
     EXPECT_FALSE(tip.Create());
     tip.DestroyTip();
     EXPECT_EQ(tip.TooltipCount(), before + 1);
