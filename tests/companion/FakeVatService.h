@@ -14,16 +14,10 @@ public:
     enum class Manner { Whole, Trickle /* a body byte every 50 ms */, Silent /* never a byte */ };
     struct Reply
     {
-        Reply(int status = 200, QByteArray body = {}, Manner manner = Manner::Whole, QByteArray location = {})
-            : status(status)
-            , body(std::move(body))
-            , manner(manner)
-            , location(std::move(location))
-        { }
-        int status;
-        QByteArray body;
-        Manner manner;
-        QByteArray location;
+        int status = 200;
+        QByteArray body {};
+        Manner manner = Manner::Whole;
+        QByteArray location {};
     };
     struct Request
     {

@@ -2,15 +2,11 @@
 // in for a failing network, and how the database file bears sharing and damage.
 
 #include "LookupTestSupport.h"
-#include "support/TestSupport.h"
 
-#include <QCoreApplication>
 #include <QDir>
 #include <QFile>
 #include <QProcess>
 #include <QTest>
-
-#include <functional>
 
 using namespace zelctl;
 using namespace zelctl::companion;
@@ -76,56 +72,38 @@ TEST_F(NifCacheLookup, aStoredAnswerIsGivenWhileFreshAndStandsInWhenTheNetworkFa
     }
 }
 
-TEST_F(NifCacheLookup, directoryAnswersAreStoredForEveryFetcherOfTheProcess)
+TEST_F(NifCacheLookup, directoryAnswersAndRefusalsAreStoredForEveryFetcherOfTheProcess)
 {
     LookupSettings lookup = settings();
     ChainedNIFGrabber first(lookup);
     fetch(first, DirectoryHolder);
     EXPECT_EQ(first.GetField("SOURCE"), "Diretório local");
-
-    // The directory is now a FIFO, which is refused rather than waited on.
-    lookup.directoryFile = folder.filePath("fifo.json");
-    makeFifo(lookup.directoryFile);
+    lookup.directoryFile = folder.filePath("gone.json");
     ChainedNIFGrabber second(lookup);
     fetch(second, DirectoryHolder);
     EXPECT_EQ(second.HolderName(), "ANA MARIA FERREIRA LOPES");
     EXPECT_EQ(second.GetField("SOURCE"), "Cache local (Diretório local)");
     EXPECT_EQ(NifCache::open(lookup.cacheFile).get(), NifCache::open(lookup.cacheFile).get());
-}
 
-TEST_F(NifCacheLookup, aNumberTheServiceDoesNotKnowIsRememberedAndBeatsAStaleRecord)
-{
-    ASSERT_TRUE(NifCache::open(settings().cacheFile)
+    // A number the service does not know beats a stale record, and is remembered.
+    ASSERT_TRUE(NifCache::open(lookup.cacheFile)
                     ->store(UnknownHolder, { true, OldRecord, QDateTime::currentDateTimeUtc().addDays(-31) }));
     service.answerWith({ 200, R"({"valid":false})" });
-    ChainedNIFGrabber grabber(settings());
-    EXPECT_EQ(fetch(grabber, UnknownHolder), QStringList({ "Starting", "Finished" }));
-    EXPECT_EQ(grabber.LastOutcome(), NifAnswer::Outcome::NotFound);
-    EXPECT_EQ(grabber.GetField("STATUS"), "Não registado no serviço de IVA");
-
+    EXPECT_EQ(fetch(second, UnknownHolder), QStringList({ "Starting", "Finished" }));
+    EXPECT_EQ(second.LastOutcome(), NifAnswer::Outcome::NotFound);
+    EXPECT_EQ(second.GetField("STATUS"), "Não registado no serviço de IVA");
     service.answerWith(FakeVatService::holder("NÃO DEVIA", ""));
-    EXPECT_EQ(fetch(grabber, UnknownHolder), QStringList({ "Starting", "Finished" }));
+    EXPECT_EQ(fetch(second, UnknownHolder), QStringList({ "Starting", "Finished" }));
     EXPECT_EQ(service.requests().size(), 1) << "the stored refusal stands for the service while fresh";
 }
 
 TEST(NifCacheFile, aDamagedFileIsSetAsideAndANewOneMade)
 {
-    const auto overwrite = [](QFile &file, qint64 at) {
-        file.open(QIODevice::ReadWrite);
-        file.seek(at);
-        file.write(QByteArray(4096, '\xff'));
-    };
-    const struct
-    {
-        const char *damage;
-        std::function<void(QFile &)> apply;
-    } cases[] = {
-        { "truncated to half", [](QFile &file) { file.resize(file.size() / 2); } },
-        { "a page overwritten, the size unchanged", [&](QFile &file) { overwrite(file, file.size() / 2); } },
-        { "its header overwritten", [&](QFile &file) { overwrite(file, 0); } },
-    };
-    for (const auto &c : cases) {
-        SCOPED_TRACE(c.damage);
+    // Where 4 KiB are overwritten, in halves of the file; -1 cuts the file in half instead.
+    const std::pair<const char *, int> damages[] = { { "truncated to half", -1 },
+        { "a page overwritten, the size unchanged", 1 }, { "its header overwritten", 0 } };
+    for (const auto &[damage, half] : damages) {
+        SCOPED_TRACE(damage);
         QTemporaryDir folder;
         QFile file(folder.filePath("nifcache.sqlite"));
         const QDateTime now = QDateTime::currentDateTimeUtc();
@@ -134,7 +112,11 @@ TEST(NifCacheFile, aDamagedFileIsSetAsideAndANewOneMade)
             for (int i = 0; i < 300; ++i)
                 cache->store(writerNumber("9", i), { true, OldRecord, now });
         }
-        c.apply(file);
+        ASSERT_TRUE(file.open(QIODevice::ReadWrite));
+        if (half < 0)
+            file.resize(file.size() / 2);
+        else if (file.seek(half * file.size() / 2))
+            file.write(QByteArray(4096, '\xff'));
         file.close();
 
         const std::shared_ptr<NifCache> cache = NifCache::open(file.fileName());

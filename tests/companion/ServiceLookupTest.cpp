@@ -99,6 +99,7 @@ TEST_F(ServiceLookup, showsTheHolderAndSaysWhyEveryFailedLookupFoundNone)
         const char *answer;
         Reply reply;
         QString status;
+        const char *setting = nullptr, *value = nullptr; // changed for this case alone
     } cases[] = {
         { "an unregistered number", { 200, R"({"valid":false,"name":"---","address":"---"})" },
             "Não registado no serviço de IVA" },
@@ -119,14 +120,22 @@ TEST_F(ServiceLookup, showsTheHolderAndSaysWhyEveryFailedLookupFoundNone)
             "Resposta do serviço demasiado grande" },
         { "malformed JSON", { 200, R"({"valid":true,"name":"ANA)" }, "Resposta do serviço ilegível" },
         { "JSON without a validity", { 200, R"({"name":"ANA"})" }, "Resposta do serviço ilegível" },
+        { "remote lookups off", {}, "consultas remotas desligadas", "allowremotenif", "0" },
+        { "an address not on the web", {}, "Endereço do serviço inválido", "nifserviceurl", "file:///etc/passwd" },
+        { "a plain address elsewhere", {}, "Endereço do serviço inválido", "nifserviceurl", "http://192.0.2.1/x" },
     };
     // A control keeps the holder it found without asking again; a number typed into a new
     // one is asked about, and every failure ends the lookup with the fetcher saying why.
     for (const auto &c : cases) {
         SCOPED_TRACE(c.answer);
         service.answerWith(c.reply);
+        if (c.setting)
+            saveSetting(c.setting, c.value);
+        const qsizetype asked = service.requests().size();
         NifForm other;
         other.typeAndWait("123456789");
+        EXPECT_TRUE(!c.setting || service.requests().size() == asked) << "the number stays on the machine";
+        SetUp();
         EXPECT_EQ(other.events, QStringList { "DataFinished" }) << "no information, no name";
         const QString why = other.control->findChild<NIFGrabber *>()->GetField("STATUS");
         EXPECT_TRUE(why.contains(c.status)) << why.toStdString();
@@ -139,25 +148,6 @@ TEST_F(ServiceLookup, showsTheHolderAndSaysWhyEveryFailedLookupFoundNone)
     EXPECT_EQ(nif.statusMark(), NamedMark);
     EXPECT_EQ(nif.tip(), tip);
     EXPECT_EQ(service.abandoned(), 2) << "the slow and the silent connection were closed by the fetcher";
-}
-
-TEST_F(ServiceLookup, numbersStayOnTheMachineUnlessTheUserAllowsRemoteLookups)
-{
-    saveSetting("allowremotenif", "0");
-    NifForm nif;
-    nif.typeAndWait("123456789");
-    EXPECT_TRUE(service.requests().isEmpty());
-    EXPECT_EQ(nif.events, QStringList { "DataFinished" });
-    EXPECT_TRUE(nif.control->Information("status").contains("consultas remotas desligadas"));
-    EXPECT_EQ(nif.statusMark(), WhiteMark);
-
-    saveSetting("allowremotenif", "1");
-    for (const char *address : { "file:///etc/passwd", "http://192.0.2.1/plain-text" }) {
-        saveSetting("nifserviceurl", address);
-        ChainedNIFGrabber grabber;
-        fetch(grabber, UnknownHolder);
-        EXPECT_TRUE(grabber.GetField("STATUS").startsWith("Endereço do serviço inválido")) << address;
-    }
 }
 
 TEST_F(ServiceLookup, theFormMayGoWhileTheServiceIsAskedOrFromTheLookupsEvents)

@@ -70,7 +70,6 @@ TEST_F(HoverTip, aCentredTipSitsUnderTheToolAndGoesWhenThePointerLeavesOrPresses
     EXPECT_EQ(window()->anchor(), tool->mapToGlobal(QPoint(49, 39)));
     leave();
     EXPECT_FALSE(window()->isVisible());
-
     QTest::mouseMove(tool, QPoint(12, 10));
     ASSERT_TRUE(becomes(true));
     QTest::mousePress(tool, Qt::LeftButton, {}, QPoint(12, 10));
@@ -84,19 +83,18 @@ TEST_F(HoverTip, aToolByRectangleKeepsTheAreaOfCreateAndATipWithoutTextNeverShow
     tip.SetTimeout(0, 60000);
     tip.Create();
     tool->resize(200, 40);
-    QTest::mouseMove(tool, QPoint(150, 10));
-    QCoreApplication::processEvents();
-    QCoreApplication::processEvents();
-    EXPECT_FALSE(window()->isVisible()) << "outside the area the tool had at Create";
-    QTest::mouseMove(tool, QPoint(50, 10));
-    ASSERT_TRUE(becomes(true));
-
+    const auto restsAt = [&](QPoint at) {
+        QTest::mouseMove(tool, at);
+        QCoreApplication::processEvents();
+        QCoreApplication::processEvents();
+        return window()->isVisible();
+    };
+    EXPECT_FALSE(restsAt(QPoint(150, 10))) << "outside the area the tool had at Create";
+    EXPECT_TRUE(restsAt(QPoint(50, 10)));
     leave();
     tip.setTipText("");
     tip.Create();
-    QTest::mouseMove(tool, QPoint(10, 10));
-    QCoreApplication::processEvents();
-    QCoreApplication::processEvents();
+    restsAt(QPoint(10, 10));
     tip.ShowNow();
     EXPECT_FALSE(window()->isVisible());
 }

@@ -1,0 +1,381 @@
+// What a screen reader hears of each control, and what it hears change as the user drives it.
+
+#include "common/modFuncs.h"
+#include "companion/CommandButton.h"
+#include "gif/ucAniGIF.h"
+#include "nib/NibCheckDigits.h"
+#include "nib/cNIB.h"
+#include "nif/cNIF.h"
+#include "platform/Settings.h"
+#include "selection/clsGFXSelection.h"
+#include "selection/frmSelectCountry.h"
+#include "selection/frmSelector.h"
+#include "skins/cSlider.h"
+#include "skins/skGoButton.h"
+#include "skins/skNumber.h"
+#include "skins/skSubMenu.h"
+#include "support/TestSupport.h"
+#include "tips/InfoButton.h"
+#include "tips/TooltipWindow.h"
+
+#include <QApplication>
+#include <QtGui/private/qguiapplication_p.h>
+#include <qpa/qplatformaccessibility.h>
+#include <qpa/qplatformintegration.h>
+
+#include <QLabel>
+#include <QLineEdit>
+#include <QPointer>
+#include <QSignalSpy>
+#include <QTest>
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <bit>
+
+using namespace zelctl;
+using namespace zelctl::test;
+
+namespace {
+
+QAccessibleInterface *accessible(QObject *object)
+{
+    return QAccessible::queryAccessibleInterface(object);
+}
+
+QString name(QObject *object)
+{
+    return accessible(object)->text(QAccessible::Name);
+}
+
+QString description(QObject *object)
+{
+    return accessible(object)->text(QAccessible::Description);
+}
+
+QAccessible::State state(QObject *object)
+{
+    return accessible(object)->state();
+}
+
+QLineEdit *box(QWidget *control, int index = 0)
+{
+    return control->findChildren<QLineEdit *>().at(index);
+}
+
+// Qt's accessibility switched on, as the arrival of a screen reader does (a platform's bridge
+// does it when one asks, Qt's own tests through the platform's object, as here), the events
+// raised recorded instead of sent to a bridge, and a shown form.
+class Accessibility : public ::testing::Test
+{
+protected:
+    void SetUp() override
+    {
+        // A valid number is not looked up: the holder's name is the test's to give.
+        platform::SaveSetting("ZEL", "Config", "allowautonif", "0");
+        QAccessible::installUpdateHandler(&record);
+        setActive(true);
+        form.show();
+    }
+    void TearDown() override
+    {
+        setActive(false);
+        QAccessible::installUpdateHandler(nullptr);
+        events.clear();
+    }
+
+    template <typename Control> Control *add()
+    {
+        auto *control = new Control(&form);
+        control->InitNew();
+        control->show();
+        return control;
+    }
+
+    // How many events of a kind were raised about the object.
+    static int count(const QObject *object, QAccessible::Event type)
+    {
+        return int(std::count_if(events.cbegin(), events.cend(),
+            [&](const Event &event) { return event.object == object && event.type == type; }));
+    }
+    // Every state that a state change about the object turned on or off.
+    static QAccessible::State changedStates(const QObject *object)
+    {
+        static_assert(sizeof(QAccessible::State) == sizeof(quint64));
+        quint64 bits = 0;
+        for (const Event &event : events)
+            bits |= event.object == object ? std::bit_cast<quint64>(event.changed) : 0;
+        return std::bit_cast<QAccessible::State>(bits);
+    }
+
+    struct Event
+    {
+        QAccessible::Event type;
+        QPointer<QObject> object;
+        QAccessible::State changed;
+    };
+    static inline QList<Event> events;
+    QWidget form;
+
+private:
+    static void setActive(bool active)
+    {
+        if (QPlatformAccessibility *platform = QGuiApplicationPrivate::platformIntegration()->accessibility())
+            platform->setActive(active);
+    }
+    static void record(QAccessibleEvent *event)
+    {
+        events.append({ event->type(), event->object(),
+            event->type() == QAccessible::StateChanged
+                ? static_cast<QAccessibleStateChangeEvent *>(event)->changedStates()
+                : QAccessible::State() });
+    }
+};
+
+TEST_F(Accessibility, everyControlHasItsRoleNameAndDescriptionAndTheButtonsArePressedByKeyOrAction)
+{
+    auto *go = add<skGoButton>();
+    go->setTooltip("Página seguinte");
+    auto *number = add<skNumber>();
+    number->setCaption("2");
+    auto *item = add<skSubMenu>();
+    item->setCaption("Anexo A");
+    auto *info = add<InfoButton>();
+    info->setToolTipTitle("Atenção");
+    info->setTipText("O prazo termina em breve.||Confirme os rendimentos.");
+    info->setAction("click");
+    auto *slider = add<cSlider>();
+    auto *gif = add<ucAniGIF>();
+    gif->extender().setToolTipText("A aguardar");
+    auto *nif = add<cNIF>();
+    auto *nib = add<cNIB>();
+    const struct
+    {
+        QWidget *widget;
+        QAccessible::Role role;
+        QString name, description;
+        const char *click = nullptr;
+    } rows[] = {
+        { go, QAccessible::Button, "Página seguinte", "", SIGNAL(Click()) },
+        { number, QAccessible::Button, "2", "", SIGNAL(Clicked()) },
+        { item, QAccessible::Button, "Anexo A", "", SIGNAL(Clicked()) },
+        { info, QAccessible::Button, "Atenção", "O prazo termina em breve.\nConfirme os rendimentos.",
+            SIGNAL(Click()) },
+        { slider, QAccessible::Grouping, "Painel deslizante", "" },
+        { slider->button(), QAccessible::Button, "Abrir o painel", "" },
+        { gif, QAccessible::Graphic, "A aguardar", "Sem imagem" },
+        { nif, QAccessible::EditableText, "NIF", "" },
+        { nif->findChild<QWidget *>("cPicture"), QAccessible::Button, "Portugal", "" },
+        { nib, QAccessible::EditableText, "NIB", "" },
+        { box(nib, 2), QAccessible::EditableText, "Conta", "Parte 3 de 4 do NIB" },
+    };
+    for (const auto &row : rows) {
+        SCOPED_TRACE(row.widget->metaObject()->className() + (' ' + row.name.toStdString()));
+        QAccessibleInterface *iface = accessible(row.widget);
+        EXPECT_EQ(iface->role(), row.role);
+        EXPECT_EQ(iface->text(QAccessible::Name), row.name);
+        EXPECT_EQ(iface->text(QAccessible::Description), row.description);
+        if (!row.click)
+            continue;
+        EXPECT_EQ(row.widget->focusPolicy(), Qt::TabFocus) << "Tab reaches it, a click leaves the focus";
+        QSignalSpy clicks(row.widget, row.click);
+        QTest::keyClick(row.widget, Qt::Key_Space);
+        QTest::keyClick(row.widget, Qt::Key_Return);
+        EXPECT_EQ(clicks.size(), 2);
+        iface->actionInterface()->doAction(QAccessibleActionInterface::pressAction());
+        ASSERT_TRUE(QTest::qWaitFor([&] { return clicks.size() == 3; }));
+    }
+    EXPECT_EQ(accessible(box(nib, 2))->parent()->object(), nib);
+    EXPECT_TRUE(accessible(slider->button())->state().expandable);
+    EXPECT_EQ(accessible(gif)->imageInterface()->imagePosition(), gif->mapToGlobal(QPoint(0, 0)));
+}
+
+TEST_F(Accessibility, whatTheUserChangesIsHeardAsItHappens)
+{
+    auto *go = add<skGoButton>();
+    auto *number = add<skNumber>();
+    auto *item = add<skSubMenu>();
+    auto *slider = add<cSlider>();
+    QWidget *toggle = slider->button();
+    auto *nif = add<cNIF>();
+    QWidget *flag = nif->findChild<QWidget *>("cPicture");
+    auto *nib = add<cNIB>();
+    auto *button = new CommandButton(&form);
+    button->setToggle(true);
+    auto *gif = add<ucAniGIF>();
+    ASSERT_TRUE(gif->LoadAnimatedGIF_File(modFuncs::GetDataPath() + "gif/aguarde.gif"));
+    const QString frames = QString("Imagem animada, %1 imagens, ").arg(gif->FrameCount());
+    ASSERT_TRUE(QTest::qWaitFor([&] { return description(gif) == frames + "em movimento"; }));
+    EXPECT_TRUE(state(gif).animated);
+    EXPECT_EQ(accessible(gif)->imageInterface()->imageDescription(), frames + "em movimento");
+    QTest::mousePress(button, Qt::LeftButton);
+    EXPECT_TRUE(state(button).pressed && state(button).checkable) << "held down";
+    const QString nibNumber = "0035065100000012345";
+    const QString goodNib = nibNumber + CalculateNibCheckDigits(nibNumber);
+    // Each change, the event it must raise (exactly once or at least once), and what is heard after.
+    const struct
+    {
+        const char *change;
+        std::function<void()> act;
+        QObject *object;
+        QAccessible::Event event;
+        bool once;
+        std::function<bool()> heard;
+    } changes[] = {
+        { "a skinned button made active", [&] { go->setActive(true); }, go, QAccessible::StateChanged, false,
+            [&] { return state(go).pressed && changedStates(go).pressed; } },
+        { "a number made active", [&] { number->setActive(true); }, number, QAccessible::StateChanged, false,
+            [&] { return state(number).checked && changedStates(number).checked; } },
+        { "a menu item made active", [&] { item->setActive(true); }, item, QAccessible::StateChanged, false,
+            [&] { return state(item).checked && changedStates(item).checked; } },
+        { "a toggle button released", [&] { QTest::mouseRelease(button, Qt::LeftButton); }, button,
+            QAccessible::StateChanged, false, [&] { return state(button).checked && changedStates(button).checked; } },
+        { "the slider opened with Space", [&] { QTest::keyClick(toggle, Qt::Key_Space); }, toggle,
+            QAccessible::NameChanged, false,
+            [&] {
+                return name(toggle) == "Fechar o painel" && state(toggle).expanded && changedStates(toggle).expanded
+                    && state(slider).expanded;
+            } },
+        { "an animation paused", [&] { gif->setAction(ucAniGIF::gfaPause); }, gif, QAccessible::DescriptionChanged,
+            true, [&] { return description(gif) == frames + "em pausa" && changedStates(gif).animated; } },
+        { "a NIF typed", [&] { QTest::keyClicks(box(nif), "123456789"); }, nif, QAccessible::ValueChanged, false,
+            [&] {
+                return accessible(nif)->text(QAccessible::Value) == "Portugal, 123456789"
+                    && description(nif) == "NIF válido";
+            } },
+        { "a NIF made wrong", [&] { QTest::keyClick(box(nif), Qt::Key_Backspace), QTest::keyClick(box(nif), '8'); },
+            nif, QAccessible::StateChanged, false,
+            [&] {
+                return state(nif).invalid && changedStates(nif).invalid && description(nif) == "NIF inválido"
+                    && name(box(nif)) == "NIF" && description(box(nif)) == "NIF inválido";
+            } },
+        { "a NIF's holder", [&] { nif->setValue("PT123456789"), events.clear(), nif->setNome("Maria Silva"); }, nif,
+            QAccessible::DescriptionChanged, true,
+            [&] { return description(nif) == "NIF válido. Titular: Maria Silva"; } },
+        { "a NIF locked", [&] { nif->setLocked(true); }, nif, QAccessible::StateChanged, false,
+            [&] { return state(nif).readOnly && !state(nif).editable; } },
+        { "a NIF disabled", [&] { nif->setEnabled(false); }, nif, QAccessible::StateChanged, false,
+            [&] { return changedStates(nif).disabled; } },
+        { "a Spanish NIF", [&] { nif->setValue("ES12345678Z"); }, flag, QAccessible::NameChanged, true,
+            [&] { return name(flag) == "Espanha"; } },
+        { "a wrong NIB", [&] { nib->setText(nibNumber + (goodNib.endsWith("00") ? "01" : "00")); }, nib,
+            QAccessible::StateChanged, false,
+            [&] { return changedStates(nib).invalid && description(nib) == "NIB inválido"; } },
+        { "a right NIB", [&] { nib->setText(goodNib); }, nib, QAccessible::DescriptionChanged, true,
+            [&] { return description(nib) == "NIB válido" && accessible(nib)->text(QAccessible::Value) == goodNib; } },
+    };
+    for (const auto &c : changes) {
+        SCOPED_TRACE(c.change);
+        events.clear();
+        c.act();
+        const int raised = count(c.object, c.event);
+        EXPECT_TRUE(c.once ? raised == 1 : raised >= 1) << raised;
+        EXPECT_TRUE(c.heard());
+    }
+}
+
+TEST_F(Accessibility, theInformationTipIsAnnouncedAsEnterShowsIt)
+{
+    auto *info = add<InfoButton>();
+    info->setToolTipTitle("Atenção");
+    info->setTipText("O prazo termina em breve.||Confirme os rendimentos.");
+    QTest::keyClick(info, Qt::Key_Return);
+    TooltipWindow *shown = nullptr;
+    for (QWidget *window : QApplication::topLevelWidgets())
+        if (auto *tip = qobject_cast<TooltipWindow *>(window); tip && tip->isVisible())
+            shown = tip;
+    ASSERT_TRUE(shown);
+    EXPECT_EQ(count(shown, QAccessible::ObjectShow), 1);
+    EXPECT_EQ(accessible(shown)->role(), QAccessible::ToolTip);
+    EXPECT_EQ(name(shown), "Atenção");
+    EXPECT_EQ(description(shown), "O prazo termina em breve.\nConfirme os rendimentos.");
+}
+
+TEST_F(Accessibility, nifIsNamedByItsAccessibleNameLabelTooltipOrName)
+{
+    auto *nif = add<cNIF>();
+    const std::pair<std::function<void()>, QString> steps[] = {
+        { [&] { nif->extender().setName("txtNIF"); }, "txtNIF" },
+        { [&] { nif->extender().setToolTipText("Contribuinte"); }, "Contribuinte" },
+        { [&] { (new QLabel("&NIF do titular:", &form))->setBuddy(nif); }, "NIF do titular:" },
+        { [&] { nif->setAccessibleName("NIF do cônjuge"); }, "NIF do cônjuge" },
+    };
+    for (const auto &[step, name] : steps) {
+        step();
+        EXPECT_EQ(accessible(nif)->text(QAccessible::Name), name);
+    }
+}
+
+TEST_F(Accessibility, theEntriesListsAndMarksAnswerTheKeysAndTheEntriesMayGoInTheirOwnEvents)
+{
+    QPointer<cNIF> nif = add<cNIF>();
+    nif->setCountries(GSEL_OnlyEU);
+    QStringList chosen = { "FR", "DE", "IT" };
+    ModalDriver countryList([&chosen](QDialog &dialog) {
+        qobject_cast<frmSelectCountry *>(&dialog)->setTag(chosen.takeFirst());
+        return int(QDialog::Accepted);
+    });
+    QAccessibleActionInterface *flag = accessible(nif->findChild<QWidget *>("cPicture"))->actionInterface();
+    EXPECT_EQ(flag->keyBindingsForAction(flag->pressAction()).size(), 2) << "Alt+Down and F4";
+    flag->doAction(flag->pressAction());
+    EXPECT_EQ(countryList.shownCount(), 0) << "whoever pressed has had the answer first";
+    ASSERT_TRUE(QTest::qWaitFor([&] { return nif->CountryID() == "FR"; }));
+    QTest::keyClick(box(nif), Qt::Key_Down, Qt::AltModifier);
+    EXPECT_EQ(nif->CountryID(), "DE");
+    nif->setLocked(true);
+    QTest::keyClick(box(nif), Qt::Key_F4);
+    EXPECT_EQ(countryList.shownCount(), 2) << "a locked box offers no country list";
+    nif->setLocked(false);
+    QTest::keyClick(box(nif), Qt::Key_F4);
+    EXPECT_EQ(nif->CountryID(), "IT");
+
+    QPointer<cNIB> nib = add<cNIB>();
+    nib->setText("003506510000001234500");
+    QWidget *mark = nib->findChild<QWidget *>("Image1");
+    EXPECT_EQ(mark->focusPolicy(), Qt::TabFocus);
+    EXPECT_EQ(accessible(mark)->role(), QAccessible::Graphic);
+    MessageBoxRecorder boxes;
+    QTest::keyClick(mark, Qt::Key_Space);
+    EXPECT_EQ(boxes.shown().size(), 1) << "Space explains the mark, as a click does";
+
+    QObject::connect(nif, &cNIF::Changed, nif, [&nif] { delete nif; });
+    QTest::keyClick(box(nif), Qt::Key_1);
+    EXPECT_TRUE(nif.isNull());
+    QObject::connect(nib, &cNIB::Changed, nib, [&nib] { delete nib; });
+    nib->setText("003506510000001234580");
+    EXPECT_TRUE(nib.isNull());
+}
+
+TEST_F(Accessibility, selectionDialogHasATitleAndItsItemsAreButtonsNamedWhole)
+{
+    frmSelector::setZoomStepInterval(0);
+    QList<GFXItem> items;
+    for (int i = 0; i < 25; ++i) {
+        items.append(GFXItem());
+        items.last().Title = QString("Rendimentos da categoria %1 obtidos no estrangeiro sem retenção").arg(i);
+        items.last().Selected = i == 3;
+    }
+    GFXSelection settings;
+    settings.Title = "Categoria";
+    ModalDriver driver([&](QDialog &dialog) {
+        dialog.show();
+        EXPECT_EQ(accessible(&dialog)->role(), QAccessible::Dialog);
+        EXPECT_EQ(accessible(&dialog)->text(QAccessible::Name), "Categoria");
+        EXPECT_EQ(accessible(dialog.findChild<QLineEdit *>("txtFilter"))->text(QAccessible::Name), "Procurar");
+        for (CommandButton *button : dialog.findChildren<CommandButton *>("btnSelector")) {
+            if (button->isHidden())
+                continue;
+            QAccessibleInterface *iface = accessible(button);
+            EXPECT_EQ(iface->role(), QAccessible::Button);
+            EXPECT_EQ(iface->text(QAccessible::Name), button->Caption()) << "read whole, though cut short on screen";
+            EXPECT_NE(button->text(), button->Caption());
+            EXPECT_EQ(iface->state().checked, button->Index() == 3);
+        }
+        return int(QDialog::Rejected);
+    });
+    clsGFXSelection().SelectFrom(settings, items);
+    EXPECT_EQ(driver.shownCount(), 1);
+}
+
+} // namespace
