@@ -162,6 +162,9 @@ TEST_F(SelectionTest, nothingToChooseFromShowsNoDialog)
     EXPECT_EQ(selectCountry(GSEL_OnlyEU, filter, [](QDialog &) {}), "");
     ASSERT_EQ(messages.shown().size(), 1);
     EXPECT_EQ(messages.shown()[0].title, "Ficheiro com acesso negado ou inexistente");
+    // A line without a name names no country: one is too few to choose from.
+    selection.setCountryFile(test::writeFile(folder.filePath("few.txt"), "620\tPT\tPRT\tPortugal\r\n724\tES\tESP\r\n"));
+    EXPECT_EQ(selectCountry(GSEL_All, filter, [](QDialog &) {}), "");
     EXPECT_EQ(shown, 0);
 }
 

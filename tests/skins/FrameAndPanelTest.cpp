@@ -71,6 +71,7 @@ TEST_F(Frame, raisesPointerEventsButTracksNoHover)
 TEST_F(Frame, persistsBothValuesAlwaysAndPreviewsInDesignModeOnly)
 {
     EXPECT_EQ(frame->Save().names(), (QStringList { "TransparentBack", "DebugDesignImgID" }));
+    EXPECT_EQ(QLabel(frame).font(), QFont(QStringLiteral("Arial"), 11, QFont::Bold)) << "what it holds is in bold";
     Ambient designer;
     designer.UserMode = false;
     skQuadro preview(&form);

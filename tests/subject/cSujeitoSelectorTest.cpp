@@ -195,6 +195,9 @@ TEST_F(SubjectSelector, selectingByEachPropertyAndReadingBack)
             EXPECT_EQ(button(QLatin1Char(*step.pressed))->Caption(), step.caption);
         }
     }
+    selector->setCanSelectNone(true);
+    selector->setSelectedSujeito("");
+    EXPECT_EQ(pressed(), "") << "an empty choice, now that CanSelectNone allows it";
     EXPECT_TRUE(events.isEmpty());
 }
 
