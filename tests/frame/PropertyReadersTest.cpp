@@ -11,6 +11,32 @@ using namespace zelctl;
 
 namespace {
 
+constexpr qint64 Fallback = -1;
+constexpr auto Nan = std::numeric_limits<double>::quiet_NaN();
+constexpr auto LongMin = std::numeric_limits<qint32>::min();
+
+// Colour; Boolean; a Long in 10..100 that clamps or refuses; a Long of the whole range.
+enum Reader { Colour, Boolean, Clamp, Refuse, Long };
+
+// What `reader` makes of the bag, Fallback where it falls back to its default.
+qint64 read(Reader reader, const PropertyBag &bag)
+{
+    switch (reader) {
+    case Colour: {
+        const platform::OleColor colour = readColor(bag, "P", 0x123456);
+        return colour == 0x123456 ? Fallback : colour;
+    }
+    case Boolean: {
+        const bool withFalse = readBoolean(bag, "P", false);
+        return withFalse == readBoolean(bag, "P", true) ? withFalse : Fallback;
+    }
+    case Long:
+        return readLong(bag, "P", Fallback);
+    default:
+        return readLong(bag, "P", Fallback, 10, 100, reader == Clamp ? OutOfRange::Clamp : OutOfRange::Refuse);
+    }
+}
+
 PropertyBag bagWith(const QString &name, const QVariant &value)
 {
     PropertyBag bag;
@@ -20,124 +46,91 @@ PropertyBag bagWith(const QString &name, const QVariant &value)
 
 } // namespace
 
-TEST(PropertyReaders, readColoursInEveryFormAFormFileHolds)
-{
-    constexpr platform::OleColor fallback = 0x123456;
-    const struct
-    {
-        QVariant stored;
-        platform::OleColor colour;
-    } cases[] = {
-        { 65280, 0x00FF00 },
-        { qint64(0x8000000F), 0x8000000F },
-        { 65280.0, 0x00FF00 },
-        { "65280", 0x00FF00 },
-        { " -2147483633 ", 0x8000000F }, // a system colour kept as a signed Long
-        { "&H00FF00&", 0x00FF00 },
-        { "&HFF00&", 0x00FF00 },
-        { "&hff00", 0x00FF00 },
-        { "&H8000000F&", 0x8000000F },
-        { "&H100000000&", fallback },
-        { "&H&", fallback },
-        { "&HGG&", fallback },
-        { "verde", fallback },
-        { "", fallback },
-        { 12.5, fallback },
-        { qint64(1) << 40, fallback },
-        { true, fallback },
-    };
-    for (const auto &c : cases) {
-        EXPECT_EQ(readColor(bagWith("C", c.stored), "C", fallback), c.colour) << c.stored.toString().toStdString();
-    }
-    EXPECT_EQ(readColor(PropertyBag(), "C", fallback), fallback);
-}
-
-TEST(PropertyReaders, everyControlReadsItsColoursThroughIt)
+// Every form a form file may hold a value in, as each reader takes it.
+TEST(PropertyReaders, readEveryFormAFormFileHolds)
 {
     const struct
     {
-        const char *control;
-        const char *name;
-        const char *property;
-    } colours[] = {
-        { "cNIF", "BackColor", "BackColor" },
-        { "cNIB", "BackColor", "BackColor" },
-        { "skNumber", "Background", "Background" },
-        { "skNumber", "ForegroundActive", "ForegroundActive" },
-        { "skSubMenu", "HoverBackColor", "HoverBackColor" },
-        { "skSubMenu", "TransparentBack", "TransparencyColor" },
-        { "skQuadro", "TransparentBack", "TransparencyColor" },
-        { "skGrowth", "CaptionColor", "CaptionColor" },
-    };
-    for (const auto &c : colours) {
-        std::unique_ptr<QObject> object(CreateObject(QString::fromLatin1(c.control)));
-        auto *control = qobject_cast<UserControl *>(object.get());
-        ASSERT_NE(control, nullptr) << c.control;
-        control->Load(bagWith(QString::fromLatin1(c.name), "&H00FF00&"));
-        EXPECT_EQ(control->property(c.property).toUInt(), 0x00FF00u) << c.control << " " << c.name;
-    }
-}
-
-TEST(PropertyReaders, readBooleansWrittenAsTextOrNumbers)
-{
-    for (const QVariant &yes : { QVariant(true), QVariant(-1), QVariant("True"), QVariant(" -1"), QVariant("1") })
-        EXPECT_TRUE(readBoolean(bagWith("B", yes), "B", false)) << yes.toString().toStdString();
-    for (const QVariant &no : { QVariant(false), QVariant(0), QVariant("false"), QVariant("0") })
-        EXPECT_FALSE(readBoolean(bagWith("B", no), "B", true)) << no.toString().toStdString();
-    EXPECT_TRUE(readBoolean(bagWith("B", "talvez"), "B", true));
-    EXPECT_FALSE(readBoolean(PropertyBag(), "B", false));
-}
-
-TEST(PropertyReaders, readLongsIntoTheirRange)
-{
-    const struct
-    {
-        QVariant stored;
-        OutOfRange rule;
-        qint32 value;
-    } cases[] = {
-        { 70, OutOfRange::Refuse, 70 },
-        { "  70 ", OutOfRange::Refuse, 70 },
-        { 70.5, OutOfRange::Refuse, 70 }, // halves to even
-        { 71.5, OutOfRange::Refuse, 72 },
-        { 10, OutOfRange::Refuse, 10 },
-        { 9, OutOfRange::Refuse, -1 },
-        { 9, OutOfRange::Clamp, 10 },
-        { 101, OutOfRange::Clamp, 100 },
-        { 1e300, OutOfRange::Clamp, 100 },
-        { -1e300, OutOfRange::Clamp, 10 },
-        { 1e300, OutOfRange::Refuse, -1 },
-        { "1e300", OutOfRange::Refuse, -1 },
-        { qint64(1) << 62, OutOfRange::Clamp, 100 },
-        { quint64(1) << 63, OutOfRange::Refuse, -1 },
-        { std::numeric_limits<double>::quiet_NaN(), OutOfRange::Clamp, -1 },
-        { std::numeric_limits<double>::infinity(), OutOfRange::Clamp, -1 },
-        { "inf", OutOfRange::Clamp, -1 },
-        { "setenta", OutOfRange::Clamp, -1 },
-        { QByteArray("70"), OutOfRange::Clamp, -1 },
-    };
-    for (const auto &c : cases) {
-        EXPECT_EQ(readLong(bagWith("N", c.stored), "N", -1, 10, 100, c.rule), c.value)
-            << c.stored.toString().toStdString();
-    }
-    EXPECT_EQ(readLong(PropertyBag(), "N", -1, 10, 100, OutOfRange::Clamp), -1);
-    EXPECT_EQ(readLong(bagWith("N", -2147483648.0), "N", 0), std::numeric_limits<qint32>::min());
-    EXPECT_EQ(readLong(bagWith("N", 2147483648.0), "N", 0), 0);
-    EXPECT_EQ(readColor(bagWith("C", 1e300), "C", 7), 7u) << "no out-of-range conversion";
-}
-
-// Every persisted number of every control, beyond its range: the control keeps a value
-// of the range, as its setter would.
-TEST(PropertyReaders, everyControlReadsItsNumbersIntoRange)
-{
-    const struct
-    {
-        const char *control;
-        const char *name;
-        const char *property;
+        Reader reader;
         QVariant stored;
         qint64 value;
-    } numbers[] = {
+    } cases[] = {
+        { Colour, 65280, 0x00FF00 },
+        { Colour, qint64(0x8000000F), 0x8000000F },
+        { Colour, 65280.0, 0x00FF00 },
+        { Colour, "65280", 0x00FF00 },
+        { Colour, " -2147483633 ", 0x8000000F }, // a system colour kept as a signed Long
+        { Colour, "&H00FF00&", 0x00FF00 },
+        { Colour, "&HFF00&", 0x00FF00 },
+        { Colour, "&hff00", 0x00FF00 },
+        { Colour, "&H8000000F&", 0x8000000F },
+        { Colour, "&H100000000&", Fallback },
+        { Colour, "&H&", Fallback },
+        { Colour, "&HGG&", Fallback },
+        { Colour, "verde", Fallback },
+        { Colour, "", Fallback },
+        { Colour, 12.5, Fallback },
+        { Colour, qint64(1) << 40, Fallback },
+        { Colour, 1e300, Fallback },
+        { Colour, true, Fallback },
+        { Boolean, true, 1 },
+        { Boolean, -1, 1 },
+        { Boolean, "True", 1 },
+        { Boolean, " -1", 1 },
+        { Boolean, "1", 1 },
+        { Boolean, false, 0 },
+        { Boolean, 0, 0 },
+        { Boolean, "false", 0 },
+        { Boolean, "0", 0 },
+        { Boolean, "talvez", Fallback },
+        { Refuse, 70, 70 },
+        { Refuse, "  70 ", 70 },
+        { Refuse, 70.5, 70 }, // halves to even
+        { Refuse, 71.5, 72 },
+        { Refuse, 10, 10 },
+        { Refuse, 9, Fallback },
+        { Clamp, 9, 10 },
+        { Clamp, 101, 100 },
+        { Clamp, 1e300, 100 },
+        { Clamp, -1e300, 10 },
+        { Refuse, 1e300, Fallback },
+        { Refuse, "1e300", Fallback },
+        { Clamp, qint64(1) << 62, 100 },
+        { Refuse, quint64(1) << 63, Fallback },
+        { Clamp, Nan, Fallback },
+        { Clamp, std::numeric_limits<double>::infinity(), Fallback },
+        { Clamp, "inf", Fallback },
+        { Clamp, "setenta", Fallback },
+        { Clamp, QByteArray("70"), Fallback },
+        { Long, -2147483648.0, LongMin },
+        { Long, 2147483648.0, Fallback },
+    };
+    for (const auto &c : cases) {
+        SCOPED_TRACE(QStringLiteral("reader %1, %2").arg(c.reader).arg(c.stored.toString()).toStdString());
+        EXPECT_EQ(read(c.reader, bagWith("P", c.stored)), c.value);
+    }
+    for (const Reader reader : { Colour, Boolean, Clamp, Refuse, Long })
+        EXPECT_EQ(read(reader, PropertyBag()), Fallback) << "an absent name, reader " << reader;
+}
+
+// Every persisted colour and number of every control, in a form or beyond a range its
+// setter keeps: the control reads it through the readers.
+TEST(PropertyReaders, everyControlReadsItsColoursAndNumbersThroughThem)
+{
+    const struct
+    {
+        const char *control, *name, *property;
+        QVariant stored;
+        qint64 value;
+    } cases[] = {
+        { "cNIF", "BackColor", "BackColor", "&H00FF00&", 0x00FF00 },
+        { "cNIB", "BackColor", "BackColor", "&H00FF00&", 0x00FF00 },
+        { "skNumber", "Background", "Background", "&H00FF00&", 0x00FF00 },
+        { "skNumber", "ForegroundActive", "ForegroundActive", "&H00FF00&", 0x00FF00 },
+        { "skSubMenu", "HoverBackColor", "HoverBackColor", "&H00FF00&", 0x00FF00 },
+        { "skSubMenu", "TransparentBack", "TransparencyColor", "&H00FF00&", 0x00FF00 },
+        { "skQuadro", "TransparentBack", "TransparencyColor", "&H00FF00&", 0x00FF00 },
+        { "skGrowth", "CaptionColor", "CaptionColor", "&H00FF00&", 0x00FF00 },
         { "ucAniGIF", "Delay", "MinFrameDelay", 40000, 32700 },
         { "ucAniGIF", "Delay", "MinFrameDelay", -1e300, 10 },
         { "ucAniGIF", "Stretch", "Stretch", 9.3e18, 1 },
@@ -154,11 +147,12 @@ TEST(PropertyReaders, everyControlReadsItsNumbersIntoRange)
         { "InfoButton", "ibutton.style", "ToolTipStyle", 2, 1 },
         { "cNIF", "Countries", "Countries", 4294967296.0, 0 },
     };
-    for (const auto &n : numbers) {
-        std::unique_ptr<QObject> object(CreateObject(QString::fromLatin1(n.control)));
+    for (const auto &c : cases) {
+        SCOPED_TRACE(std::string(c.control) + "." + c.name);
+        std::unique_ptr<QObject> object(CreateObject(QString::fromLatin1(c.control)));
         auto *control = qobject_cast<UserControl *>(object.get());
-        ASSERT_NE(control, nullptr) << n.control;
-        control->Load(bagWith(QString::fromLatin1(n.name), n.stored));
-        EXPECT_EQ(control->property(n.property).toLongLong(), n.value) << n.control << " " << n.name;
+        ASSERT_NE(control, nullptr);
+        control->Load(bagWith(QString::fromLatin1(c.name), c.stored));
+        EXPECT_EQ(control->property(c.property).toLongLong(), c.value);
     }
 }

@@ -62,18 +62,28 @@ private:
     QStringList &m_calls;
 };
 
-} // namespace
-
-TEST(UserControlLifeCycle, newControlRunsInitPropertiesThenLayoutThenSaveThenTerminate)
+class UserControlTest : public ::testing::Test
 {
+protected:
     QStringList calls;
     QWidget form;
-    auto *control = new RecordingControl(calls);
-    control->setParent(&form);
+
+    RecordingControl *make()
+    {
+        auto *control = new RecordingControl(calls);
+        control->setParent(&form);
+        return control;
+    }
+};
+
+} // namespace
+
+TEST_F(UserControlTest, newControlRunsInitPropertiesThenLayoutThenSaveThenTerminate)
+{
+    RecordingControl *control = make();
     control->InitNew();
     control->resize(40, 20);
     form.show();
-    ASSERT_TRUE(QTest::qWaitForWindowExposed(&form));
     ASSERT_TRUE(QTest::qWaitFor([&] { return calls.contains("Paint"); }));
     const PropertyBag saved = control->Save();
     control->Release();
@@ -86,89 +96,72 @@ TEST(UserControlLifeCycle, newControlRunsInitPropertiesThenLayoutThenSaveThenTer
     EXPECT_TRUE(saved.isEmpty()) << "a default value is not written";
 }
 
-TEST(UserControlLifeCycle, savedControlIsLoadedThroughReadProperties)
+TEST_F(UserControlTest, savedControlIsLoadedThroughReadPropertiesAndMarkedUnchanged)
 {
-    QStringList calls;
-    PropertyBag bag;
-    {
-        RecordingControl first(calls);
-        first.InitNew();
-        first.caption = "Olá";
-        bag = first.Save();
-    }
+    RecordingControl *first = make();
+    first->caption = "Olá";
+    const PropertyBag bag = first->Save();
     calls.clear();
-    RecordingControl second(calls);
-    QSignalSpy changes(&second, &UserControl::propertyChanged);
-    second.Load(bag);
-    EXPECT_EQ(second.caption, "Olá");
+    RecordingControl *second = make();
+    QSignalSpy changes(second, &UserControl::propertyChanged);
+    second->Load(bag);
+    EXPECT_EQ(second->caption, "Olá");
     EXPECT_EQ(changes.count(), 0) << "loading marks nothing as changed";
-    second.setCaption("novo");
+    second->setCaption("novo");
     EXPECT_EQ(changes.count(), 1);
     EXPECT_EQ(calls, QStringList({ "Initialize", "ReadProperties" }));
 }
 
-TEST(UserControlAmbient, reportsEachChangedAmbientPropertyOnce)
+TEST_F(UserControlTest, reportsEachChangedAmbientPropertyOnce)
 {
-    QStringList calls;
-    RecordingControl control(calls);
-    EXPECT_FALSE(control.designMode());
-    Ambient designer = control.ambient();
+    RecordingControl *control = make();
+    EXPECT_FALSE(control->designMode());
+    Ambient designer = control->ambient();
     designer.UserMode = false;
     designer.UIDead = true;
     designer.DisplayName = "NIF1";
     designer.BackColor = platform::rgb(1, 2, 3);
     designer.Font.setPointSize(designer.Font.pointSize() + 3);
-    control.setAmbient(designer);
-    control.setAmbient(designer);
-    EXPECT_TRUE(control.designMode());
+    control->setAmbient(designer);
+    control->setAmbient(designer);
+    EXPECT_TRUE(control->designMode());
     EXPECT_EQ(calls.mid(1),
         QStringList({ "AmbientChanged:UserMode", "AmbientChanged:UIDead", "AmbientChanged:DisplayName",
             "AmbientChanged:BackColor", "AmbientChanged:Font" }));
 }
 
-TEST(UserControlExtender, positionsAndSizesInTwips)
+TEST_F(UserControlTest, extenderPlacesAndSizesInTwipsAndComesBackFromJson)
 {
-    QStringList calls;
-    QWidget form;
-    auto *control = new RecordingControl(calls);
-    control->setParent(&form);
+    RecordingControl *control = make();
     Extender &ext = control->extender();
     ext.Move(150, 300, 2685, 330);
     EXPECT_EQ(control->geometry(), QRect(10, 20, 179, 22));
-    EXPECT_EQ(ext.Left(), 150);
-    EXPECT_EQ(ext.Width(), 2685);
     ext.setTop(450);
     ext.setLeft(75);
     EXPECT_EQ(control->pos(), QPoint(5, 30));
+    EXPECT_EQ(ext.Left(), 75);
     ext.setName("NIB1");
     ext.setTag("x");
     ext.setToolTipText("dica");
     EXPECT_EQ(control->objectName(), "NIB1");
     EXPECT_EQ(control->toolTip(), "dica");
-
     ext.setVisible(false);
-    const QJsonObject json = ext.toJson();
-    auto *other = new RecordingControl(calls);
-    other->setParent(&form);
-    other->extender().loadJson(json);
-    EXPECT_EQ(other->extender().toJson(), json);
+    RecordingControl *other = make();
+    other->extender().loadJson(ext.toJson());
+    EXPECT_EQ(other->extender().toJson(), ext.toJson());
     EXPECT_EQ(other->geometry(), control->geometry());
     EXPECT_FALSE(other->extender().Visible());
 }
 
-TEST(UserControlWindow, hWndNamesTheControlUntilItIsGone)
+TEST_F(UserControlTest, hWndNamesTheControlUntilItIsGone)
 {
-    QStringList calls;
-    auto *control = new RecordingControl(calls);
+    RecordingControl *control = make();
     const qint32 handle = control->property("hWnd").value<qint32>();
     EXPECT_NE(handle, 0);
     EXPECT_EQ(control->hWnd(), handle);
     EXPECT_EQ(platform::widgetOf(handle), control);
     delete control;
-    EXPECT_EQ(platform::widgetOf(handle), nullptr);
-    EXPECT_EQ(platform::widgetOf(0), nullptr);
-    EXPECT_EQ(platform::widgetOf(-7), nullptr);
-
-    RecordingControl next(calls);
-    EXPECT_NE(next.hWnd(), handle) << "handles are never reused";
+    for (const qint32 gone : { handle, 0, -7 })
+        EXPECT_EQ(platform::widgetOf(gone), nullptr) << gone;
+    EXPECT_NE(make()->hWnd(), handle) << "handles are never reused";
 }

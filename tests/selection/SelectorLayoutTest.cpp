@@ -38,15 +38,18 @@ TEST(SelectorLayout, columnsShareTheGridWithTheGapsBetweenThemAboveOkAndCancel)
     EXPECT_EQ(layout.cancel, layout.ok.translated(1215, 0));
 }
 
+// Below 2500 x 375 twips the grid leaves the items where they are.
 TEST(SelectorLayout, wholeColumnsWithinTheGridWhateverTheCountAndSize)
 {
-    for (const int width : { 2500, 3000, 5880, 7380, 11000 })
-        for (const int height : { 375, 1000, 4845 })
+    for (const int width : { 2499, 2500, 3000, 5880, 7380, 11000 })
+        for (const int height : { 374, 375, 1000, 4845 })
             for (int count = 1; count <= 260; count += 7) {
                 Metrics m = gridOf(width, height, count);
                 m.captionWidth = 1800;
                 const Layout l = arrange(m);
-                ASSERT_TRUE(l.itemsPlaced);
+                ASSERT_EQ(l.itemsPlaced, width >= 2500 && height >= 375) << width << "x" << height;
+                if (!l.itemsPlaced)
+                    continue;
                 const int right = 60 + width - (l.scrolls ? m.scrollBarWidth : 0);
                 for (const QRect &item : l.items)
                     ASSERT_LE(item.right() + 1, right) << width << "x" << height << ", " << count << " items";
@@ -71,6 +74,9 @@ TEST(SelectorLayout, itemsThatDoNotFitScrollInRowsOfTheSmallestHeight)
     EXPECT_TRUE(narrow.scrolls);
     EXPECT_EQ(narrow.columns, 2);
     EXPECT_EQ(narrow.rows, 3);
+    const Layout low = arrange(gridOf(9000, 400, 5));
+    EXPECT_EQ(low.columns, 5);
+    EXPECT_EQ(low.rows, 1);
 }
 
 TEST(SelectorLayout, theFilterBoxComesBeforeTheGrid)
@@ -83,14 +89,4 @@ TEST(SelectorLayout, theFilterBoxComesBeforeTheGrid)
     EXPECT_EQ(layout.filter, QRect(60, 510, 5880, FilterHeight));
     EXPECT_EQ(layout.grid.top(), 510 + FilterHeight + 60);
     EXPECT_EQ(layout.items.first().top(), layout.grid.top());
-}
-
-TEST(SelectorLayout, gridsTooSmallLeaveTheItemsWhereTheyAre)
-{
-    const Layout low = arrange(gridOf(9000, 400, 5));
-    EXPECT_EQ(low.columns, 5);
-    EXPECT_EQ(low.rows, 1);
-    EXPECT_FALSE(arrange(gridOf(2499, 3000, 3)).itemsPlaced);
-    EXPECT_FALSE(arrange(gridOf(5880, 374, 3)).itemsPlaced);
-    EXPECT_TRUE(arrange(gridOf(2500, 375, 3)).itemsPlaced);
 }

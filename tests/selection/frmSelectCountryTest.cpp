@@ -98,40 +98,34 @@ TEST(CountryList, numbersAreWrittenWithAtLeastThreeDigits)
             QStringLiteral("XA Sem número"), "XC Sujo 042" }));
 }
 
+// The row current when the dialog closes is its answer (Tag), unless the user cancels.
 TEST(CountryDialog, okEnterAndDoubleClickChooseCancelAndEscapeDoNot)
 {
+    using Way = std::function<void(frmSelectCountry &, QTreeWidget *, QTreeWidgetItem *)>;
     const auto button = [](frmSelectCountry &form, int index) {
         for (CommandButton *b : form.findChildren<CommandButton *>(QStringLiteral("TRU_CommandButton1")))
             if (b->Index() == index)
-                return b;
-        return static_cast<CommandButton *>(nullptr);
+                QTest::mouseClick(b, Qt::LeftButton);
     };
-    using Way = std::function<void(frmSelectCountry &, QTreeWidgetItem *)>;
+    const Way ok = [&](auto &form, auto *, auto *) { button(form, 0); };
+    const Way doubleClick = [](auto &, QTreeWidget *list, QTreeWidgetItem *row) {
+        const QPoint at = list->visualItemRect(row).center();
+        QTest::mouseClick(list->viewport(), Qt::LeftButton, {}, at);
+        QTest::mouseDClick(list->viewport(), Qt::LeftButton, {}, at);
+    };
     const struct
     {
-        const char *name;
-        const char *current; // the code of the current row, if any
+        const char *name, *current, *tag; // the code of the current row, if any, and the answer
         Way way;
-        const char *tag;
         int result;
     } cases[] = {
-        { "OK", "ES", [&](auto &form, auto *) { QTest::mouseClick(button(form, 0), Qt::LeftButton); }, "ES",
+        { "OK", "ES", "ES", ok, QDialog::Accepted },
+        { "OK with nothing selected", nullptr, "", ok, QDialog::Accepted },
+        { "Enter", "IT", "IT", [](auto &, auto *list, auto *) { QTest::keyClick(list, Qt::Key_Return); },
             QDialog::Accepted },
-        { "OK with nothing selected", nullptr, [&](auto &form, auto *) { button(form, 0)->click(); }, "",
-            QDialog::Accepted },
-        { "Enter", "IT", [](auto &form, auto *) { QTest::keyClick(listOf(form), Qt::Key_Return); }, "IT",
-            QDialog::Accepted },
-        { "double click", "FR",
-            [](auto &form, QTreeWidgetItem *row) {
-                QTreeWidget *list = listOf(form);
-                const QPoint at = list->visualItemRect(row).center();
-                QTest::mouseClick(list->viewport(), Qt::LeftButton, {}, at);
-                QTest::mouseDClick(list->viewport(), Qt::LeftButton, {}, at);
-            },
-            "FR", QDialog::Accepted },
-        { "Cancel", "DE", [&](auto &form, auto *) { QTest::mouseClick(button(form, 1), Qt::LeftButton); }, "",
-            QDialog::Rejected },
-        { "Escape", "DE", [](auto &form, auto *) { QTest::keyClick(listOf(form), Qt::Key_Escape); }, "",
+        { "double click", "FR", "FR", doubleClick, QDialog::Accepted },
+        { "Cancel", "DE", "", [&](auto &form, auto *, auto *) { button(form, 1); }, QDialog::Rejected },
+        { "Escape", "DE", "", [](auto &, auto *list, auto *) { QTest::keyClick(list, Qt::Key_Escape); },
             QDialog::Rejected },
     };
     for (const auto &c : cases) {
@@ -140,16 +134,16 @@ TEST(CountryDialog, okEnterAndDoubleClickChooseCancelAndEscapeDoNot)
         relist(form, GSEL_OnlyEU);
         form.show();
         QTreeWidget *list = listOf(form);
-        QTreeWidgetItem *row = nullptr;
-        if (c.current) {
-            row = list->findItems(QLatin1String(c.current), Qt::MatchExactly, 1).value(0);
-            ASSERT_NE(row, nullptr);
+        QTreeWidgetItem *row
+            = c.current ? list->findItems(QLatin1String(c.current), Qt::MatchExactly, 1).value(0) : nullptr;
+        ASSERT_EQ(row != nullptr, c.current != nullptr);
+        if (row) {
             list->setCurrentItem(row);
             list->scrollToItem(row);
             form.setTag(QStringLiteral("DE"));
         }
         list->setFocus();
-        c.way(form, row);
+        c.way(form, list, row);
         EXPECT_EQ(form.Tag(), QLatin1String(c.tag));
         EXPECT_EQ(form.result(), c.result);
         EXPECT_FALSE(form.isVisible());

@@ -67,27 +67,24 @@ TEST_F(Frame, raisesPointerEventsButTracksNoHover)
     EXPECT_EQ(platform::capturedWidget(), nullptr);
 }
 
+// Design mode previews the pictures of DebugDesignImgID, which an absent value leaves as it is.
 TEST_F(Frame, persistsBothValuesAlwaysAndPreviewsInDesignModeOnly)
 {
     EXPECT_EQ(frame->Save().names(), (QStringList { "TransparentBack", "DebugDesignImgID" }));
+    EXPECT_EQ(QLabel(frame).font(), QFont(QStringLiteral("Arial"), 11, QFont::Bold)) << "what it holds is in bold";
     Ambient designer;
     designer.UserMode = false;
     skQuadro preview(&form);
     preview.setAmbient(designer);
+    preview.resize(60, 60);
     preview.setDebugDesign(3);
     preview.Load(PropertyBag());
-    EXPECT_EQ(preview.DebugDesign(), 3) << "an absent value keeps the current one";
+    EXPECT_EQ(preview.DebugDesign(), 3);
     EXPECT_EQ(preview.ImageFile(0), skinCommon::previewFolder() + "quadro_2_top.gif");
-    PropertyBag first;
-    first.WriteProperty("DebugDesignImgID", 1);
-    preview.Load(first);
-    EXPECT_EQ(preview.ImageFile(2), skinCommon::previewFolder() + "quadro_0_bottom.gif");
-
-    skQuadro fresh(&form);
-    fresh.setAmbient(designer);
-    fresh.resize(60, 60);
-    fresh.InitNew();
-    EXPECT_EQ(pixel(fresh, 30, 5), platform::rgb(232, 119, 34)) << "the orange band of topo_laranja.gif";
+    PropertyBag none;
+    none.WriteProperty("DebugDesignImgID", 0);
+    preview.Load(none);
+    EXPECT_EQ(pixel(preview, 30, 5), platform::rgb(232, 119, 34)) << "the orange band of topo_laranja.gif";
     skQuadro running(&form);
     running.InitNew();
     EXPECT_EQ(running.ImageFile(0), QString());

@@ -41,12 +41,3 @@ TEST(SkinPictures, skinIdRaisesOnceAndNotOnLoad)
     checkSkinId<skNumber>();
     checkSkinId<skGrowth>();
 }
-
-TEST(SkinPictures, controlsComeFromTheClassFactory)
-{
-    for (const char *name : { "skGoButton", "skNumber", "skSubMenu", "skQuadro", "skGrowth", "cSlider" }) {
-        std::unique_ptr<QObject> object(CreateObject(QString::fromLatin1(name)));
-        ASSERT_NE(object, nullptr) << name;
-        EXPECT_STREQ(object->metaObject()->className(), (std::string("zelctl::") + name).c_str());
-    }
-}

@@ -3,7 +3,6 @@
 
 #include "companion/CommandButton.h"
 #include "companion/JsonDeclaration.h"
-#include "frame/ClassRegistry.h"
 
 #include "support/TestSupport.h"
 
@@ -25,7 +24,8 @@ class ListMenuDriver
 {
 public:
     explicit ListMenuDriver(int choice)
-        : m_previous(subject::setListMenuPresenter([this, choice](QMenu &menu, const QPoint &pos) {
+        : choice(choice)
+        , m_previous(subject::setListMenuPresenter([this](QMenu &menu, const QPoint &pos) {
             ++shown;
             position = pos;
             items.clear();
@@ -34,7 +34,7 @@ public:
                 if (!action->isVisible())
                     continue;
                 items << (action->isChecked() ? "[x]" : "") + action->text() + (action->isEnabled() ? "" : " (off)");
-                if (choice > 0 && action->property("Index").toInt() == choice) {
+                if (this->choice > 0 && action->property("Index").toInt() == this->choice) {
                     action->trigger(); // as the menu does; this also flips the check mark
                     chosen = action;
                 }
@@ -44,6 +44,7 @@ public:
     { }
     ~ListMenuDriver() { subject::setListMenuPresenter(std::move(m_previous)); }
 
+    int choice;
     int shown = 0;
     QPoint position;
     QStringList items;
@@ -69,9 +70,17 @@ class SubjectSelector : public ::testing::Test
 protected:
     void SetUp() override
     {
-        selector = new cSujeitoSelector(&form);
         form.resize(800, 100);
         form.show();
+        makeSelector();
+    }
+
+    // A new selector in place of the current one, which may be gone already.
+    void makeSelector()
+    {
+        delete alive.data();
+        alive = selector = new cSujeitoSelector(&form);
+        selector->show();
         QObject::connect(selector, &cSujeitoSelector::Clicked, [this] { events << "Clicked"; });
         QObject::connect(selector, &cSujeitoSelector::Changed, [this] { events << "Changed"; });
     }
@@ -109,6 +118,7 @@ protected:
 
     QWidget form;
     cSujeitoSelector *selector = nullptr;
+    QPointer<cSujeitoSelector> alive;
     QStringList events;
 };
 
@@ -132,110 +142,98 @@ TEST_F(SubjectSelector, onlyPossibleKindsTakeRoomFromTheLeft)
 {
     selector->setPossible("HBA");
     selector->setSujeitoValueType("B");
-    EXPECT_EQ(pressed(), "B");
     for (const QChar kind : QStringView(u"ABDSFCH"))
         EXPECT_EQ(button(kind)->isVisible(), QStringView(u"ABH").contains(kind)) << QString(kind).toStdString();
 
     EXPECT_EQ(button('A')->Left(), 0);
     EXPECT_EQ(button('B')->Left(), 495) << "500 twips in whole pixels";
     EXPECT_EQ(button('B')->Width(), 2490);
-    EXPECT_EQ(button('B')->Caption(), "Sujeito B");
     EXPECT_EQ(button('C')->ToolTip(), "Sujeitos A e B");
     EXPECT_EQ(button('H')->Left(), 3000) << "placed in twips, not in rounded pixels";
 
-    EXPECT_TRUE(underlined());
     EXPECT_EQ(selector->findChild<QFrame *>("Line1")->x(), button('B')->x());
     button('A')->setHeight(450);
     selector->resize(selector->width() + 10, selector->height());
     EXPECT_EQ(selector->height(), (450 + 60) / 15) << "the height follows button A";
-}
 
-TEST_F(SubjectSelector, picturesByKindLetter)
-{
+    // Pictures go by the kind's letter, also of a lower-case identifier.
     EXPECT_NE(selector->ImageFile("A"), selector->ImageFile("B"));
     QImage image(8, 8, QImage::Format_ARGB32);
     image.fill(Qt::red);
-    const Picture red(image);
-    selector->setImageFile("d2", red);
-    EXPECT_EQ(selector->ImageFile("D"), red) << "the letter of a lower-case identifier";
-    EXPECT_EQ(button('D')->Picture(), red);
+    selector->setImageFile("d2", Picture(image));
+    EXPECT_EQ(button('D')->Picture(), selector->ImageFile("D"));
+    EXPECT_EQ(button('D')->Picture().image(), image);
 }
 
+// Each property written in turn, with what the selector then answers; writing raises no event.
 TEST_F(SubjectSelector, selectingByEachPropertyAndReadingBack)
 {
     selector->setPossible("*");
-    selector->setSelectedSujeito("D2");
-    EXPECT_EQ(pressed(), "D");
-    EXPECT_EQ(selector->SujeitoValueType(), "D");
-    EXPECT_EQ(selector->SelectedSujeitoIndex(), 2);
-    EXPECT_EQ(button('D')->Caption(), "Dependente 2");
-
-    selector->setSujeitoValueType("S");
-    EXPECT_EQ(selector->SelectedSujeito(), "S") << "no index left over from the dependant";
-    selector->setSelectedSujeitoIndex(3);
-    EXPECT_EQ(selector->SelectedSujeito(), "S3");
-    EXPECT_EQ(button('S')->Caption(), "Ascendente 3");
-
-    for (const QChar kind : QStringView(u"ABCF")) {
-        selector->setSujeitoValueType(QString(kind));
-        selector->setSelectedSujeitoIndex(3);
-        EXPECT_EQ(selector->SelectedSujeito(), QString(kind)) << "no index for " << QString(kind).toStdString();
+    const struct
+    {
+        const char *property;
+        QVariant value;
+        const char *selected, *pressed, *caption;
+    } steps[] = {
+        { "SelectedSujeito", "D2", "D2", "D", "Dependente 2" },
+        { "SujeitoValueType", "S", "S", "S", "Ascendente" }, // no index left over from the dependant
+        { "SelectedSujeitoIndex", 3, "S3", "S", "Ascendente 3" }, { "SujeitoValueType", "A", "A", "A", "Sujeito A" },
+        { "SelectedSujeitoIndex", 3, "A", "A", "Sujeito A" }, // A, B, C and F take no index
+        { "SelectedSujeito", "F2", "F", "F", nullptr },
+        { "SelectedSujeito", "Dx", "D", "D", nullptr }, // no number, no index
+        { "SelectedSujeito", "H40000", "H", "H", nullptr }, // beyond a 16-bit index
+        { "SujeitoValueType", "X", "", "", nullptr },
+        { "SelectedSujeito", "", "A", "A", nullptr }, // no empty choice without CanSelectNone
+    };
+    for (const auto &step : steps) {
+        SCOPED_TRACE(step.property + (" = " + step.value.toString().toStdString()));
+        selector->setProperty(step.property, step.value);
+        EXPECT_EQ(selector->SelectedSujeito(), step.selected);
+        EXPECT_EQ(pressed(), step.pressed);
+        EXPECT_EQ(underlined(), *step.pressed != 0);
+        if (step.caption) {
+            EXPECT_EQ(button(QLatin1Char(*step.pressed))->Caption(), step.caption);
+        }
     }
-    selector->setSelectedSujeito("F2");
-    EXPECT_EQ(selector->SelectedSujeito(), "F");
-    selector->setSelectedSujeito("Dx");
-    EXPECT_EQ(selector->SelectedSujeito(), "D") << "no number, no index";
-    selector->setSelectedSujeito("H40000");
-    EXPECT_EQ(selector->SelectedSujeito(), "H") << "beyond a 16-bit index";
-
-    selector->setSujeitoValueType("X");
-    EXPECT_EQ(pressed(), "");
-    EXPECT_EQ(selector->SelectedSujeito(), "");
-    EXPECT_FALSE(underlined());
+    selector->setCanSelectNone(true);
     selector->setSelectedSujeito("");
-    EXPECT_EQ(selector->SelectedSujeito(), "A") << "no empty choice without CanSelectNone";
-    EXPECT_TRUE(events.isEmpty()) << "writing raises no event";
+    EXPECT_EQ(pressed(), "") << "an empty choice, now that CanSelectNone allows it";
+    EXPECT_TRUE(events.isEmpty());
 }
 
+// Clicks on a new selector with A pressed; `events` are those of the last click.
 TEST_F(SubjectSelector, clicksRaiseClickedThenChangedAndASecondClickMayEmpty)
 {
-    selector->setPossible("*");
-    selector->setSujeitoValueType("A");
-    click(u"B");
-    EXPECT_EQ(pressed(), "B");
-    EXPECT_EQ(button('A')->Caption(), "");
-    EXPECT_EQ(events, QStringList({ "Clicked", "Changed" }));
-
-    events.clear();
-    click(u"B");
-    EXPECT_EQ(pressed(), "B") << "the only pressed button stays pressed";
-    EXPECT_EQ(events, QStringList({ "Clicked", "Changed" }));
-
-    click(u"C");
-    EXPECT_EQ(pressed(), "BC") << "C keeps B's state";
-    click(u"AC");
-    EXPECT_EQ(pressed(), "C");
-    click(u"B");
-    EXPECT_EQ(pressed(), "B") << "B does not keep C";
-
-    // With CanSelectNone a second click on the same button empties the choice.
-    selector->setCanSelectNone(true);
-    selector->setSujeitoValueType("A");
-    click(u"A");
-    EXPECT_EQ(pressed(), "A") << "a first click on a pressed button does not empty the choice";
-
-    events.clear();
-    click(u"A");
-    EXPECT_EQ(selector->SelectedSujeito(), "");
-    EXPECT_EQ(pressed(), "");
-    EXPECT_EQ(events, QStringList({ "Changed" }));
-
-    events.clear();
-    click(u"A");
-    EXPECT_EQ(selector->SelectedSujeito(), "A") << "the remembered click was forgotten";
-    EXPECT_EQ(events, QStringList({ "Clicked", "Changed" }));
-    click(u"BA");
-    EXPECT_EQ(selector->SelectedSujeito(), "A") << "only a click on the same button is a second click";
+    const struct
+    {
+        bool canSelectNone;
+        const char16_t *clicks;
+        const char *pressed, *events;
+    } cases[] = {
+        { false, u"B", "B", "Clicked Changed" },
+        { false, u"BB", "B", "Clicked Changed" }, // the only pressed button stays pressed
+        { false, u"BC", "BC", "Clicked Changed" }, // C keeps B's state
+        { false, u"BCAC", "C", "Clicked Changed" }, { false, u"BCACB", "B", "Clicked Changed" }, // B does not keep C
+        { true, u"A", "A", "Clicked Changed" }, // a first click on a pressed button does not empty the choice
+        { true, u"AA", "", "Changed" }, // a second click does
+        { true, u"AAA", "A", "Clicked Changed" }, // and is forgotten
+        { true, u"ABA", "A", "Clicked Changed" }, // only a click on the same button is a second click
+    };
+    for (const auto &c : cases) {
+        const QStringView clicks(c.clicks);
+        SCOPED_TRACE(clicks.toString().toStdString());
+        makeSelector();
+        selector->setPossible("*");
+        selector->setCanSelectNone(c.canSelectNone);
+        selector->setSujeitoValueType("A");
+        click(clicks.chopped(1));
+        events.clear();
+        click(clicks.last(1));
+        EXPECT_EQ(pressed(), c.pressed);
+        EXPECT_EQ(events.join(' '), c.events);
+        for (const QChar kind : QStringView(u"ABDSFH"))
+            EXPECT_EQ(button(kind)->Caption().isEmpty(), !pressed().contains(kind)) << "captions only when pressed";
+    }
 }
 
 TEST_F(SubjectSelector, oneSubjectOfAKindIsChosenWithoutAList)
@@ -254,40 +252,11 @@ TEST_F(SubjectSelector, oneSubjectOfAKindIsChosenWithoutAList)
     EXPECT_EQ(events, QStringList({ "Clicked", "Changed" }));
 }
 
-TEST_F(SubjectSelector, listOfDependants)
-{
-    auto declaration = declarationWith({ { "D1", "234567813", "ANA RITA LOPES" },
-        { "D2", "246813571", "TIAGO ANDRÉ FERREIRA LOPES" }, { "D3", "255555558", "" } });
-    selector->setIRSClass(declaration.get());
-    {
-        ListMenuDriver menu(2);
-        click(u"D");
-        EXPECT_EQ(menu.items,
-            QStringList(
-                { "=== Listagem de DEPENDENTES === (off)", "D1 - Ana R. Lopes", "D2 - Tiago Lopes", "Dependente 3" }));
-        EXPECT_EQ(menu.position, selector->mapToGlobal(QPoint(button('D')->x(), button('D')->height())));
-        EXPECT_EQ(selector->SelectedSujeito(), "D2");
-        EXPECT_EQ(button('D')->Caption(), "Tiago Lopes");
-        EXPECT_EQ(selector->SelectedNIF(), "246813571");
-        EXPECT_EQ(events, QStringList({ "Clicked", "Changed", "Changed" })) << "the item, then the click";
-    }
-    ListMenuDriver menu(0);
-    click(u"D");
-    EXPECT_EQ(menu.shown, 0) << "a chosen dependant is kept when D is clicked again";
-    EXPECT_EQ(selector->SelectedSujeito(), "D2");
-
-    click(u"AD");
-    ASSERT_EQ(menu.shown, 1);
-    EXPECT_EQ(menu.items.filter("[x]"), QStringList()) << "nothing is chosen after A";
-    EXPECT_EQ(selector->SelectedSujeito(), "D1") << "a dismissed list chooses the first";
-}
-
 TEST_F(SubjectSelector, theHostMayDeleteItInClickedOrWhileItsListIsOpen)
 {
     auto declaration
         = declarationWith({ { "D1", "234567813", "ANA RITA LOPES" }, { "D2", "246813571", "TIAGO LOPES" } });
     selector->setIRSClass(declaration.get());
-    QPointer<cSujeitoSelector> alive(selector);
     const subject::ListMenuPresenter previous = subject::setListMenuPresenter([&](QMenu &, const QPoint &) {
         delete alive.data();
         return nullptr;
@@ -296,38 +265,64 @@ TEST_F(SubjectSelector, theHostMayDeleteItInClickedOrWhileItsListIsOpen)
     subject::setListMenuPresenter(previous);
     EXPECT_TRUE(alive.isNull());
 
-    selector = new cSujeitoSelector(&form);
-    selector->show();
-    alive = selector;
+    makeSelector();
     QObject::connect(selector, &cSujeitoSelector::Clicked, [&] { delete alive.data(); });
     click(u"B");
     EXPECT_TRUE(alive.isNull());
 }
 
-TEST_F(SubjectSelector, listsOfAscendantsAndEstates)
+// A kind with more than one subject offers them in a list under its button: short names, or
+// the kind's caption where there is none; ascendants' names come from the NIF information.
+TEST_F(SubjectSelector, listsOfDependantsAscendantsAndEstates)
 {
-    auto declaration = declarationWith({ { "S1", "PT182937461", "NOT THIS NAME" }, { "S2", "", "" },
-        { "H1", "700123458", "HERANÇA DE JOSÉ LOPES" }, { "H2", "700123466", "" }, { "H3", "700123474", "" } });
+    auto declaration = declarationWith(
+        { { "D1", "234567813", "ANA RITA LOPES" }, { "D2", "246813571", "TIAGO ANDRÉ FERREIRA LOPES" },
+            { "D3", "255555558", "" }, { "S1", "PT182937461", "NOT THIS NAME" }, { "S2", "", "" },
+            { "H1", "700123458", "HERANÇA DE JOSÉ LOPES" }, { "H2", "700123466", "" }, { "H3", "700123474", "" } });
     declaration->DeclarationData().NifInfoStore().Write("PT182937461.nome", "MARIA DA CONCEIÇÃO FERREIRA");
     declaration->DeclarationData().FieldStore().Set("herancas", "3");
     selector->setPossible("*");
     selector->setIRSClass(declaration.get());
-
-    ListMenuDriver menu(3);
-    click(u"S");
-    EXPECT_EQ(menu.items.mid(1), QStringList({ "S1 - Maria Ferreira", "Ascendente 2" }))
-        << "ascendants' names come from the NIF information";
-    EXPECT_EQ(selector->SelectedSujeito(), "S1") << "there is no third ascendant to choose";
-
-    click(u"H");
-    EXPECT_EQ(menu.items,
-        QStringList(
-            { "=== Listagem das HERANÇAS INDIVISAS === (off)", "H1 - Herança Lopes", "Herança 2", "Herança 3" }));
-    EXPECT_EQ(selector->SelectedSujeito(), "H3");
-    EXPECT_EQ(button('H')->Caption(), "Herança 3");
+    const struct
+    {
+        char16_t kind;
+        int choice;
+        QStringList items;
+        const char *selected, *caption, *events;
+    } lists[] = {
+        { u'D', 2, { "=== Listagem de DEPENDENTES === (off)", "D1 - Ana R. Lopes", "D2 - Tiago Lopes", "Dependente 3" },
+            "D2", "Tiago Lopes", "Clicked Changed Changed" }, // the item, then the click
+        // There is no third ascendant to choose: the first is taken.
+        { u'S', 3, { "=== Listagem de ASCENDENTES === (off)", "S1 - Maria Ferreira", "Ascendente 2" }, "S1",
+            "Maria Ferreira", "Clicked Changed" },
+        { u'H', 3, { "=== Listagem das HERANÇAS INDIVISAS === (off)", "H1 - Herança Lopes", "Herança 2", "Herança 3" },
+            "H3", "Herança 3", "Clicked Changed Changed" },
+    };
+    ListMenuDriver menu(0);
+    for (const auto &list : lists) {
+        SCOPED_TRACE(list.selected);
+        menu.choice = list.choice;
+        events.clear();
+        click(QStringView(&list.kind, 1));
+        EXPECT_EQ(menu.items, list.items);
+        EXPECT_EQ(menu.position, selector->mapToGlobal(QPoint(button(list.kind)->x(), button(list.kind)->height())));
+        EXPECT_EQ(selector->SelectedSujeito(), list.selected);
+        EXPECT_EQ(button(list.kind)->Caption(), list.caption);
+        EXPECT_EQ(selector->SelectedNIF(), declaration->DeclarationData().SubjectNif(list.selected));
+        EXPECT_EQ(events.join(' '), list.events);
+    }
     EXPECT_EQ(selector->SelectedNIF(), "700123474");
     click(u"F");
     EXPECT_EQ(selector->SelectedSujeito(), "F") << "the index does not follow to another kind";
+
+    menu.choice = 0;
+    menu.shown = 0;
+    click(u"D");
+    EXPECT_EQ(menu.items.filter("[x]"), QStringList()) << "nothing is chosen after another kind";
+    EXPECT_EQ(selector->SelectedSujeito(), "D1") << "a dismissed list chooses the first";
+    click(u"D");
+    EXPECT_EQ(menu.shown, 1) << "a chosen dependant is kept when D is clicked again";
+    EXPECT_EQ(selector->SelectedSujeito(), "D1");
 }
 
 TEST_F(SubjectSelector, namesAndNumbersComeFromTheDeclaration)
@@ -353,22 +348,14 @@ TEST_F(SubjectSelector, namesAndNumbersComeFromTheDeclaration)
     EXPECT_EQ(button('A')->Caption(), "Sujeito A");
 }
 
-TEST_F(SubjectSelector, persistsPossibleAndCanSelectNone)
+TEST_F(SubjectSelector, persistsPossibleAsStoredAndCanSelectNone)
 {
-    std::unique_ptr<QObject> byName(CreateObject("UKAZELCTL.cSujeitoSelector"));
-    ASSERT_NE(qobject_cast<cSujeitoSelector *>(byName.get()), nullptr);
     EXPECT_TRUE(selector->Save().isEmpty()) << "defaults are not stored";
-
-    selector->setPossible("*");
-    selector->setCanSelectNone(true);
-    cSujeitoSelector loaded(&form);
-    loaded.Load(selector->Save());
-    EXPECT_EQ(loaded.Possible(), "ABDSFCH");
-    EXPECT_TRUE(loaded.CanSelectNone());
-
     PropertyBag stored;
     stored.WriteProperty("Possible", "DA");
-    loaded.Load(stored);
-    EXPECT_EQ(loaded.Possible(), "DA") << "kept as stored";
-    EXPECT_FALSE(loaded.CanSelectNone());
+    stored.WriteProperty("CanSelectNone", true);
+    selector->Load(stored);
+    EXPECT_EQ(selector->Possible(), "DA") << "kept as stored";
+    EXPECT_TRUE(selector->CanSelectNone());
+    EXPECT_EQ(selector->Save(), stored);
 }
