@@ -1,5 +1,6 @@
 #include "NifCache.h"
 
+#include <QDeadlineTimer>
 #include <QDir>
 #include <QFileInfo>
 #include <QHash>
@@ -9,6 +10,7 @@
 #include <QSqlError>
 #include <QSqlQuery>
 #include <QStandardPaths>
+#include <QThread>
 
 #include <atomic>
 
@@ -20,9 +22,18 @@ namespace {
 // a writer hangs: the lookup then goes on without the cache.
 constexpr int BusyTimeoutMs = 5000;
 
-// SQLite's primary result codes for a file that is not a sound database.
+// SQLite's primary result codes: another connection holds the file, or it is not a sound
+// database.
+constexpr int SqliteBusy = 5;
+constexpr int SqliteLocked = 6;
 constexpr int SqliteCorrupt = 11;
 constexpr int SqliteNotADatabase = 26;
+
+bool isBusy(const QSqlError &error)
+{
+    const int code = error.nativeErrorCode().toInt() & 0xff;
+    return code == SqliteBusy || code == SqliteLocked;
+}
 
 bool isDamage(const QSqlError &error)
 {
@@ -89,7 +100,17 @@ NifCache::Opening NifCache::openDatabase()
         return isDamage(database.lastError()) ? Opening::Damaged : Opening::Unavailable;
 
     QSqlQuery query(database);
-    const auto run = [&query](const QString &statement) { return query.exec(statement); };
+    // Where two processes would each wait for the other (both turning a new file to WAL at
+    // once) SQLite answers busy at once instead of waiting: try again until the busy timeout.
+    const auto run = [&query](const QString &statement) {
+        const QDeadlineTimer deadline(BusyTimeoutMs);
+        while (!query.exec(statement)) {
+            if (!isBusy(query.lastError()) || deadline.hasExpired())
+                return false;
+            QThread::msleep(10);
+        }
+        return true;
+    };
     const auto failed = [&query] { return isDamage(query.lastError()) ? Opening::Damaged : Opening::Unavailable; };
     if (!run(QStringLiteral("PRAGMA journal_mode=WAL")) || !run(QStringLiteral("PRAGMA synchronous=NORMAL")))
         return failed();
