@@ -43,7 +43,7 @@ TEST_P(DisabledParent, looksAndActsDisabledAndKeepsItsOwnSetting)
     std::vector<std::unique_ptr<SignalHook>> hooks;
     for (const QMetaMethod &event : membersOf(control, QMetaMethod::Signal))
         hooks.push_back(std::make_unique<SignalHook>(control, event, [&raised, event] { raised << event.name(); }));
-    host.useByHand();
+    host.use(false);
     QTest::qWait(20);
     ASSERT_TRUE(control);
     EXPECT_EQ(raised, QStringList()) << "events answered input in a disabled form";

@@ -33,8 +33,7 @@ TEST_P(Lifetime, theHostMayDeleteTheObjectInAnyOfItsEvents)
             else
                 delete host.object.data();
         });
-        host.useByHand();
-        host.useAsHost();
+        host.use(true);
         QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
         EXPECT_EQ(host.object.isNull(), raised);
         EXPECT_TRUE(host.neighbourWorks());
@@ -45,8 +44,7 @@ TEST_P(Lifetime, theHostMayDeleteTheObjectWhileItsMenuOrFormIsOpen)
 {
     HostForm host(QString::fromStdString(GetParam()), QSize(400, 300));
     host.onModal([&] { delete host.object.data(); });
-    host.useByHand();
-    host.useAsHost();
+    host.use(true);
     EXPECT_TRUE(host.neighbourWorks());
 }
 

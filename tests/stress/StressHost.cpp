@@ -115,7 +115,6 @@ struct Journal
 void printJournal()
 {
     std::fputs(qPrintable(journal.replay()), stderr);
-    std::fflush(stderr);
 }
 
 void watchForHangs(qint64 limitMs)
@@ -536,24 +535,13 @@ bool HostForm::neighbourWorks()
     return neighbour->text() == "ok"_L1;
 }
 
-namespace {
-
-void runWhileAlive(HostForm &host, const std::vector<std::function<void()>> &steps)
-{
-    for (const auto &step : steps) {
-        if (!host.object)
-            return;
-        step();
-        QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
-    }
-}
-
-} // namespace
-
-void HostForm::useByHand()
+void HostForm::use(bool asHost)
 {
     QWindow *window = form->windowHandle();
     const QPoint centre(120, 70);
+    Random random(1);
+    Values values(random);
+    values.objects.push_back(form.data());
     std::vector<std::function<void()>> steps = {
         [=] { QTest::mouseMove(window, centre); },
         [=] { QTest::mouseClick(window, Qt::LeftButton, {}, centre); },
@@ -577,31 +565,26 @@ void HostForm::useByHand()
     for (const Qt::Key key :
         { Qt::Key_Space, Qt::Key_Return, Qt::Key_1, Qt::Key_Down, Qt::Key_Menu, Qt::Key_Tab, Qt::Key_Escape })
         steps.push_back([window, key] { QTest::keyClick(window, key); });
-    runWhileAlive(*this, steps);
-}
-
-void HostForm::useAsHost()
-{
-    if (!object)
-        return;
-    Random random(1);
-    Values values(random);
-    values.objects.push_back(form.data());
-    std::vector<std::function<void()>> steps = {
-        [this] {
+    if (asHost && object) {
+        steps.push_back([this] {
             if (auto *widget = qobject_cast<QWidget *>(object.data()))
                 widget->resize(90, 30);
-        },
-        [this] { form->setEnabled(false); },
-        [this] { form->setEnabled(true); },
-    };
-    for (const QMetaMethod &method : membersOf(object, QMetaMethod::Method))
-        steps.push_back([&, method] {
-            call(object, method, values);
-            QTest::qWait(5);
         });
-    steps.push_back([] { QTest::qWait(100); });
-    runWhileAlive(*this, steps);
+        steps.push_back([this] { form->setEnabled(false); });
+        steps.push_back([this] { form->setEnabled(true); });
+        for (const QMetaMethod &method : membersOf(object, QMetaMethod::Method))
+            steps.push_back([&, method] {
+                call(object, method, values);
+                QTest::qWait(5);
+            });
+        steps.push_back([] { QTest::qWait(100); });
+    }
+    for (const auto &step : steps) {
+        if (!object)
+            return;
+        step();
+        QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
+    }
 }
 
 std::vector<std::string> servedClasses(bool controlsOnly)
@@ -617,20 +600,18 @@ std::vector<std::string> servedClasses(bool controlsOnly)
 
 namespace {
 
-enum class Deletion { Direct, Release, Form, InEvent, InModal };
-
-struct Episode
+struct Episode : HostForm
 {
     Episode(const QString &className, quint64 seed)
-        : random(seed)
+        : HostForm(seed ^ 0x9E3779B97F4A7C15ull)
+        , random(seed)
         , values(random)
         , className(className)
-        , host(seed ^ 0x9E3779B97F4A7C15ull)
     { }
 
-    QWindow *window() const { return host.form ? host.form->windowHandle() : nullptr; }
-    QWidget *widget() const { return qobject_cast<QWidget *>(host.object.data()); }
-    UserControl *control() const { return qobject_cast<UserControl *>(host.object.data()); }
+    QWindow *window() const { return form ? form->windowHandle() : nullptr; }
+    QWidget *widget() const { return qobject_cast<QWidget *>(object.data()); }
+    UserControl *control() const { return qobject_cast<UserControl *>(object.data()); }
     void note(const QString &step) { journal.note(step); }
 
     void place()
@@ -639,8 +620,8 @@ struct Episode
         // so that it follows from its seed alone.
         QCursor::setPos(0, 0);
         QGuiApplication::clipboard()->clear();
-        host.form->setWindowTitle(u"stress "_s + className);
-        host.form->resize(300 + random.below(400), 200 + random.below(300));
+        form->setWindowTitle(u"stress "_s + className);
+        form->resize(300 + random.below(400), 200 + random.below(300));
         // As a host does: the class factory through the entry point, locked while it is kept.
         const GUID classId = std::bit_cast<GUID>(ClassRegistry::factoryFor(className)->info().classId);
         void *factory = nullptr;
@@ -650,19 +631,19 @@ struct Episode
         }
         if (random.chance(0.5))
             lock();
-        host.object = static_cast<const ClassFactory *>(factory)->CreateInstance(host.form);
+        object = static_cast<const ClassFactory *>(factory)->CreateInstance(form);
         const bool laidOut = random.chance(0.5);
         if (laidOut) {
-            auto *layout = new QVBoxLayout(host.form);
-            layout->addWidget(host.neighbour);
+            auto *layout = new QVBoxLayout(form);
+            layout->addWidget(neighbour);
             if (widget())
                 layout->addWidget(widget());
             layout->addStretch();
         } else if (widget())
             widget()->move(10, 40);
         note(u"create %1 on a form, %2"_s.arg(className, laidOut ? "in a vertical layout" : "placed"));
-        values.objects = { host.form.data(), host.object };
-        values.windows.push_back(platform::handleOf(host.form));
+        values.objects = { form.data(), object };
+        values.windows.push_back(platform::handleOf(form));
         if (widget())
             values.windows.push_back(platform::handleOf(widget()));
         if (UserControl *control = this->control()) {
@@ -681,11 +662,11 @@ struct Episode
                 control->Load(bag);
             }
         }
-        if (!host.form)
+        if (!form)
             return;
         note(u"show the form"_s);
-        host.form->show();
-        if (!QTest::qWaitForWindowExposed(host.form, 2000))
+        form->show();
+        if (!QTest::qWaitForWindowExposed(form, 2000))
             note(u"the form was not exposed in time"_s);
     }
 
@@ -718,7 +699,7 @@ struct Episode
 
     void destroy(const QString &how)
     {
-        QPointer<QObject> victim = victimIsForm ? QPointer<QObject>(host.form.data()) : host.object;
+        QPointer<QObject> victim = victimIsForm ? QPointer<QObject>(form.data()) : object;
         if (!victim)
             return;
         if (!victimIsForm && random.chance(0.3) && control()) {
@@ -737,27 +718,24 @@ struct Episode
             delete victim.data();
     }
 
-    // Now, or from now on in one of the object's events or while a menu or modal form is open.
-    void arm(Deletion mode)
+    // Modes 0 and 1 delete the object now (or release it), 2 the form; 3 arms a deletion of
+    // either inside one of the object's events, 4 while a menu or modal form is open.
+    void arm(int mode)
     {
         const std::vector<QMetaMethod> events
-            = mode == Deletion::InEvent ? membersOf(host.object, QMetaMethod::Signal) : std::vector<QMetaMethod>();
-        if (mode == Deletion::Form)
-            victimIsForm = true;
-        if (!events.empty()) {
-            const QMetaMethod event = random.pick(events);
-            victimIsForm = random.chance(0.3);
-            note(u"from now on the host deletes the %1 in %2"_s.arg(
-                victimIsForm ? "form" : "control", QLatin1String(event.name())));
-            hook = std::make_unique<SignalHook>(
-                host.object, event, [this, name = QString::fromLatin1(event.name())] { destroy(u"inside "_s + name); });
-        } else if (mode == Deletion::InModal) {
-            victimIsForm = random.chance(0.3);
-            note(u"from now on the host deletes the %1 while a menu or modal form is open"_s.arg(
-                victimIsForm ? "form" : "control"));
-            host.onModal([this] { destroy(u"while a menu or modal form is open"_s); });
-        } else
-            destroy(u"between two steps"_s);
+            = mode == 3 ? membersOf(object, QMetaMethod::Signal) : std::vector<QMetaMethod>();
+        victimIsForm = mode == 2;
+        if (mode < 3 || (mode == 3 && events.empty()))
+            return destroy(u"between two steps"_s);
+        const QMetaMethod event = mode == 3 ? random.pick(events) : QMetaMethod();
+        const QString when
+            = mode == 4 ? u"while a menu or modal form is open"_s : u"inside "_s + QLatin1String(event.name());
+        victimIsForm = random.chance(0.3);
+        note(u"from now on the host deletes the %1 %2"_s.arg(victimIsForm ? "form" : "control", when));
+        if (mode == 4)
+            onModal([this, when] { destroy(when); });
+        else
+            hook = std::make_unique<SignalHook>(object, event, [this, when] { destroy(when); });
     }
 
     void check()
@@ -767,22 +745,22 @@ struct Episode
         // half a second) to come due: none of them may reach it.
         QTest::qWait(random.chance(0.1) ? 600 : 30);
         QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
-        if (host.object)
+        if (object)
             faults << u"the control outlived its deletion"_s;
-        if (!host.form && !victimIsForm)
+        if (!form && !victimIsForm)
             faults << u"the form was deleted with the control"_s;
-        if (!host.form)
+        if (!form)
             return;
-        if (!host.neighbourWorks())
-            faults << u"the neighbouring text box no longer takes typing: \"%1\""_s.arg(host.neighbour->text());
-        host.form->grab();
+        if (!neighbourWorks())
+            faults << u"the neighbouring text box no longer takes typing: \"%1\""_s.arg(neighbour->text());
+        form->grab();
     }
 
     // A part of the object, the object itself or the form.
     QWidget *target()
     {
         if (!widget() || random.chance(0.1))
-            return host.form;
+            return form;
         QList<QWidget *> parts = widget()->findChildren<QWidget *>();
         parts.removeIf([](QWidget *part) { return !part->isVisible() || part->isWindow(); });
         return parts.isEmpty() || random.chance(0.4) ? widget() : parts.at(random.below(int(parts.size())));
@@ -801,30 +779,27 @@ struct Episode
         QWidget *on = target();
         if (!on || !window())
             return;
+        static const std::vector<std::pair<Qt::MouseButton, const char *>> buttons
+            = { { Qt::LeftButton, "left" }, { Qt::RightButton, "right" }, { Qt::MiddleButton, "middle" } };
         const int roll = random.below(20);
-        const Qt::MouseButton button = roll < 15 ? Qt::LeftButton : roll < 19 ? Qt::RightButton : Qt::MiddleButton;
+        const auto [button, side] = buttons[roll < 15 ? 0 : roll < 19 ? 1 : 2];
         const QPoint at = pointIn(on);
-        note(u"%1 %2 on %3 at %4,%5"_s
-                 .arg(twice ? "double-click" : "click",
-                     roll < 15       ? "left"
-                         : roll < 19 ? "right"
-                                     : "middle",
-                     describe(on))
+        note(u"%1 %2 on %3 at %4,%5"_s.arg(twice ? "double-click" : "click", side, describe(on))
                  .arg(at.x())
                  .arg(at.y()));
         // One double click is one Click (or Clicked) of a control that draws itself.
         std::unique_ptr<QSignalSpy> clicks;
-        if (twice && on == host.object && button == Qt::LeftButton && !on->childAt(on->mapFrom(on->window(), at))) {
-            const QMetaObject *meta = host.object->metaObject();
+        if (twice && on == object && button == Qt::LeftButton && !on->childAt(on->mapFrom(on->window(), at))) {
+            const QMetaObject *meta = object->metaObject();
             if (const int index = std::max(meta->indexOfSignal("Click()"), meta->indexOfSignal("Clicked()"));
                 index >= 0)
-                clicks = std::make_unique<QSignalSpy>(host.object.data(), meta->method(index));
+                clicks = std::make_unique<QSignalSpy>(object.data(), meta->method(index));
         }
         if (twice)
             QTest::mouseDClick(window(), button, {}, at);
         else
             QTest::mouseClick(window(), button, {}, at);
-        if (clicks && host.object && clicks->count() > 1)
+        if (clicks && object && clicks->count() > 1)
             faults << u"a double click raised %1 Click events"_s.arg(clicks->count());
     }
 
@@ -833,7 +808,6 @@ struct Episode
     Random random;
     Values values;
     QString className;
-    HostForm host;
     std::unique_ptr<SignalHook> hook;
     QStringList faults;
     bool victimIsForm = false;
@@ -863,7 +837,7 @@ const std::vector<std::pair<int, void (*)(Episode &)>> stepKinds = {
         [](Episode &e) {
             const QPointer<QWidget> focus = QApplication::focusWidget();
             const QString text = e.values.text().left(60);
-            if (!focus || focus->window() != e.host.form)
+            if (!focus || focus->window() != e.form)
                 return;
             e.note(u"type %1 into %2"_s.arg(shortly(text), describe(focus)));
             for (const QChar c : text) {
@@ -893,12 +867,12 @@ const std::vector<std::pair<int, void (*)(Episode &)>> stepKinds = {
             if (!on || !e.window())
                 return;
             const QPoint at
-                = e.random.chance(0.2) ? QPoint(e.host.form->width() + 20, e.host.form->height() + 20) : e.pointIn(on);
+                = e.random.chance(0.2) ? QPoint(e.form->width() + 20, e.form->height() + 20) : e.pointIn(on);
             // Warped, the real pointer goes through grabs and crossing events on an X server.
             const bool warp = !e.random.chance(0.5);
             e.note(u"%1 the pointer to %2,%3 of the form"_s.arg(warp ? "warp" : "move").arg(at.x()).arg(at.y()));
             if (warp)
-                QCursor::setPos(e.host.form->mapToGlobal(at));
+                QCursor::setPos(e.form->mapToGlobal(at));
             else
                 QTest::mouseMove(e.window(), at);
             QCoreApplication::processEvents();
@@ -921,13 +895,13 @@ const std::vector<std::pair<int, void (*)(Episode &)>> stepKinds = {
             const int how = e.random.below(4);
             if (how == 0) {
                 e.note(u"focus the neighbouring text box"_s);
-                e.host.neighbour->setFocus(Qt::TabFocusReason);
+                e.neighbour->setFocus(Qt::TabFocusReason);
             } else if (how == 1 && on) {
                 e.note(u"setFocus() on %1"_s.arg(describe(on)));
                 on->setFocus(Qt::OtherFocusReason);
             } else if (how == 2) {
                 e.note(u"activate the form"_s);
-                e.host.form->activateWindow();
+                e.form->activateWindow();
                 QCoreApplication::processEvents();
             } else if (how == 3 && QApplication::focusWidget()) {
                 e.note(u"clear the focus"_s);
@@ -938,15 +912,15 @@ const std::vector<std::pair<int, void (*)(Episode &)>> stepKinds = {
         [](Episode &e) {
             // The control as a widget: enabled, shown, of odd sizes; or the form enabled.
             static const std::vector<QByteArray> names = { "enabled", "visible", "size", "size" };
-            QWidget *which = e.widget() && e.random.chance(0.6) ? e.widget() : e.host.form.data();
-            const QByteArray name = which == e.host.form ? "enabled" : e.random.pick(names);
+            QWidget *which = e.widget() && e.random.chance(0.6) ? e.widget() : e.form.data();
+            const QByteArray name = which == e.form ? "enabled" : e.random.pick(names);
             const QVariant value = e.values.make(which->property(name).metaType(), name);
-            e.note(u"set the %1's %2 = %3"_s.arg(which == e.host.form ? "form" : "control", name, shortly(value)));
+            e.note(u"set the %1's %2 = %3"_s.arg(which == e.form ? "form" : "control", name, shortly(value)));
             which->setProperty(name, value);
         } },
     { 12,
         [](Episode &e) {
-            const QMetaObject *meta = e.host.object->metaObject();
+            const QMetaObject *meta = e.object->metaObject();
             std::vector<QMetaProperty> writable;
             for (int i = 0; i < meta->propertyCount(); ++i)
                 if (meta->property(i).isWritable() && declaredByTheLibrary(meta->property(i).enclosingMetaObject()))
@@ -956,20 +930,20 @@ const std::vector<std::pair<int, void (*)(Episode &)>> stepKinds = {
             const QMetaProperty property = e.random.pick(writable);
             const QVariant value = e.values.make(property.metaType(), property.name());
             e.note(u"set %1 = %2"_s.arg(QLatin1String(property.name()), shortly(value)));
-            property.write(e.host.object, value);
+            property.write(e.object, value);
         } },
     { 2,
         [](Episode &e) {
             e.note(u"read every property"_s);
-            const QMetaObject *meta = e.host.object->metaObject();
-            for (int i = 0; i < meta->propertyCount() && e.host.object; ++i)
-                meta->property(i).read(e.host.object);
+            const QMetaObject *meta = e.object->metaObject();
+            for (int i = 0; i < meta->propertyCount() && e.object; ++i)
+                meta->property(i).read(e.object);
         } },
     { 10,
         [](Episode &e) {
-            const std::vector<QMetaMethod> methods = membersOf(e.host.object, QMetaMethod::Method);
+            const std::vector<QMetaMethod> methods = membersOf(e.object, QMetaMethod::Method);
             if (!methods.empty())
-                call(e.host.object, e.random.pick(methods), e.values);
+                call(e.object, e.random.pick(methods), e.values);
         } },
     { 3,
         [](Episode &e) {
@@ -1038,27 +1012,27 @@ int Episode::run(int steps)
     const qsizetype windowsBefore = QApplication::topLevelWidgets().size();
     place();
     const int deleteAt = random.below(steps + 1);
-    const Deletion mode = Deletion(random.below(5));
+    const int mode = random.below(5);
     int ran = 0;
-    for (; ran < steps && host.form && host.object; ++ran) {
+    for (; ran < steps && form && object; ++ran) {
         if (ran == deleteAt)
             arm(mode);
-        if (!host.object || !host.form)
+        if (!object || !form)
             break;
         int roll = random.below(totalWeight);
         const auto kind = std::find_if(
             stepKinds.begin(), stepKinds.end(), [&](const auto &kind) { return (roll -= kind.first) < 0; });
         kind->second(*this);
     }
-    if (host.object && !hook)
-        arm(Deletion::Direct);
-    else if (host.object) {
+    if (object && !hook)
+        destroy(u"between two steps"_s);
+    else if (object) {
         note(u"the event never came: the host deletes the control"_s);
-        delete host.object.data();
+        delete object.data();
     }
     check();
     hook.reset();
-    delete host.form.data();
+    delete form.data();
     QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
     for (; locks > 0; --locks)
         ClassFactory::LockServer(false);

@@ -53,11 +53,10 @@ struct HostForm
     ~HostForm();
     // Called once when a menu or modal form is open, before it is dismissed.
     void onModal(std::function<void()> action);
-    // What a user does by hand: pointer, wheel, focus and keys; then, as a host, a resize,
+    // What a user does by hand: pointer, wheel, focus and keys; then, `asHost`, a resize,
     // the form disabled and enabled again and every method called. Each step while the
     // object lives, followed by the deletions it asked for.
-    void useByHand();
-    void useAsHost();
+    void use(bool asHost);
     // Whether the text box still takes typing, in the form enabled and shown again.
     bool neighbourWorks();
 
