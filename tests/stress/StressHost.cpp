@@ -286,9 +286,9 @@ public:
             return QFont(u"Liberation Sans"_s, m_random.pick(std::vector<int> { 1, 6, 8, 11, 72, 400 }),
                 m_random.chance(0.5) ? QFont::Bold : QFont::Normal);
         } else if (type == QMetaType::fromType<QList<qint32>>()) {
-            QList<qint32> list;
-            for (int n = m_random.below(300); n > 0; --n)
-                list.append(qint32(integer()));
+            QList<qint32> list(m_random.below(300));
+            for (qint32 &entry : list)
+                entry = qint32(integer());
             return QVariant::fromValue(list);
         } else if (type == QMetaType::fromType<Picture>()) {
             return QVariant::fromValue(m_random.chance(0.2) ? Picture() : Picture::fromFile(file()));
@@ -648,10 +648,10 @@ struct Episode : HostForm
             values.windows.push_back(platform::handleOf(widget()));
         if (UserControl *control = this->control()) {
             if (random.chance(0.1)) {
-                Ambient ambient;
-                ambient.UserMode = false;
-                control->setAmbient(ambient);
+                Ambient designer;
+                designer.UserMode = false;
                 note(u"the container is a form designer"_s);
+                control->setAmbient(designer);
             }
             if (random.chance(0.5)) {
                 note(u"InitNew"_s);
