@@ -9,6 +9,8 @@
 #include <QBuffer>
 #include <QPainter>
 
+#include <functional>
+
 namespace zelctl::snapshots {
 
 namespace {
@@ -39,13 +41,27 @@ QByteArray pngWithAlpha()
 }
 
 // A checkerboard, so what the picture leaves see-through shows.
-QImage checkerboard()
+QImage checkerboard(QSize size)
 {
-    QImage board(Side + 16, Side + 16, QImage::Format_RGB32);
+    QImage board(size, QImage::Format_RGB32);
     for (int y = 0; y < board.height(); ++y)
         for (int x = 0; x < board.width(); ++x)
             board.setPixel(x, y, ((x / 8 + y / 8) % 2) ? 0xFFFFFFFF : 0xFFC8C8C8);
     return board;
+}
+
+// What paint draws on a checkerboard of that size.
+QImage paintedOnCheckerboard(QSize size, const std::function<void(qint32 dc)> &paint)
+{
+    const gdi::HBITMAP bitmap = gdi::createBitmapFromImage(checkerboard(size));
+    const gdi::HDC dc = gdi::CreateCompatibleDC(0);
+    const gdi::HGDIOBJ previous = gdi::SelectObject(dc, bitmap);
+    paint(dc);
+    gdi::SelectObject(dc, previous);
+    gdi::DeleteDC(dc);
+    const QImage picture = gdi::imageFromBitmap(bitmap).convertToFormat(QImage::Format_RGB32);
+    gdi::DeleteObject(bitmap);
+    return picture;
 }
 
 QImage pngStyle(qint32 style)
@@ -54,15 +70,27 @@ QImage pngStyle(qint32 style)
     png.setTransparentStyle(style);
     if (!png.LoadData(pngWithAlpha()))
         return {};
-    const gdi::HBITMAP bitmap = gdi::createBitmapFromImage(checkerboard());
-    const gdi::HDC dc = gdi::CreateCompatibleDC(0);
-    const gdi::HGDIOBJ previous = gdi::SelectObject(dc, bitmap);
-    png.Paint(dc, 8, 8);
-    gdi::SelectObject(dc, previous);
-    gdi::DeleteDC(dc);
-    const QImage picture = gdi::imageFromBitmap(bitmap).convertToFormat(QImage::Format_RGB32);
-    gdi::DeleteObject(bitmap);
-    return picture;
+    return paintedOnCheckerboard(QSize(Side + 16, Side + 16), [&png](qint32 dc) { png.Paint(dc, 8, 8); });
+}
+
+// Each way a host paints: with alpha as it is, shrunk to half, its bottom-right quarter
+// doubled, half opaque; without alpha, the quarter doubled.
+QImage pngPaintedWays()
+{
+    StdPNG withAlpha;
+    withAlpha.setTransparentStyle(StdPNG::alphaTransparent);
+    StdPNG opaque;
+    opaque.setTransparentStyle(StdPNG::alphaNoBkgNoAlpha);
+    if (!withAlpha.LoadData(pngWithAlpha()) || !opaque.LoadData(pngWithAlpha()))
+        return {};
+    constexpr int Half = Side / 2;
+    return paintedOnCheckerboard(QSize(4 * Side + 48, 2 * Side + 24), [&](qint32 dc) {
+        withAlpha.Paint(dc, 8, 8);
+        withAlpha.Paint(dc, Side + 16, 8, Half, Half);
+        withAlpha.Paint(dc, Side + Half + 24, 8, Side, Side, 0, Half, Half, Half, Half);
+        withAlpha.Paint(dc, 2 * Side + Half + 32, 8, 0, 0, 0, 0, 0, 0, 0, 128);
+        opaque.Paint(dc, 8, Side + 16, Side, Side, 0, Half, Half, Half, Half);
+    });
 }
 
 // Three frames on a grey field: a red square whose disposal is under test, then a small
@@ -118,6 +146,7 @@ void addPictureScenes(QList<Scene> &scenes)
         { StdPNG::alphaPNGwindowBkg, "file background" }, { 0x80FFFF, "colour background" } };
     for (const auto &[style, name] : styles)
         scenes.append({ QStringLiteral("StdPNG"), QLatin1String(name), [style = style] { return pngStyle(style); } });
+    scenes.append({ QStringLiteral("StdPNG"), QStringLiteral("painted ways"), pngPaintedWays });
     const std::pair<quint8, const char *> disposals[]
         = { { 1, "kept" }, { 2, "cleared to background" }, { 3, "restored to previous" } };
     for (const auto &[disposal, name] : disposals)

@@ -4,6 +4,7 @@
 #include "gif/ucAniGIF.h"
 #include "platform/Settings.h"
 #include "platform/Twips.h"
+#include "support/TestSupport.h"
 
 #include <QMap>
 #include <QSignalSpy>
@@ -15,8 +16,6 @@
 #include <gtest/gtest.h>
 
 #include <functional>
-
-#include <sys/stat.h>
 
 using namespace zelctl;
 using zelctl::test::GifBuilder;
@@ -144,21 +143,17 @@ TEST(RemoteLoad, readsAGifOverHttpWithoutBlocking)
 TEST(RemoteLoad, readsLocalPathsAndFileAddressesButNoFifo)
 {
     QTemporaryDir dir;
-    QFile file(dir.filePath("local.gif"));
-    ASSERT_TRUE(file.open(QIODevice::WriteOnly));
-    file.write(twoFrames);
-    file.close();
-    const QString fifo = dir.filePath("fifo.gif");
-    ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
+    const QString file = test::writeFile(dir.filePath("local.gif"), twoFrames);
+    const QString fifo = test::makeFifo(dir.filePath("fifo.gif"));
 
     ucAniGIF gif;
     QSignalSpy complete(&gif, &ucAniGIF::RemoteLoadComplete);
     QSignalSpy failed(&gif, &ucAniGIF::RemoteLoadFailure);
-    gif.LoadAnimatedGIF_Remote(file.fileName());
+    gif.LoadAnimatedGIF_Remote(file);
     EXPECT_EQ(gif.FrameCount(), 0) << "a local file is read later too";
     ASSERT_TRUE(QTest::qWaitFor([&] { return gif.FrameCount() == 2; }));
     ASSERT_FALSE(gif.LoadAnimatedGIF_Array(QByteArray()));
-    gif.LoadAnimatedGIF_Remote(QUrl::fromLocalFile(file.fileName()).toString());
+    gif.LoadAnimatedGIF_Remote(QUrl::fromLocalFile(file).toString());
     ASSERT_TRUE(QTest::qWaitFor([&] { return gif.FrameCount() == 2; }));
     EXPECT_EQ(complete.count(), 2);
 

@@ -9,8 +9,6 @@
 
 #include <gtest/gtest.h>
 
-#include <sys/stat.h>
-
 using namespace zelctl;
 using namespace zelctl::test;
 
@@ -54,6 +52,10 @@ TEST(PngReader, namesEachFailureAndKeepsNothingOfIt)
     const QString tooLarge = "Image is too large to process. Cannot continue.";
     const QString truncated = "Truncated file: a chunk runs past the end or IEND is missing.";
     const QString notPng = "Not a PNG file.";
+    // A tRNS with a bad CRC (whatever is validated), too short a key, or in an RGBA image is ignored.
+    const QByteArray badKey = smallFile(withBadCrc("tRNS", QByteArray::fromHex("0001")));
+    const QByteArray rgba = signature() + ihdr(1, 1, 8, 6) + chunk("tRNS", QByteArray::fromHex("000100020003"))
+        + chunk("IDAT", deflate(QByteArray::fromHex("0001020380"))) + iend;
     const struct
     {
         QByteArray file;
@@ -86,11 +88,11 @@ TEST(PngReader, namesEachFailureAndKeepsNothingOfIt)
         { indexed + withBadCrc("PLTE", palette) + idat + iend, "Invalid Palette (bad CRC). Cannot continue." },
         { indexed + withBadCrc("PLTE", palette) + idat + iend, "Invalid Palette (bad CRC). Cannot continue.", false },
         { indexed + chunk("PLTE", palette.left(5)) + idat + iend, "Invalid Palette. Cannot continue." },
-        { smallFile(withBadCrc("PLTE", palette)), "loaded" }, // a grey image ignores its palette
+        { smallFile(withBadCrc("PLTE", palette)), "8 bits" }, // a grey image ignores its palette
         { signature() + ihdr(3, 1, 8, 0) + withBadCrc("IDAT", idat.mid(8, idat.size() - 12)) + iend,
             "Corrupted Image Data (bad CRC). Cannot continue." },
         { greyFile(4, 4, {}, 5), "Invalid filter type in image data." },
-        { greyFile(4, 4, {}, 4), "loaded" },
+        { greyFile(4, 4, {}, 4), "8 bits" },
         { noData, "No image data found. Cannot continue." },
         // 56 bytes are too few whatever they hold; 57 go on to the chunk loop.
         { noData.left(56), notPng },
@@ -99,15 +101,21 @@ TEST(PngReader, namesEachFailureAndKeepsNothingOfIt)
         { QByteArray(smallFile()).replace(6, 1, QByteArray(1, '\0')), notPng },
         { lying, truncated },
         // Empty data chunks are skipped; nothing after IEND is read, even with data in IEND.
-        { signature() + ihdr(3, 1, 8, 0) + chunk("IDAT", {}) + idat + chunk("IDAT", {}) + iend, "loaded" },
-        { smallFile() + QByteArray(40, '\xff'), "loaded" },
-        { signature() + ihdr(3, 1, 8, 0) + idat + chunk("IEND", "xyz") + withBadCrc("IDAT", "z"), "loaded" },
+        { signature() + ihdr(3, 1, 8, 0) + chunk("IDAT", {}) + idat + chunk("IDAT", {}) + iend, "8 bits" },
+        { smallFile() + QByteArray(40, '\xff'), "8 bits" },
+        { signature() + ihdr(3, 1, 8, 0) + idat + chunk("IEND", "xyz") + withBadCrc("IDAT", "z"), "8 bits" },
+        { badKey, "8 bits" },
+        { badKey, "8 bits", false },
+        { smallFile(chunk("tRNS", QByteArray(1, '\0'))), "8 bits" },
+        { rgba, "32 bits" },
     };
     for (const auto &c : cases) {
         StdPNG image;
+        image.setTransparentStyle(StdPNG::alphaTransparent);
         ASSERT_TRUE(image.LoadData(smallFile()));
         const bool loaded = image.LoadData(c.file, c.validateAllData);
-        EXPECT_EQ(loaded ? QStringLiteral("loaded") : image.FailureReason(), c.result) << c.file.toHex().toStdString();
+        EXPECT_EQ(loaded ? QStringLiteral("%1 bits").arg(image.BitCount_BMP()) : image.FailureReason(), c.result)
+            << c.file.toHex().toStdString();
         EXPECT_EQ(image.BitCount_BMP() != 0 && image.handle() != 0, loaded);
     }
     // Cut at every byte after the signature, the load fails cleanly.
@@ -159,23 +167,6 @@ TEST(PngReader, readsTheAncillaryChunksOfTheRightSizeAndCrc)
     EXPECT_DOUBLE_EQ(gammaOf(withBadCrc("gAMA", be32(45455)), true), 0.0);
     EXPECT_DOUBLE_EQ(gammaOf(withBadCrc("gAMA", be32(45455)), false), 0.45455);
     EXPECT_DOUBLE_EQ(gammaOf(chunkWithCrc("gAMA", be32(45455), 0), true), 0.45455);
-}
-
-TEST(PngReader, ignoresTransparencyWhereItDoesNotApply)
-{
-    // A tRNS with a bad CRC (in both modes), too short a key, or in an RGBA image.
-    const QByteArray rgba = signature() + ihdr(1, 1, 8, 6) + chunk("tRNS", QByteArray::fromHex("000100020003"))
-        + chunk("IDAT", deflate(QByteArray::fromHex("0001020380"))) + iend;
-    const std::pair<QByteArray, int> cases[] = { { smallFile(withBadCrc("tRNS", QByteArray::fromHex("0001"))), 8 },
-        { smallFile(chunk("tRNS", QByteArray(1, '\0'))), 8 }, { rgba, 32 } };
-    for (const auto &[file, bitCount] : cases) {
-        for (const bool validate : { true, false }) {
-            StdPNG image;
-            image.setTransparentStyle(StdPNG::alphaTransparent);
-            ASSERT_TRUE(image.LoadData(file, validate));
-            EXPECT_EQ(image.BitCount_BMP(), bitCount) << file.toHex().toStdString();
-        }
-    }
 }
 
 TEST(PngReader, joinsTextAndCompressedTextIntoComments)
@@ -237,25 +228,19 @@ TEST(PngReader, givesPalettesAndTurnsGreyIntoPaletteAndBack)
 TEST(PngReader, loadsFromDiskButNothingThatIsNotABoundedFile)
 {
     QTemporaryDir folder;
-    QFile file(folder.filePath("image.png"));
-    ASSERT_TRUE(file.open(QIODevice::WriteOnly) && file.write(smallFile()) > 0);
-    file.close();
     StdPNG image;
-    EXPECT_TRUE(image.LoadFile(file.fileName()));
+    EXPECT_TRUE(image.LoadFile(writeFile(folder.filePath("image.png"), smallFile())));
     EXPECT_EQ(image.FailureReason(), "");
-    // A directory, a FIFO without a writer (which would block), an endless device, a file
-    // past the bound.
-    const QString fifo = folder.filePath("fifo");
-    ASSERT_EQ(mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
-    for (const QString &notAFile :
-        { folder.filePath("missing.png"), folder.path(), fifo, QStringLiteral("/dev/zero") }) {
-        EXPECT_FALSE(image.LoadFile(notAFile));
-        EXPECT_EQ(image.FailureReason(), "The file cannot be read.");
+    // A FIFO without a writer would block; an endless device would never end.
+    const std::pair<QString, QString> cases[] = { { folder.filePath("missing.png"), "The file cannot be read." },
+        { folder.path(), "The file cannot be read." },
+        { makeFifo(folder.filePath("fifo")), "The file cannot be read." }, { "/dev/zero", "The file cannot be read." },
+        { sizedFile(folder.filePath("large.png"), png::MaxFileBytes + 1),
+            "Image is too large to process. Cannot continue." } };
+    for (const auto &[path, reason] : cases) {
+        EXPECT_FALSE(image.LoadFile(path));
+        EXPECT_EQ(image.FailureReason(), reason);
     }
-    ASSERT_TRUE(file.open(QIODevice::WriteOnly) && file.write(smallFile()) > 0 && file.resize(png::MaxFileBytes + 1));
-    file.close();
-    EXPECT_FALSE(image.LoadFile(file.fileName()));
-    EXPECT_EQ(image.FailureReason(), "Image is too large to process. Cannot continue.");
 }
 
 TEST(PngReader, replaysEveryFileTheFuzzerFound)
