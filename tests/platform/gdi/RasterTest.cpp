@@ -17,6 +17,8 @@
 
 using namespace zelctl::gdi;
 using namespace zelctl::gdi::test;
+using zelctl::platform::COLOR_WINDOW;
+using zelctl::platform::systemColor;
 
 namespace {
 
@@ -376,7 +378,9 @@ TEST(Raster, fillsOutlinesAndLinesMatchThePixelModel)
             continue;
         Picture want = pictureOf(*b);
         const QByteArray before = b->bytes();
-        const COLORREF ink = rng() & 0xFFFFFF, paint = rng() & 0xFFFFFF;
+        // Now and then the brush has the window's system colour, white.
+        const COLORREF ink = rng() & 0xFFFFFF, paint = n % 8 ? rng() & 0xFFFFFF : systemColor(COLOR_WINDOW);
+        const COLORREF painted = n % 8 ? paint : 0xFFFFFF;
         const HPEN pen = pick(rng, 0, 3) ? CreatePen(PS_SOLID, 1, ink) : GetStockObject(NULL_PEN);
         const HBRUSH brush = pick(rng, 0, 3) ? CreateSolidBrush(paint) : GetStockObject(NULL_BRUSH);
         const bool xorPen = pick(rng, 0, 1);
@@ -403,7 +407,7 @@ TEST(Raster, fillsOutlinesAndLinesMatchThePixelModel)
             trace += " " + std::to_string(v);
         if (n % 3 == 0) {
             if (brush != GetStockObject(NULL_BRUSH))
-                area(c[0], c[1], c[2], c[3], [&](qint64 x, qint64 y) { mark(x, y, paint, false); });
+                area(c[0], c[1], c[2], c[3], [&](qint64 x, qint64 y) { mark(x, y, painted, false); });
             ASSERT_NE(FillRect(b->dc, RECT { c[0], c[1], c[2], c[3] }, brush), 0) << trace;
         } else if (n % 3 == 1) {
             // Corners in any order; the outline has the pen, the inside within it the brush.
@@ -412,7 +416,7 @@ TEST(Raster, fillsOutlinesAndLinesMatchThePixelModel)
                          bottom = std::max(c[1], c[3]), inset = pen != GetStockObject(NULL_PEN);
             if (ok && brush != GetStockObject(NULL_BRUSH))
                 area(l + inset, t + inset, r - inset, bottom - inset,
-                    [&](qint64 x, qint64 y) { mark(x, y, paint, false); });
+                    [&](qint64 x, qint64 y) { mark(x, y, painted, false); });
             if (ok && inset)
                 area(l, t, r, bottom, [&](qint64 x, qint64 y) {
                     if (x == l || x == r - 1 || y == t || y == bottom - 1)
