@@ -2,7 +2,7 @@
 #include "platform/MessageBox.h"
 #include "platform/OleColor.h"
 #include "platform/Settings.h"
-#include "platform/Shell.h"
+#include "support/TestSupport.h"
 
 #include <QApplication>
 #include <QDir>
@@ -18,6 +18,25 @@
 #include <thread>
 
 using namespace zelctl::platform;
+using zelctl::test::writeFile;
+
+namespace {
+
+QByteArray contents(const QString &path)
+{
+    QFile file(path);
+    return file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray();
+}
+
+// Each thread keeps its own root path, so a new one reads the setting afresh.
+QString rootPathInANewThread()
+{
+    QString root;
+    std::thread([&root] { root = zelctl::modFuncs::GetRootPath(); }).join();
+    return root;
+}
+
+} // namespace
 
 TEST(Settings, liveInThePrivateConfigFolderAndFoldTheApplicationName)
 {
@@ -35,31 +54,19 @@ TEST(Settings, liveInThePrivateConfigFolderAndFoldTheApplicationName)
 
 TEST(Settings, aHandEditedValueIsReadWholeAndNeverWrittenOver)
 {
-    const auto contents = [](const QString &path) {
-        QFile file(path);
-        return file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray();
-    };
-    const auto write = [](const QString &path, const QByteArray &bytes) {
-        QFile file(path);
-        ASSERT_TRUE(file.open(QIODevice::WriteOnly | QIODevice::Truncate));
-        file.write(bytes);
-    };
     const QString path = settingsFile("zEL");
     const QByteArray original = contents(path);
     const QByteArray edited = "[Setup]\nRootPath=/opt/zel,2024\nSkinPreviewPath = /srv/skins;old \n";
-    write(path, edited);
+    writeFile(path, edited);
 
     EXPECT_EQ(GetSetting("zEL", "Setup", "RootPath"), "/opt/zel,2024");
     EXPECT_EQ(GetSetting("zEL", "Setup", "SkinPreviewPath"), "/srv/skins;old");
-    // Each thread keeps its own root path, so a new one reads the setting afresh.
-    QString root;
-    std::thread([&root] { root = zelctl::modFuncs::GetRootPath(); }).join();
-    EXPECT_EQ(root, "/opt/zel,2024/");
+    EXPECT_EQ(rootPathInANewThread(), "/opt/zel,2024/");
     EXPECT_EQ(contents(path), edited) << "the user's setting stays as written";
 
     EXPECT_TRUE(SaveSetting("zEL", "Setup", "Mixed", "a,b;c"));
     EXPECT_EQ(GetSetting("zEL", "Setup", "Mixed"), "a,b;c") << "what the library writes reads back the same";
-    write(path, original);
+    writeFile(path, original);
 }
 
 TEST(Settings, aStoreThatCannotBeReadIsNeverWrittenOver)
@@ -67,16 +74,6 @@ TEST(Settings, aStoreThatCannotBeReadIsNeverWrittenOver)
     const QString path = settingsFile("zEL");
     QFile original(path);
     ASSERT_TRUE(original.rename(path + ".kept"));
-    const auto rootPathInANewThread = [] {
-        // Each thread keeps its own root path, so a new one reads the setting afresh.
-        QString root;
-        std::thread([&root] { root = zelctl::modFuncs::GetRootPath(); }).join();
-        return root;
-    };
-    const auto bytes = [&] {
-        QFile file(path);
-        return file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray("(unreadable)");
-    };
 
     // A folder where the file should be: nothing can be read, nothing may be put there.
     ASSERT_TRUE(QDir().mkpath(path + "/kept"));
@@ -97,15 +94,11 @@ TEST(Settings, aStoreThatCannotBeReadIsNeverWrittenOver)
         { "[Setup\nRootPath=/opt/zel\nSkinPreviewPath=/srv/skins\n", "/opt/zel/" },
     };
     for (const auto &typo : typos) {
-        {
-            QFile file(path);
-            ASSERT_TRUE(file.open(QIODevice::WriteOnly | QIODevice::Truncate));
-            file.write(typo.typed);
-        }
+        writeFile(path, typo.typed);
         EXPECT_EQ(rootPathInANewThread().toStdString(), typo.root.toStdString());
         EXPECT_FALSE(SaveSetting("zEL", "Setup", "SkinPreviewPath", "/tmp/"));
         EXPECT_FALSE(DeleteSetting("zEL", "Setup", "SkinPreviewPath"));
-        EXPECT_EQ(bytes(), typo.typed);
+        EXPECT_EQ(contents(path), typo.typed);
     }
     QFile::remove(path);
     original.rename(path);
@@ -127,33 +120,13 @@ TEST(MessageBox, closingTheWindowItBelongsToWhileItIsOpenAnswersAsEscape)
     setMessageBoxPresenter(recorder);
 }
 
-TEST(OleColor, resolvesSystemColoursAndConvertsToQColor)
+TEST(OleColor, resolvesSystemColours)
 {
     EXPECT_EQ(translateColor(0x12563412u), 0x00563412u) << "only the colour bytes count";
-    for (const auto &[index, colour] : { std::pair { COLOR_WINDOW, rgb(255, 255, 255) },
-             { COLOR_BTNFACE, rgb(240, 240, 240) }, { COLOR_GRAYTEXT, rgb(109, 109, 109) } }) {
-        EXPECT_EQ(translateColor(systemColor(index)), colour) << index;
-    }
-    EXPECT_EQ(GetSysColor(-1), 0u);
-    EXPECT_EQ(GetSysColor(31), 0u);
-    EXPECT_EQ(toQColor(rgb(10, 20, 30)), QColor(10, 20, 30));
+    for (const auto &[index, colour] :
+        { std::pair { int(COLOR_WINDOW), rgb(255, 255, 255) }, { int(COLOR_BTNFACE), rgb(240, 240, 240) },
+            { int(COLOR_GRAYTEXT), rgb(109, 109, 109) }, { -1, 0u }, { 31, 0u } })
+        EXPECT_EQ(GetSysColor(index), colour) << index;
+    EXPECT_EQ(translateColor(systemColor(COLOR_WINDOW)), rgb(255, 255, 255));
     EXPECT_EQ(toQColor(systemColor(COLOR_GRAYTEXT)), QColor(109, 109, 109));
-    EXPECT_EQ(fromQColor(QColor(10, 20, 30)), rgb(10, 20, 30));
-}
-
-// The hook's answer is the caller's, and the hook handed back on restoring is the one that
-// was installed.
-TEST(Shell, hookSeesTheActionAndCanBeRestored)
-{
-    QStringList opened;
-    ShellOpenHook previous = setShellOpenHook([&](const QString &action) {
-        opened << action;
-        return action.startsWith("https:");
-    });
-    EXPECT_TRUE(shellOpen("https://example.invalid/ajuda"));
-    EXPECT_FALSE(shellOpen("nada"));
-    ShellOpenHook ours = setShellOpenHook(std::move(previous));
-    ASSERT_TRUE(ours);
-    ours("de volta");
-    EXPECT_EQ(opened, QStringList({ "https://example.invalid/ajuda", "nada", "de volta" }));
 }

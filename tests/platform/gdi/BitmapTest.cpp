@@ -49,7 +49,7 @@ TEST(DibSection, refusesHeadersItCannotHonour)
     EXPECT_EQ(CreateDIBSection(0, nullptr, DIB_RGB_COLORS, nullptr), 0);
 }
 
-TEST(DibSection, padsRowsTo32BitsAndStartsZeroed)
+TEST(DibSection, padsRowsTo32BitsStartsZeroedAndDescribesItself)
 {
     struct Case
     {
@@ -60,6 +60,7 @@ TEST(DibSection, padsRowsTo32BitsAndStartsZeroed)
     for (const Case &c : { Case { 1, 1, 4 }, Case { 33, 1, 8 }, Case { 9, 4, 8 }, Case { 5, 8, 8 }, Case { 3, 24, 12 },
              Case { 5, 24, 16 }, Case { 3, 32, 12 } }) {
         BITMAPINFO info = header(c.width, -3, c.bpp);
+        info.bmiHeader.biClrUsed = info.bmiHeader.biClrImportant = c.bpp <= 8 ? 1 : 0;
         void *bits = nullptr;
         const HBITMAP bitmap = CreateDIBSection(0, &info, DIB_RGB_COLORS, &bits);
         ASSERT_NE(bitmap, 0);
@@ -69,6 +70,7 @@ TEST(DibSection, padsRowsTo32BitsAndStartsZeroed)
         EXPECT_EQ(section.dsBm.bmHeight, 3);
         EXPECT_EQ(section.dsBmih.biHeight, -3);
         EXPECT_EQ(section.dsBmih.biSizeImage, quint32(3 * c.stride));
+        EXPECT_EQ(section.dsBmih.biClrUsed + section.dsBmih.biClrImportant, 0u) << "the whole table, all of it used";
         EXPECT_EQ(section.dsBm.bmBits, bits);
         const std::vector<uchar> zeros(size_t(3 * c.stride), 0);
         EXPECT_EQ(std::memcmp(bits, zeros.data(), zeros.size()), 0);
@@ -94,31 +96,12 @@ TEST(DibColorTable, holdsTwoToTheBitsEntriesAndClipsRequests)
         EXPECT_EQ(GetDIBColorTable(b.dc, quint32(size - 1), 1, read.data()), 1u);
         EXPECT_EQ(read[0].rgbRed, 0xAB);
         EXPECT_EQ(GetPixel(b.dc, 0, 0), 0x302010u) << "index 0 shows entry 0 as 0x00BBGGRR";
+        EXPECT_EQ(GetPixel(b.dc, 4, 0), CLR_INVALID) << "outside";
     }
     TestBitmap rgb(2, 2, 24);
     RGBQUAD entry;
     EXPECT_EQ(SetDIBColorTable(rgb.dc, 0, 1, &entry), 0u);
     EXPECT_EQ(GetDIBColorTable(rgb.dc, 0, 1, &entry), 0u);
-}
-
-TEST(DibColorTable, isReadThroughForEveryIndexedDepth)
-{
-    // 1 bit: pixels 1,0 in the high bits; 4 bits: high nibble first; 8 bits: one byte each.
-    TestBitmap mono(2, 1, 1, true, { 0x000000, 0xFFFFFF });
-    *mono.row(0) = 0x80;
-    EXPECT_EQ(GetPixel(mono.dc, 0, 0), 0xFFFFFFu);
-    EXPECT_EQ(GetPixel(mono.dc, 1, 0), 0x000000u);
-
-    TestBitmap nibble(2, 1, 4, true, { 0, 0x0000FF, 0x00FF00 });
-    *nibble.row(0) = 0x21;
-    EXPECT_EQ(GetPixel(nibble.dc, 0, 0), 0x00FF00u);
-    EXPECT_EQ(GetPixel(nibble.dc, 1, 0), 0xFF0000u);
-
-    TestBitmap byte(2, 1, 8, true, { 0, 0x123456 });
-    byte.row(0)[1] = 1;
-    EXPECT_EQ(GetPixel(byte.dc, 1, 0), 0x563412u);
-    EXPECT_EQ(GetPixel(byte.dc, 2, 0), CLR_INVALID);
-    EXPECT_EQ(GetPixel(byte.dc, -1, 0), CLR_INVALID);
 }
 
 TEST(GetDIBits, describesAndConvertsRowsCountedFromTheBottom)

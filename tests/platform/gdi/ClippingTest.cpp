@@ -93,22 +93,17 @@ std::vector<EntryPoint> entryPoints(HDC source)
     };
 }
 
-QByteArray pixelsOf(const TestBitmap &bitmap)
-{
-    return QByteArray(static_cast<const char *>(bitmap.bits), bitmap.stride * bitmap.height);
-}
-
 } // namespace
 
 TEST(Clipping, drawingWithNothingInsideTheTargetLeavesItAlone)
 {
     TestBitmap source(4, 4, 32);
-    source.fill(0x80402010, 4, 32);
+    source.fill(0x80402010);
     for (int bpp : { 8, 24, 32 }) {
         TestBitmap target(Side, Side, bpp, bpp != 24, { 0x102030, 0xFFFFFF });
         std::memset(target.bits, 0x5A, size_t(target.stride) * Side);
         SelectObject(target.dc, GetStockObject(WHITE_BRUSH));
-        const QByteArray before = pixelsOf(target);
+        const QByteArray before = target.bytes();
         for (const EntryPoint &entry : entryPoints(source.dc)) {
             for (const Area &area : nothingToDraw) {
                 // Text runs on from its corner: only a corner past the far edges or far before
@@ -117,7 +112,7 @@ TEST(Clipping, drawingWithNothingInsideTheTargetLeavesItAlone)
                 if (std::string_view(entry.name) == "TextOut" && near(area.x) && near(area.y))
                     continue;
                 entry.draw(target.dc, area);
-                EXPECT_EQ(pixelsOf(target), before) << entry.name << ", " << area.name << ", " << bpp << " bits";
+                EXPECT_EQ(target.bytes(), before) << entry.name << ", " << area.name << ", " << bpp << " bits";
             }
         }
     }
@@ -128,10 +123,13 @@ TEST(Clipping, redrawingAnyRectangleOfAWindowIsSafe)
     QWidget window;
     window.resize(20, 20);
     const HWND handle = platform::handleOf(&window);
+    EXPECT_TRUE(RedrawWindow(handle, nullptr, RDW_INVALIDATE | RDW_UPDATENOW));
     for (const Area &area : nothingToDraw) {
         const RECT r { area.x, area.y, int(qint64(area.x) + area.width), int(qint64(area.y) + area.height) };
         EXPECT_TRUE(RedrawWindow(handle, &r, RDW_INVALIDATE | RDW_UPDATENOW)) << area.name;
     }
+    EXPECT_FALSE(RedrawWindow(0, nullptr, RDW_INVALIDATE));
+    EXPECT_FALSE(RedrawWindow(handle + 1000, nullptr, RDW_INVALIDATE)) << "no such window";
 }
 
 } // namespace zelctl::gdi::test

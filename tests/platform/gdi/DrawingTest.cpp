@@ -6,8 +6,6 @@
 
 using namespace zelctl::gdi;
 using zelctl::gdi::test::TestBitmap;
-using zelctl::platform::COLOR_WINDOW;
-using zelctl::platform::systemColor;
 
 namespace {
 
@@ -17,7 +15,7 @@ std::string picture(const TestBitmap &b, int width, quint32 ink)
     std::string out;
     for (int y = 0; y < b.height; ++y) {
         for (int x = 0; x < width; ++x)
-            out += b.rgb(x, y) == ink ? '#' : '.';
+            out += b.value(x, y) == ink ? '#' : '.';
         out += '\n';
     }
     return out;
@@ -35,110 +33,6 @@ struct Owned
 
 } // namespace
 
-TEST(FillRect, fillsTheRectangleWithoutItsRightAndBottomEdges)
-{
-    TestBitmap b(4, 3, 24, false);
-    Owned red(CreateSolidBrush(0x0000FF)); // 0x00BBGGRR
-    EXPECT_NE(FillRect(b.dc, RECT { 1, 0, 3, 2 }, red.handle), 0);
-    EXPECT_EQ(picture(b, 4, 0xFF0000),
-        ".##.\n"
-        ".##.\n"
-        "....\n");
-    b.fill(0, 4, 24);
-    EXPECT_NE(FillRect(b.dc, RECT { -5, 2, 100, 50 }, red.handle), 0) << "clipped";
-    EXPECT_NE(FillRect(b.dc, RECT { 3, 0, 1, 2 }, red.handle), 0) << "empty";
-    EXPECT_NE(FillRect(b.dc, RECT { 0, 0, 4, 3 }, GetStockObject(NULL_BRUSH)), 0);
-    EXPECT_EQ(picture(b, 4, 0xFF0000),
-        "....\n"
-        "....\n"
-        "####\n");
-
-    // System colours are resolved; other depths get their own pixel values.
-    Owned window(CreateSolidBrush(systemColor(COLOR_WINDOW)));
-    FillRect(b.dc, RECT { 0, 0, 1, 1 }, window.handle);
-    EXPECT_EQ(b.rgb(0, 0), 0xFFFFFFu);
-    TestBitmap argb(1, 1, 32);
-    FillRect(argb.dc, RECT { 0, 0, 1, 1 }, red.handle);
-    EXPECT_EQ(argb.argb(0, 0), 0xFFFF0000u);
-    TestBitmap indexed(2, 1, 4, true, { 0x000000, 0x00FF00, 0xF00000 });
-    FillRect(indexed.dc, RECT { 1, 0, 2, 1 }, red.handle);
-    EXPECT_EQ(indexed.row(0)[0], 0x02);
-}
-
-TEST(Rectangle, outlinesWithThePenAndFillsWithTheBrush)
-{
-    TestBitmap b(5, 5, 24);
-    b.fill(0x777777, 5, 24);
-    ASSERT_TRUE(Rectangle(b.dc, 0, 0, 4, 4)); // default black pen, white brush
-    EXPECT_EQ(picture(b, 5, 0x000000),
-        "####.\n"
-        "#..#.\n"
-        "#..#.\n"
-        "####.\n"
-        ".....\n");
-    EXPECT_EQ(b.rgb(1, 1), 0xFFFFFFu);
-
-    b.fill(0x777777, 5, 24);
-    SelectObject(b.dc, GetStockObject(NULL_BRUSH));
-    ASSERT_TRUE(Rectangle(b.dc, 4, 4, 1, 1)) << "corners in any order";
-    EXPECT_EQ(picture(b, 5, 0x000000),
-        ".....\n"
-        ".###.\n"
-        ".#.#.\n"
-        ".###.\n"
-        ".....\n");
-    EXPECT_EQ(b.rgb(2, 2), 0x777777u) << "the null brush leaves the inside";
-    SelectObject(b.dc, GetStockObject(WHITE_BRUSH));
-    EXPECT_FALSE(Rectangle(b.dc, 0, 0, 2000000000, 5)) << "absurd coordinates are refused";
-}
-
-TEST(Lines, stopBeforeTheEndPointAndXorOnce)
-{
-    TestBitmap b(4, 4, 24);
-    Owned pen(CreatePen(PS_SOLID, 1, 0x0000FF));
-    SelectObject(b.dc, pen.handle);
-    POINT previous;
-    ASSERT_TRUE(MoveToEx(b.dc, 0, 0, nullptr));
-    ASSERT_TRUE(LineTo(b.dc, 3, 3));
-    ASSERT_TRUE(MoveToEx(b.dc, 3, 0, &previous));
-    EXPECT_EQ(previous.x, 3) << "LineTo moved the position to its end";
-    ASSERT_TRUE(LineTo(b.dc, 3, 2));
-    EXPECT_EQ(picture(b, 4, 0xFF0000),
-        "#..#\n"
-        ".#.#\n"
-        "..#.\n"
-        "....\n");
-
-    // XOR twice gives back what was there.
-    SetROP2(b.dc, R2_XORPEN);
-    MoveToEx(b.dc, 0, 3, nullptr);
-    LineTo(b.dc, 4, 3);
-    EXPECT_EQ(b.rgb(1, 3), 0xFF0000u);
-    MoveToEx(b.dc, 0, 3, nullptr);
-    LineTo(b.dc, 4, 3);
-    EXPECT_EQ(b.rgb(1, 3), 0x000000u);
-
-    // Straight lines reaching far beyond the bitmap draw only their part inside it, in
-    // either direction; a line wholly beside it draws nothing.
-    SetROP2(b.dc, R2_COPYPEN);
-    MoveToEx(b.dc, 1, -1000000, nullptr);
-    LineTo(b.dc, 1, 1000000);
-    MoveToEx(b.dc, 1000000, 3, nullptr);
-    LineTo(b.dc, 2, 3);
-    MoveToEx(b.dc, 0, 2, nullptr);
-    LineTo(b.dc, -1000000, 2);
-    MoveToEx(b.dc, 5, -1000000, nullptr);
-    LineTo(b.dc, -1000000, 1000000);
-    MoveToEx(b.dc, 900, -5, nullptr);
-    LineTo(b.dc, 900, 1000000);
-    EXPECT_EQ(picture(b, 4, 0xFF0000),
-        "##.#\n"
-        ".#.#\n"
-        "###.\n"
-        ".#.#\n");
-    SelectObject(b.dc, GetStockObject(BLACK_PEN));
-}
-
 TEST(PSet, drawsRoundDotsOfThePenWidth)
 {
     TestBitmap b(7, 7, 24);
@@ -155,7 +49,7 @@ TEST(PSet, drawsRoundDotsOfThePenWidth)
         { 5, ".......\n..###..\n.#####.\n.#####.\n.#####.\n..###..\n.......\n" },
     };
     for (const Case &c : cases) {
-        b.fill(0, 7, 24);
+        b.fill(0);
         Owned pen(CreatePen(PS_SOLID, c.width, 0));
         SelectObject(b.dc, pen.handle);
         ASSERT_TRUE(PSet(b.dc, 3, 3, 0xFFFFFF));
@@ -169,7 +63,7 @@ TEST(PSet, xorDotUnderACopyDotLeavesAMixedRing)
 {
     // The number badge: an XOR dot of width 7, then a copy dot of width 6, same colour.
     TestBitmap b(9, 9, 32);
-    b.fill(0xFFFFFFFF, 9, 32);
+    b.fill(0xFFFFFFFF);
     const COLORREF disc = 0x404040;
     Owned wide(CreatePen(PS_SOLID, 7, 0));
     Owned narrow(CreatePen(PS_SOLID, 6, 0));
@@ -192,7 +86,7 @@ TEST(Text, drawsInTheTextColourWithinItsMeasuredExtent)
     std::vector<std::string> renderings;
     for (bool topDown : { true, false }) {
         TestBitmap b(40, 24, 24, topDown);
-        b.fill(0xFFFFFF, 40, 24);
+        b.fill(0xFFFFFF);
         const HFONT original = SelectObject(b.dc, font.handle);
         SetTextColor(b.dc, 0x0000FF);
         SIZE extent;
@@ -201,7 +95,7 @@ TEST(Text, drawsInTheTextColourWithinItsMeasuredExtent)
         int inked = 0, outside = 0, pure = 0;
         for (int y = 0; y < 24; ++y)
             for (int x = 0; x < 40; ++x) {
-                const quint32 p = b.rgb(x, y);
+                const quint32 p = b.value(x, y);
                 if (p == 0xFFFFFF)
                     continue;
                 ++inked;

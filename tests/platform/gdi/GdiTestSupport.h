@@ -2,35 +2,38 @@
 
 #include "platform/gdi/Gdi.h"
 
-#include <initializer_list>
+#include <QByteArray>
+
+#include <cstring>
 #include <vector>
 
 namespace zelctl::gdi::test {
 
-// A memory DC with its own DIB section selected, released at the end of the scope.
+// A memory DC with a DIB section of its own selected, released at the end of the scope.
+// Pixels are read and written here bit by bit, apart from the library's code.
 class TestBitmap
 {
 public:
-    // topDown: first row in memory is the top one. table: 0x00RRGGBB entries.
-    TestBitmap(int width, int height, int bpp, bool topDown = true, std::initializer_list<quint32> table = {})
+    // entries: the first colours (0x00RRGGBB) of the table of 1 to 8 bits; the rest are black.
+    TestBitmap(int width, int height, int bpp, bool topDown = true, std::vector<quint32> entries = {})
+        : table(entries)
+        , width(width)
+        , height(height)
+        , bpp(bpp)
+        , stride((width * bpp + 31) / 32 * 4)
+        , topDown(topDown)
     {
         BITMAPINFO info;
         info.bmiHeader.biWidth = width;
         info.bmiHeader.biHeight = topDown ? -height : height;
         info.bmiHeader.biBitCount = quint16(bpp);
-        info.bmiHeader.biClrUsed = quint32(table.size());
-        size_t i = 0;
-        for (quint32 entry : table)
-            info.bmiColors[i++] = rgbQuad(entry);
+        info.bmiHeader.biClrUsed = quint32(entries.size());
+        for (size_t i = 0; i < entries.size(); ++i)
+            info.bmiColors[i] = rgbQuad(entries[i]);
+        table.resize(bpp <= 8 ? size_t(1) << bpp : 0, 0);
         bitmap = CreateDIBSection(0, &info, DIB_RGB_COLORS, &bits);
         dc = CreateCompatibleDC(0);
         previous = SelectObject(dc, bitmap);
-        BITMAP description;
-        GetObject(bitmap, description);
-        stride = description.bmWidthBytes;
-        this->height = height;
-        this->topDown = topDown;
-        this->bpp = bpp;
     }
     ~TestBitmap()
     {
@@ -42,56 +45,75 @@ public:
     TestBitmap &operator=(const TestBitmap &) = delete;
 
     // Row y counted from the top.
-    uchar *row(int y) const { return static_cast<uchar *>(bits) + (topDown ? y : height - 1 - y) * stride; }
-    // 32-bit pixel (0xAARRGGBB) and 24-bit pixel (0x00RRGGBB) access.
-    quint32 argb(int x, int y) const { return reinterpret_cast<const quint32 *>(row(y))[x]; }
-    void setArgb(int x, int y, quint32 value) { reinterpret_cast<quint32 *>(row(y))[x] = value; }
-    quint32 rgb(int x, int y) const
+    uchar *row(int y) const { return static_cast<uchar *>(bits) + qsizetype(topDown ? y : height - 1 - y) * stride; }
+    // A pixel as stored: a table index, 0x00RRGGBB or 0xAARRGGBB.
+    quint32 value(int x, int y) const
     {
-        const uchar *p = row(y) + 3 * x;
-        return quint32(p[0]) | quint32(p[1]) << 8 | quint32(p[2]) << 16;
+        if (bpp < 8)
+            return row(y)[x * bpp / 8] >> (8 - bpp - x * bpp % 8) & ((1u << bpp) - 1);
+        quint32 v = 0;
+        std::memcpy(&v, row(y) + x * (bpp / 8), size_t(bpp / 8));
+        return v;
     }
-    void setRgb(int x, int y, quint32 value)
+    void setValue(int x, int y, quint32 v)
     {
-        uchar *p = row(y) + 3 * x;
-        p[0] = uchar(value);
-        p[1] = uchar(value >> 8);
-        p[2] = uchar(value >> 16);
+        if (bpp >= 8) {
+            std::memcpy(row(y) + x * (bpp / 8), &v, size_t(bpp / 8));
+            return;
+        }
+        const int shift = 8 - bpp - x * bpp % 8;
+        uchar &byte = row(y)[x * bpp / 8];
+        byte = uchar((byte & ~(((1u << bpp) - 1) << shift)) | (v & ((1u << bpp) - 1)) << shift);
     }
-    // Fills all pixels of a 24- or 32-bit bitmap with one value.
-    void fill(quint32 value, int width, int bpp)
+    // Callers in other areas still pass the width and depth to fill; both are known here.
+    quint32 argb(int x, int y) const { return value(x, y); }
+    void fill(quint32 v, int = 0, int = 0)
     {
         for (int y = 0; y < height; ++y)
             for (int x = 0; x < width; ++x)
-                bpp == 32 ? setArgb(x, y, value) : setRgb(x, y, value);
+                setValue(x, y, v);
+    }
+    QByteArray bytes() const { return QByteArray(static_cast<const char *>(bits), stride * height); }
+
+    // The colour (0xAARRGGBB) a value shows, opaque below 32 bits, and the value that shows
+    // a colour: for a table the first of its nearest entries.
+    quint32 colorOf(quint32 v) const { return bpp == 32 ? v : 0xFF000000u | (bpp == 24 ? v : table[v]); }
+    quint32 valueOf(quint32 argb) const
+    {
+        if (bpp > 8)
+            return bpp == 32 ? argb : argb & 0xFFFFFFu;
+        const auto distance = [argb](quint32 entry) {
+            int sum = 0;
+            for (int shift : { 0, 8, 16 })
+                sum += (int(entry >> shift & 0xFF) - int(argb >> shift & 0xFF))
+                    * (int(entry >> shift & 0xFF) - int(argb >> shift & 0xFF));
+            return sum;
+        };
+        quint32 best = 0;
+        for (quint32 i = 1; i < table.size(); ++i)
+            if (distance(table[i]) < distance(table[best]))
+                best = i;
+        return best;
     }
 
+    std::vector<quint32> table;
+    int width, height, bpp, stride;
+    bool topDown;
     HDC dc = 0;
     HBITMAP bitmap = 0;
     HGDIOBJ previous = 0;
     void *bits = nullptr;
-    int stride = 0;
-    int height = 0;
-    bool topDown = true;
-    int bpp = 0;
 };
 
 using Values = std::vector<quint32>;
 
-// The first `width` pixels of a row of a 24- or 32-bit bitmap, left to right.
-inline Values rowOf(const TestBitmap &b, int y, int width)
+// The first `count` pixel values of row y, left to right.
+inline Values rowOf(const TestBitmap &b, int y, int count)
 {
     Values values;
-    for (int x = 0; x < width; ++x)
-        values.push_back(b.bpp == 32 ? b.argb(x, y) : b.rgb(x, y));
+    for (int x = 0; x < count; ++x)
+        values.push_back(b.value(x, y));
     return values;
-}
-
-inline void setRow(TestBitmap &b, int y, std::initializer_list<quint32> values)
-{
-    int x = 0;
-    for (quint32 v : values)
-        b.bpp == 32 ? b.setArgb(x++, y, v) : b.setRgb(x++, y, v);
 }
 
 } // namespace zelctl::gdi::test

@@ -66,6 +66,10 @@ TEST(Handles, wrongKindsAreRefused)
     EXPECT_EQ(GetObjectType(brush), OBJ_BRUSH);
     EXPECT_EQ(GetObjectType(0), 0);
     EXPECT_FALSE(BitBlt(b.dc, 0, 0, 1, 1, b.dc, 0, 0, 0x00660046)) << "raster operations other than the three";
+    BLENDFUNCTION unknown;
+    unknown.BlendOp = 1;
+    EXPECT_FALSE(AlphaBlend(b.dc, 0, 0, 1, 1, b.dc, 0, 0, 1, 1, unknown)) << "blend operations other than over";
+    EXPECT_FALSE(AlphaBlend(b.bitmap, 0, 0, 1, 1, b.dc, 0, 0, 1, 1, BLENDFUNCTION {}));
     EXPECT_TRUE(DeleteObject(brush));
 }
 

@@ -1,6 +1,5 @@
 #include "GdiTestSupport.h"
 
-#include "platform/WindowHandles.h"
 #include "platform/gdi/PersistentSurface.h"
 #include "platform/gdi/Pictures.h"
 
@@ -52,7 +51,7 @@ TEST(Pictures, drawStretchedLeavingTransparentPixelsAlone)
     sprite.setPixel(1, 0, qRgba(0, 0, 0, 0));
     TestBitmap b(4, 1, 24);
     for (quint32 rop : { SRCCOPY, SRCAND, SRCPAINT }) {
-        b.fill(0x00F0F0, 4, 24);
+        b.fill(0x00F0F0);
         ASSERT_TRUE(drawPicture(b.dc, sprite, 0, 0, 4, 1, rop));
         const quint32 inked = rop == SRCCOPY ? 0x808080 : rop == SRCAND ? 0x008080 : 0x80F0F0;
         EXPECT_EQ(rowOf(b, 0, 4), (Values { inked, inked, 0x00F0F0, 0x00F0F0 })) << rop;
@@ -65,9 +64,9 @@ TEST(Pictures, drawStretchedLeavingTransparentPixelsAlone)
 TEST(OpaqueRegion, coversEveryPixelThatDiffersFromTheKey)
 {
     TestBitmap b(5, 4, 24, false);
-    b.fill(0xFFFFFF, 5, 24);
+    b.fill(0xFFFFFF);
     // A 2 × 2 block and, below it, a lone pixel.
-    b.setRgb(1, 0, 0), b.setRgb(2, 0, 0), b.setRgb(1, 1, 0), b.setRgb(2, 1, 0), b.setRgb(4, 3, 0x123456);
+    b.setValue(1, 0, 0), b.setValue(2, 0, 0), b.setValue(1, 1, 0), b.setValue(2, 1, 0), b.setValue(4, 3, 0x123456);
     const QRegion region = opaqueRegion(b.dc, 0xFFFFFF);
     EXPECT_EQ(region, QRegion(1, 0, 2, 2) + QRegion(4, 3, 1, 1));
     EXPECT_EQ(region.rectCount(), 2) << "identical rows share one band";
@@ -77,7 +76,7 @@ TEST(OpaqueRegion, coversEveryPixelThatDiffersFromTheKey)
     // System colours name their RGB value; an all-key surface is empty.
     EXPECT_TRUE(
         opaqueRegion(b.dc, zelctl::platform::systemColor(zelctl::platform::COLOR_WINDOW)).contains(QPoint(4, 3)));
-    b.fill(0x000000, 5, 24);
+    b.fill(0x000000);
     EXPECT_TRUE(opaqueRegion(b.dc, 0x000000).isEmpty());
     EXPECT_TRUE(opaqueRegion(b.bitmap, 0).isEmpty());
 }
@@ -117,15 +116,4 @@ TEST(PersistentSurface, showsWhatWasDrawnAndKeepsItAcrossResizes)
 
     widget.resize(0, 0);
     EXPECT_EQ(surface.size(), QSize(1, 1));
-}
-
-TEST(RedrawWindow, reachesWidgetsByHandle)
-{
-    SurfaceWidget widget;
-    const HWND handle = zelctl::platform::handleOf(&widget);
-    EXPECT_TRUE(RedrawWindow(handle, nullptr, RDW_INVALIDATE | RDW_UPDATENOW));
-    const RECT part { 0, 0, 5, 5 };
-    EXPECT_TRUE(RedrawWindow(handle, &part, RDW_INVALIDATE));
-    EXPECT_FALSE(RedrawWindow(0, nullptr, RDW_INVALIDATE));
-    EXPECT_FALSE(RedrawWindow(handle + 1000, nullptr, RDW_INVALIDATE));
 }

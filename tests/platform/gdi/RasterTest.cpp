@@ -1,0 +1,453 @@
+// Blits, blending, fills and pens against a plain per-pixel model over seeded random cases:
+// every pair of depths, colour tables with twin entries, rectangles across and beyond the
+// edges, mirrored, empty and huge extents, source and target in one bitmap. The model is
+// worked out before each call; what it leaves alone, row padding included, must stay.
+
+#include "GdiTestSupport.h"
+
+#include <gtest/gtest.h>
+
+#include <array>
+#include <climits>
+#include <cmath>
+#include <memory>
+#include <random>
+#include <sstream>
+#include <tuple>
+
+using namespace zelctl::gdi;
+using namespace zelctl::gdi::test;
+using zelctl::platform::COLOR_WINDOW;
+using zelctl::platform::systemColor;
+
+namespace {
+
+using Rng = std::mt19937;
+
+int pick(Rng &rng, int low, int high)
+{
+    return std::uniform_int_distribution<int>(low, high)(rng);
+}
+
+// Mostly across a bitmap of `size` pixels; rarely far beyond it, or beyond the limits of
+// blits (2^27) and pens (2^20).
+int far(Rng &rng)
+{
+    static const int values[]
+        = { INT_MIN, -(1 << 27) - 1, -(1 << 27), -(1 << 20) - 1, -65536, 65536, 1 << 20, 1 << 27, INT_MAX };
+    return values[pick(rng, 0, 8)];
+}
+
+int position(Rng &rng, int size)
+{
+    return pick(rng, 0, 40) == 0 ? far(rng) : pick(rng, -3, size);
+}
+
+// An origin and extent: now and then empty, or mirrored (counting back from the origin).
+std::pair<int, int> span(Rng &rng, int size, int mirrorOdds = 4)
+{
+    const int start = pick(rng, 0, 40) == 0 ? far(rng) : pick(rng, -1, size - 1);
+    const int length = pick(rng, 0, 40) == 0 ? far(rng) : pick(rng, 0, 12) == 0 ? 0 : pick(rng, 1, size + 2);
+    const bool mirrored = pick(rng, 1, mirrorOdds) == 1 && std::abs(qint64(start)) + std::abs(qint64(length)) < 1 << 20;
+    return mirrored ? std::pair { start + length - 1, -length } : std::pair { start, length };
+}
+
+// Random depth, size, orientation, table (now and then that of `like`) and bytes.
+std::unique_ptr<TestBitmap> randomBitmap(Rng &rng, int maxWidth, const TestBitmap *like = nullptr)
+{
+    const int bpp = std::array { 1, 4, 8, 24, 32 }[size_t(pick(rng, 0, 4))];
+    std::vector<quint32> entries(size_t(bpp <= 8 ? pick(rng, 0, 1 << bpp) : 0));
+    for (size_t i = 0; i < entries.size(); ++i)
+        entries[i] = i > 0 && pick(rng, 0, 5) == 0 ? entries[i - 1] : rng() & 0xFFFFFF;
+    if (like && like->bpp == bpp && pick(rng, 0, 1) == 0)
+        entries = like->table;
+    auto b = std::make_unique<TestBitmap>(pick(rng, 1, maxWidth), pick(rng, 1, 5), bpp, pick(rng, 0, 1), entries);
+    for (int i = 0; i < b->stride * b->height; ++i)
+        static_cast<uchar *>(b->bits)[i] = uchar(rng());
+    return b;
+}
+
+// A pixel of the model: a value, or where colours are averaged or blended, a colour (B, G,
+// R, A) that the pixel must show to within a tolerance.
+struct Want
+{
+    quint32 value = 0;
+    bool approximate = false;
+    std::array<double, 4> bgra {};
+};
+using Picture = std::vector<Want>;
+
+Picture pictureOf(const TestBitmap &b)
+{
+    Picture picture;
+    for (int y = 0; y < b.height; ++y)
+        for (int x = 0; x < b.width; ++x)
+            picture.push_back({ b.value(x, y) });
+    return picture;
+}
+
+// Channel by channel; for a table, the nearest entry to some colour that close.
+bool near(const TestBitmap &b, quint32 got, const std::array<double, 4> &want, double tolerance)
+{
+    if (b.bpp > 8) {
+        for (int ch = 0; ch < b.bpp / 8; ++ch)
+            if (std::abs(double(got >> 8 * ch & 0xFF) - want[size_t(ch)]) > tolerance)
+                return false;
+        return true;
+    }
+    const auto low = [&](size_t ch) { return std::max(0, int(std::ceil(want[ch] - tolerance))); };
+    const auto high = [&](size_t ch) { return std::min(255, int(std::floor(want[ch] + tolerance))); };
+    for (int blue = low(0); blue <= high(0); ++blue)
+        for (int green = low(1); green <= high(1); ++green)
+            for (int red = low(2); red <= high(2); ++red)
+                if (b.valueOf(quint32(red << 16 | green << 8 | blue)) == got)
+                    return true;
+    return false;
+}
+
+// Where the bitmap first differs from the model, "" where it does not.
+std::string mismatch(TestBitmap &b, const Picture &want, const QByteArray &before, double tolerance)
+{
+    for (int y = 0; y < b.height; ++y)
+        for (int x = 0; x < b.width; ++x) {
+            const Want &w = want[size_t(y * b.width + x)];
+            const quint32 got = b.value(x, y);
+            if (w.approximate ? near(b, got, w.bgra, tolerance) : got == w.value)
+                continue;
+            return "pixel " + std::to_string(x) + "," + std::to_string(y) + " is " + std::to_string(got) + " not "
+                + (w.approximate ? "near B,G,R,A " + testing::PrintToString(w.bgra) : std::to_string(w.value));
+        }
+    const auto withoutPixels = [&b](const QByteArray &bytes) {
+        std::memcpy(b.bits, bytes.constData(), size_t(bytes.size()));
+        b.fill(0);
+        return b.bytes();
+    };
+    const QByteArray after = b.bytes();
+    return withoutPixels(before) == withoutPixels(after) ? "" : "bytes beside the pixels changed";
+}
+
+// One axis of a blit with positive extents; flip when the picture is mirrored on it.
+struct Axis
+{
+    Axis(int to, int toExtent, int from, int fromExtent)
+        : dst(toExtent < 0 ? qint64(to) + toExtent + 1 : to)
+        , dstExtent(std::abs(qint64(toExtent)))
+        , src(fromExtent < 0 ? qint64(from) + fromExtent + 1 : from)
+        , srcExtent(std::abs(qint64(fromExtent)))
+        , flip((toExtent < 0) != (fromExtent < 0))
+    { }
+    // The source pixel under the centre of target pixel t, in the source mirrored first;
+    // LLONG_MIN when t is not in the target rectangle.
+    qint64 sample(qint64 t) const
+    {
+        const qint64 i = t - dst, k = (2 * i + 1) * srcExtent / (2 * dstExtent);
+        return i < 0 || i >= dstExtent ? LLONG_MIN : flip ? src + srcExtent - 1 - k : src + k;
+    }
+    // Target pixel t's footprint on the source, first and last pixel, and how much of
+    // source pixel s it covers.
+    qint64 logical(qint64 t) const { return flip ? dstExtent - 1 - (t - dst) : t - dst; }
+    qint64 first(qint64 t) const { return src + logical(t) * srcExtent / dstExtent; }
+    qint64 last(qint64 t) const { return src + ((logical(t) + 1) * srcExtent - 1) / dstExtent; }
+    double cover(qint64 t, qint64 s) const
+    {
+        const qint64 l = logical(t), j = s - src;
+        return double(std::min((j + 1) * dstExtent, (l + 1) * srcExtent) - std::max(j * dstExtent, l * srcExtent));
+    }
+    qint64 dst, dstExtent, src, srcExtent;
+    bool flip;
+};
+
+struct Blit
+{
+    int x, y, w, h, sx, sy, sw, sh;
+};
+
+bool withinLimits(const Blit &a)
+{
+    for (int v : { a.x, a.y, a.w, a.h, a.sx, a.sy, a.sw, a.sh })
+        if (v < -(1 << 27) || v > 1 << 27)
+            return false;
+    return true;
+}
+
+// Each target pixel a blit draws, with the source pixel under its centre.
+template <typename Draw> void forEachSample(const TestBitmap &dst, const TestBitmap &src, const Blit &a, Draw draw)
+{
+    const Axis ax(a.x, a.w, a.sx, a.sw), ay(a.y, a.h, a.sy, a.sh);
+    for (int ty = 0; ty < dst.height; ++ty)
+        for (int tx = 0; tx < dst.width; ++tx) {
+            const qint64 sx = ax.sample(tx), sy = ay.sample(ty);
+            if (sx >= 0 && sx < src.width && sy >= 0 && sy < src.height)
+                draw(ax, ay, tx, ty, int(sx), int(sy));
+        }
+}
+
+// What StretchBlt leaves in dst; false when it must fail.
+bool modelStretch(
+    Picture &want, const TestBitmap &dst, const TestBitmap &src, const Blit &a, quint32 rop, bool halftone)
+{
+    if (!withinLimits(a) || a.w == 0 || a.h == 0)
+        return withinLimits(a);
+    if (a.sw == 0 || a.sh == 0)
+        return false;
+    const bool sameTable = dst.bpp == src.bpp && dst.bpp <= 8 && dst.table == src.table;
+    const bool area = halftone && (std::abs(a.w) != std::abs(a.sw) || std::abs(a.h) != std::abs(a.sh));
+    forEachSample(dst, src, a, [&](const Axis &ax, const Axis &ay, int tx, int ty, int sx, int sy) {
+        Want &w = want[size_t(ty * dst.width + tx)];
+        if (!area) {
+            const quint32 s = src.value(sx, sy), v = sameTable ? s : dst.valueOf(src.colorOf(s));
+            w.value = rop == SRCAND ? w.value & v : rop == SRCPAINT ? w.value | v : v;
+            return;
+        }
+        // The mean colour of the source under the target pixel, by area.
+        w = { 0, true, {} };
+        double total = 0;
+        for (qint64 y = std::max<qint64>(ay.first(ty), 0); y <= std::min<qint64>(ay.last(ty), src.height - 1); ++y)
+            for (qint64 x = std::max<qint64>(ax.first(tx), 0); x <= std::min<qint64>(ax.last(tx), src.width - 1); ++x) {
+                const double cover = ax.cover(tx, x) * ay.cover(ty, y);
+                const quint32 color = src.colorOf(src.value(int(x), int(y)));
+                total += cover;
+                for (size_t ch = 0; ch < 4; ++ch)
+                    w.bgra[ch] += cover * (color >> 8 * ch & 0xFF);
+            }
+        for (double &channel : w.bgra)
+            channel /= total;
+    });
+    return true;
+}
+
+// What AlphaBlend leaves in dst: src·k + dst·(1 − srcA·k), no channel above 255.
+bool modelBlend(Picture &want, const TestBitmap &dst, const TestBitmap &src, const Blit &a, BLENDFUNCTION f)
+{
+    if (!withinLimits(a) || a.w < 0 || a.h < 0 || a.sw < 0 || a.sh < 0 || a.sx < 0 || a.sy < 0
+        || qint64(a.sx) + a.sw > src.width || qint64(a.sy) + a.sh > src.height)
+        return false;
+    if (a.w == 0 || a.h == 0 || f.SourceConstantAlpha == 0)
+        return true;
+    if (a.sw == 0 || a.sh == 0)
+        return false;
+    const double k = f.SourceConstantAlpha / 255.0;
+    forEachSample(dst, src, a, [&](const Axis &, const Axis &, int tx, int ty, int sx, int sy) {
+        Want &w = want[size_t(ty * dst.width + tx)];
+        const quint32 s = src.colorOf(src.value(sx, sy)) | (f.AlphaFormat == AC_SRC_ALPHA ? 0 : 0xFF000000u);
+        const quint32 d = dst.colorOf(w.value);
+        w.approximate = true;
+        for (size_t ch = 0; ch < 4; ++ch)
+            w.bgra[ch] = std::min(255.0, (s >> 8 * ch & 0xFF) * k + (d >> 8 * ch & 0xFF) * (1 - (s >> 24) / 255.0 * k));
+    });
+    return true;
+}
+
+// Runs a call against its model, worked out first; "" when they agree.
+template <typename Model, typename Call> std::string check(TestBitmap &dst, Model model, Call call, double tolerance)
+{
+    Picture want = pictureOf(dst);
+    const bool ok = model(want);
+    const QByteArray before = dst.bytes();
+    if (call() != ok)
+        return ok ? "failed" : "did not fail";
+    return mismatch(dst, want, before, tolerance);
+}
+
+std::string describe(int n, const TestBitmap &dst, const TestBitmap &src, const Blit &a)
+{
+    std::ostringstream out;
+    out << "case " << n << ": " << dst.width << "x" << dst.height << "x" << dst.bpp << (dst.topDown ? "" : " bottom-up")
+        << " from " << (&src == &dst ? "itself, " : "") << src.width << "x" << src.height << "x" << src.bpp << ", ("
+        << a.x << "," << a.y << " " << a.w << "x" << a.h << ") from (" << a.sx << "," << a.sy << " " << a.sw << "x"
+        << a.sh << ")";
+    return out.str();
+}
+
+} // namespace
+
+TEST(Raster, blitsMatchThePixelModel)
+{
+    Rng rng(1);
+    for (int n = 0; n < 3000; ++n) {
+        const auto dst = randomBitmap(rng, 12);
+        const auto other = randomBitmap(rng, 12, dst.get());
+        const TestBitmap &src = n % 6 == 0 ? *dst : *other;
+        const bool bitBlt = n % 4 == 1, halftone = n % 3 == 0;
+        // Averaged colours are approximate, so they are only copied here.
+        const quint32 rop = halftone ? SRCCOPY : std::array { SRCCOPY, SRCAND, SRCPAINT }[size_t(pick(rng, 0, 2))];
+        Blit a;
+        std::tie(a.x, a.w) = span(rng, dst->width);
+        std::tie(a.y, a.h) = span(rng, dst->height);
+        std::tie(a.sx, a.sw) = span(rng, src.width);
+        std::tie(a.sy, a.sh) = span(rng, src.height);
+        if (bitBlt)
+            a.sw = a.w, a.sh = a.h;
+        SetStretchBltMode(dst->dc, halftone ? HALFTONE : pick(rng, BLACKONWHITE, COLORONCOLOR));
+        // Averages are within 1 of the mean; columns are weighed in 1/256, so that shrinking
+        // by more than four columns to one may add a level or two.
+        const double tolerance = std::abs(qint64(a.sw)) > 4 * std::abs(qint64(a.w)) ? 2.5 : 1;
+        ASSERT_EQ(check(
+                      *dst, [&](Picture &want) { return modelStretch(want, *dst, src, a, rop, halftone); },
+                      [&] {
+                          return bitBlt ? BitBlt(dst->dc, a.x, a.y, a.w, a.h, src.dc, a.sx, a.sy, rop)
+                                        : StretchBlt(dst->dc, a.x, a.y, a.w, a.h, src.dc, a.sx, a.sy, a.sw, a.sh, rop);
+                      },
+                      tolerance),
+            "")
+            << describe(n, *dst, src, a) << " rop " << (rop >> 16) << (halftone ? " halftone" : "");
+    }
+}
+
+TEST(Raster, alphaBlendingMatchesThePixelModel)
+{
+    Rng rng(2);
+    for (int n = 0; n < 1000; ++n) {
+        const auto dst = randomBitmap(rng, 40);
+        const auto other = randomBitmap(rng, 40, dst.get());
+        TestBitmap &src = n % 6 == 0 ? *dst : *other;
+        // Fully transparent pixels carry no colour; the others may be badly premultiplied.
+        if (src.bpp == 32)
+            for (int y = 0; y < src.height; ++y)
+                for (int x = 0; x < src.width; ++x)
+                    if (src.value(x, y) >> 24 == 0)
+                        src.setValue(x, y, 0);
+        const int sx = pick(rng, 0, src.width - 1), sy = pick(rng, 0, src.height - 1);
+        Blit a { 0, 0, 0, 0, sx, sy, pick(rng, 1, src.width - sx), pick(rng, 1, src.height - sy) };
+        std::tie(a.x, a.w) = span(rng, dst->width, 12);
+        std::tie(a.y, a.h) = span(rng, dst->height, 12);
+        if (n % 5 == 0)
+            a.w = a.sw, a.h = a.sh;
+        // Sources beyond the bitmap and empty ones are refused.
+        if (n % 10 == 1)
+            a.sw = src.width - sx + 1;
+        if (n % 10 == 3)
+            a.sy = -1;
+        if (n % 10 == 7)
+            a.sh = 0;
+        BLENDFUNCTION f;
+        f.SourceConstantAlpha = quint8(n % 3 == 0 ? 255 : pick(rng, 0, 255));
+        f.AlphaFormat = pick(rng, 0, 1) ? AC_SRC_ALPHA : 0;
+        SetStretchBltMode(
+            dst->dc, pick(rng, BLACKONWHITE, HALFTONE)); // blending takes the nearest pixel whatever it says
+        // Rounded once: within half a level.
+        ASSERT_EQ(
+            check(
+                *dst, [&](Picture &want) { return modelBlend(want, *dst, src, a, f); },
+                [&] { return AlphaBlend(dst->dc, a.x, a.y, a.w, a.h, src.dc, a.sx, a.sy, a.sw, a.sh, f); }, 0.501),
+            "")
+            << describe(n, *dst, src, a) << " alpha " << int(f.SourceConstantAlpha)
+            << (f.AlphaFormat ? " per pixel" : "");
+    }
+}
+
+TEST(Raster, largeBlitsSharedAmongThreadsMatchTheModelToo)
+{
+    TestBitmap src(300, 200, 32);
+    for (int y = 0; y < 200; ++y)
+        for (int x = 0; x < 300; ++x)
+            src.setValue(
+                x, y, 0xFF000000u | quint32(x & 0xFF) << 16 | quint32(y & 0xFF) << 8 | quint32((x + y) & 0xFF));
+    TestBitmap dst(900, 600, 32);
+    const Blit a { 0, 0, 900, 600, 0, 0, 300, 200 }, whole { 0, 0, 900, 600, 0, 0, 900, 600 };
+    for (int mode : { COLORONCOLOR, HALFTONE }) {
+        SetStretchBltMode(dst.dc, mode);
+        ASSERT_EQ(check(
+                      dst, [&](Picture &want) { return modelStretch(want, dst, src, a, SRCCOPY, mode == HALFTONE); },
+                      [&] { return StretchBlt(dst.dc, 0, 0, 900, 600, src.dc, 0, 0, 300, 200, SRCCOPY); }, 1.0),
+            "")
+            << mode;
+    }
+    TestBitmap blended(900, 600, 32);
+    BLENDFUNCTION half;
+    half.SourceConstantAlpha = 128;
+    ASSERT_EQ(check(
+                  blended, [&](Picture &want) { return modelBlend(want, blended, dst, whole, half); },
+                  [&] { return AlphaBlend(blended.dc, 0, 0, 900, 600, dst.dc, 0, 0, 900, 600, half); }, 0.501),
+        "");
+}
+
+TEST(Raster, fillsOutlinesAndLinesMatchThePixelModel)
+{
+    Rng rng(3);
+    for (int n = 0; n < 600; ++n) {
+        const auto b = randomBitmap(rng, 12);
+        std::array<int, 6> c;
+        for (size_t i = 0; i < c.size(); ++i)
+            c[i] = position(rng, i % 2 ? b->height : b->width);
+        if (n % 3 == 0 && pick(rng, 0, 3) != 0) // mostly the right way round
+            std::tie(c[0], c[1], c[2], c[3])
+                = std::tuple { std::min(c[0], c[2]), std::min(c[1], c[3]), std::max(c[0], c[2]), std::max(c[1], c[3]) };
+        // Whether a pen outlines a rectangle of one pixel is left open.
+        if (n % 3 == 1 && std::abs(qint64(c[0]) - c[2]) == 1 && std::abs(qint64(c[1]) - c[3]) == 1)
+            continue;
+        Picture want = pictureOf(*b);
+        const QByteArray before = b->bytes();
+        // Now and then the brush has the window's system colour, white.
+        const COLORREF ink = rng() & 0xFFFFFF, paint = n % 8 ? rng() & 0xFFFFFF : systemColor(COLOR_WINDOW);
+        const COLORREF painted = n % 8 ? paint : 0xFFFFFF;
+        const HPEN pen = pick(rng, 0, 3) ? CreatePen(PS_SOLID, 1, ink) : GetStockObject(NULL_PEN);
+        const HBRUSH brush = pick(rng, 0, 3) ? CreateSolidBrush(paint) : GetStockObject(NULL_BRUSH);
+        const bool xorPen = pick(rng, 0, 1);
+        SelectObject(b->dc, pen);
+        SelectObject(b->dc, brush);
+        SetROP2(b->dc, xorPen ? R2_XORPEN : R2_COPYPEN);
+        const auto mark = [&](qint64 x, qint64 y, COLORREF color, bool xorMode) {
+            if (x < 0 || y < 0 || x >= b->width || y >= b->height)
+                return;
+            const quint32 v = b->valueOf(0xFF000000u | (color & 0xFF) << 16 | (color & 0xFF00) | color >> 16);
+            Want &w = want[size_t(y * b->width + x)];
+            w.value = xorMode ? w.value ^ (b->bpp == 32 ? v & 0xFFFFFF : v) : v; // XOR keeps the alpha
+        };
+        const auto area = [&](qint64 left, qint64 top, qint64 right, qint64 bottom, auto draw) {
+            for (qint64 y = std::max<qint64>(top, 0); y < std::min<qint64>(bottom, b->height); ++y)
+                for (qint64 x = std::max<qint64>(left, 0); x < std::min<qint64>(right, b->width); ++x)
+                    draw(x, y);
+        };
+        const auto penOk = [](std::initializer_list<int> values) {
+            return std::all_of(values.begin(), values.end(), [](int v) { return std::abs(qint64(v)) <= 1 << 20; });
+        };
+        std::string trace = "case " + std::to_string(n) + ", " + std::to_string(b->bpp) + " bits:";
+        for (int v : c)
+            trace += " " + std::to_string(v);
+        if (n % 3 == 0) {
+            if (brush != GetStockObject(NULL_BRUSH))
+                area(c[0], c[1], c[2], c[3], [&](qint64 x, qint64 y) { mark(x, y, painted, false); });
+            ASSERT_NE(FillRect(b->dc, RECT { c[0], c[1], c[2], c[3] }, brush), 0) << trace;
+        } else if (n % 3 == 1) {
+            // Corners in any order; the outline has the pen, the inside within it the brush.
+            const bool ok = penOk({ c[0], c[1], c[2], c[3] });
+            const qint64 l = std::min(c[0], c[2]), r = std::max(c[0], c[2]), t = std::min(c[1], c[3]),
+                         bottom = std::max(c[1], c[3]), inset = pen != GetStockObject(NULL_PEN);
+            if (ok && brush != GetStockObject(NULL_BRUSH))
+                area(l + inset, t + inset, r - inset, bottom - inset,
+                    [&](qint64 x, qint64 y) { mark(x, y, painted, false); });
+            if (ok && inset)
+                area(l, t, r, bottom, [&](qint64 x, qint64 y) {
+                    if (x == l || x == r - 1 || y == t || y == bottom - 1)
+                        mark(x, y, ink, xorPen);
+                });
+            ASSERT_EQ(Rectangle(b->dc, c[0], c[1], c[2], c[3]), ok) << trace;
+        } else {
+            // Two joined lines, each without its end point: one pixel a step along the longer
+            // axis, across it the pixel nearest the true line (a tie away from the start).
+            MoveToEx(b->dc, c[0], c[1]);
+            for (int end : { 2, 4 }) {
+                const bool ok = penOk({ c[size_t(end)], c[size_t(end) + 1], c[0], c[1] });
+                const qint64 dx = qint64(c[size_t(end)]) - c[0], dy = qint64(c[size_t(end) + 1]) - c[1];
+                const qint64 steps = std::max(std::abs(dx), std::abs(dy));
+                for (qint64 t = 0; ok && pen != GetStockObject(NULL_PEN) && t < steps; ++t) {
+                    const auto across
+                        = [&](qint64 d) { return (2 * t * std::abs(d) + steps) / (2 * steps) * (d < 0 ? -1 : 1); };
+                    mark(c[0] + across(dx), c[1] + across(dy), ink, xorPen);
+                }
+                ASSERT_EQ(LineTo(b->dc, c[size_t(end)], c[size_t(end) + 1]), ok) << trace;
+                if (ok)
+                    c[0] = c[size_t(end)], c[1] = c[size_t(end) + 1];
+            }
+        }
+        const int x = pick(rng, 0, b->width - 1), y = pick(rng, 0, b->height - 1);
+        const quint32 shown = b->colorOf(b->value(x, y));
+        EXPECT_EQ(GetPixel(b->dc, x, y), (shown & 0xFF) << 16 | (shown & 0xFF00) | (shown >> 16 & 0xFF)) << trace;
+        ASSERT_EQ(mismatch(*b, want, before, 0), "") << trace;
+        SelectObject(b->dc, GetStockObject(BLACK_PEN));
+        SelectObject(b->dc, GetStockObject(WHITE_BRUSH));
+        DeleteObject(pen);
+        DeleteObject(brush);
+    }
+}
