@@ -157,11 +157,9 @@ TEST_F(SubjectSelector, onlyPossibleKindsTakeRoomFromTheLeft)
     EXPECT_EQ(selector->height(), (450 + 60) / 15) << "the height follows button A";
 
     // Pictures go by the kind's letter, also of a lower-case identifier.
-    EXPECT_NE(selector->ImageFile("A"), selector->ImageFile("B"));
     QImage image(8, 8, QImage::Format_ARGB32);
     image.fill(Qt::red);
     selector->setImageFile("d2", Picture(image));
-    EXPECT_EQ(button('D')->Picture(), selector->ImageFile("D"));
     EXPECT_EQ(button('D')->Picture().image(), image);
 }
 
@@ -252,7 +250,7 @@ TEST_F(SubjectSelector, oneSubjectOfAKindIsChosenWithoutAList)
     EXPECT_EQ(events, QStringList({ "Clicked", "Changed" }));
 }
 
-TEST_F(SubjectSelector, theHostMayDeleteItInClickedOrWhileItsListIsOpen)
+TEST_F(SubjectSelector, theHostMayDeleteItWhileItsListIsOpen)
 {
     auto declaration
         = declarationWith({ { "D1", "234567813", "ANA RITA LOPES" }, { "D2", "246813571", "TIAGO LOPES" } });
@@ -263,11 +261,6 @@ TEST_F(SubjectSelector, theHostMayDeleteItInClickedOrWhileItsListIsOpen)
     });
     click(u"D");
     subject::setListMenuPresenter(previous);
-    EXPECT_TRUE(alive.isNull());
-
-    makeSelector();
-    QObject::connect(selector, &cSujeitoSelector::Clicked, [&] { delete alive.data(); });
-    click(u"B");
     EXPECT_TRUE(alive.isNull());
 }
 
