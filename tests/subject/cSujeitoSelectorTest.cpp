@@ -234,22 +234,6 @@ TEST_F(SubjectSelector, clicksRaiseClickedThenChangedAndASecondClickMayEmpty)
     }
 }
 
-TEST_F(SubjectSelector, oneSubjectOfAKindIsChosenWithoutAList)
-{
-    ListMenuDriver menu(0);
-    click(u"D");
-    EXPECT_EQ(selector->SelectedSujeito(), "D1") << "without a declaration";
-
-    auto declaration = declarationWith({ { "D1", "234567813", "MARTA SOFIA FERREIRA LOPES" } });
-    selector->setIRSClass(declaration.get());
-    selector->setSujeitoValueType("A");
-    events.clear();
-    click(u"D");
-    EXPECT_EQ(menu.shown, 0);
-    EXPECT_EQ(selector->SelectedSujeito(), "D1");
-    EXPECT_EQ(events, QStringList({ "Clicked", "Changed" }));
-}
-
 TEST_F(SubjectSelector, theHostMayDeleteItWhileItsListIsOpen)
 {
     auto declaration
@@ -318,8 +302,12 @@ TEST_F(SubjectSelector, listsOfDependantsAscendantsAndEstates)
     EXPECT_EQ(selector->SelectedSujeito(), "D1");
 }
 
+// One subject of a kind is chosen without a list.
 TEST_F(SubjectSelector, namesAndNumbersComeFromTheDeclaration)
 {
+    ListMenuDriver menu(0);
+    click(u"D");
+    EXPECT_EQ(selector->SelectedSujeito(), "D1") << "without a declaration";
     selector->setSelectedSujeito("A");
     EXPECT_EQ(selector->SelectedNIF(), "");
     EXPECT_EQ(button('A')->Caption(), "Sujeito A");
@@ -328,11 +316,15 @@ TEST_F(SubjectSelector, namesAndNumbersComeFromTheDeclaration)
     selector->setIRSClass(&notADeclaration);
     EXPECT_EQ(selector->IRSClass(), nullptr);
 
-    auto declaration = declarationWith();
+    auto declaration = declarationWith({ { "D1", "234567813", "MARTA SOFIA FERREIRA LOPES" } });
     selector->setIRSClass(declaration.get());
     EXPECT_EQ(button('A')->Caption(), "Ana M. Lopes");
     EXPECT_EQ(selector->SelectedNIF(), "210345675");
     EXPECT_EQ(selector->SelectedNIF("B"), "198765436");
+    click(u"D");
+    EXPECT_EQ(menu.shown, 0);
+    EXPECT_EQ(selector->SelectedNIF(), "234567813");
+    selector->setSelectedSujeito("A");
 
     declaration.reset();
     EXPECT_EQ(selector->IRSClass(), nullptr) << "a borrowed declaration that went away";
