@@ -45,6 +45,7 @@ void relist(frmSelectCountry &form, GSEL_CountryFilterList mode, const QString &
 TEST(CountryList, eachModeListsItsCountriesWithPortugalFirstAndOnce)
 {
     frmSelectCountry form;
+    EXPECT_EQ(form.objectName(), "frmSelectCountry") << "the name a host finds the form by";
     form.RelistCountries();
     const QStringList every = rows(form);
     ASSERT_EQ(every.size(), 249);
