@@ -234,7 +234,7 @@ TEST_F(SubjectSelector, clicksRaiseClickedThenChangedAndASecondClickMayEmpty)
     }
 }
 
-TEST_F(SubjectSelector, theHostMayDeleteItWhileItsListIsOpen)
+TEST_F(SubjectSelector, theHostMayDeleteItInClickedOrWhileItsListIsOpen)
 {
     auto declaration
         = declarationWith({ { "D1", "234567813", "ANA RITA LOPES" }, { "D2", "246813571", "TIAGO LOPES" } });
@@ -245,6 +245,11 @@ TEST_F(SubjectSelector, theHostMayDeleteItWhileItsListIsOpen)
     });
     click(u"D");
     subject::setListMenuPresenter(previous);
+    EXPECT_TRUE(alive.isNull());
+
+    makeSelector();
+    QObject::connect(selector, &cSujeitoSelector::Clicked, [&] { delete alive.data(); });
+    click(u"B");
     EXPECT_TRUE(alive.isNull());
 }
 
