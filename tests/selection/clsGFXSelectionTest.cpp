@@ -363,8 +363,14 @@ TEST_F(SelectCountryTest, everyCountryIsInReachAndFoundByTyping)
         // Typing on an item searches the names, whatever their accents and case.
         auto *box = dialog.findChild<QLineEdit *>(QStringLiteral("txtFilter"));
         ASSERT_TRUE(box && box->isVisible());
-        QTest::keyClicks(shownItems(dialog).first(), QStringLiteral("FEDERACAO"));
-        EXPECT_EQ(box->text(), QStringLiteral("FEDERACAO"));
+        QTest::keyClicks(shownItems(dialog).first(), QStringLiteral("ilha"));
+        EXPECT_EQ(box->text(), QStringLiteral("ilha"));
+        EXPECT_GT(shownItems(dialog).size(), 5);
+        QTest::keyClick(box, Qt::Key_Down);
+        EXPECT_EQ(dialog.focusWidget(), shownItems(dialog).first()) << "Down goes from the box to the items";
+        box->clear();
+        EXPECT_GT(shownItems(dialog).size(), 240);
+        QTest::keyClicks(box, QStringLiteral("FEDERACAO"));
         ASSERT_EQ(shownItems(dialog).size(), 1);
         EXPECT_EQ(shownItems(dialog).first()->Caption(), QStringLiteral("Federação Russa"));
         // Enter takes the only one left.
@@ -372,16 +378,7 @@ TEST_F(SelectCountryTest, everyCountryIsInReachAndFoundByTyping)
     });
     EXPECT_EQ(code, "RU");
     EXPECT_EQ(filter, "*");
-
-    const QString none = selectCountry(GSEL_All, filter, [](QDialog &dialog) {
-        auto *box = dialog.findChild<QLineEdit *>(QStringLiteral("txtFilter"));
-        QTest::keyClicks(box, QStringLiteral("ilha"));
-        EXPECT_GT(shownItems(dialog).size(), 5);
-        QTest::keyClick(box, Qt::Key_Down);
-        EXPECT_EQ(dialog.focusWidget(), shownItems(dialog).first()) << "Down goes from the box to the items";
-        box->clear();
-        EXPECT_GT(shownItems(dialog).size(), 240);
-        QTest::keyClick(box, Qt::Key_Escape);
-    });
-    EXPECT_EQ(none, "");
+    const auto escapeInTheBox
+        = [](QDialog &dialog) { QTest::keyClick(dialog.findChild<QLineEdit *>("txtFilter"), Qt::Key_Escape); };
+    EXPECT_EQ(selectCountry(GSEL_All, filter, escapeInTheBox), "");
 }
