@@ -18,7 +18,8 @@ using namespace zelctl;
 
 namespace {
 
-// One control of every class this build serves, placed on the form one under another.
+// One control of every class this build serves, placed on the form one under another,
+// every other one hidden.
 QList<UserControl *> everyControl(QWidget *form)
 {
     QList<UserControl *> controls;
@@ -36,6 +37,7 @@ QList<UserControl *> everyControl(QWidget *form)
         control->extender().setTag(info.name);
         control->extender().setTop(top);
         control->extender().setLeft(150);
+        control->extender().setVisible(controls.size() % 2 == 0);
         top += control->extender().Height() + 150;
         controls.append(control);
     }
@@ -74,11 +76,6 @@ TEST(FormFile, everyControlClassComesBackWithTheSamePropertiesUnknownOnesAreSkip
             EXPECT_EQ(reloaded.ReadProperty(property), original.ReadProperty(property))
                 << name.toStdString() << '.' << property.toStdString();
         }
-        // And from then on the form is stable.
-        QWidget again;
-        const QList<UserControl *> second = FormFile::create(FormFile::write({ loaded[i] }), &again);
-        ASSERT_EQ(second.size(), 1);
-        EXPECT_EQ(second.first()->Save(), reloaded) << name.toStdString();
     }
 }
 

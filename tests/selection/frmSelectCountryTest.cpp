@@ -3,7 +3,6 @@
 #include "companion/CommandButton.h"
 #include "support/TestSupport.h"
 
-#include <QFile>
 #include <QTemporaryDir>
 #include <QTest>
 #include <QTreeWidget>
@@ -46,6 +45,7 @@ void relist(frmSelectCountry &form, GSEL_CountryFilterList mode, const QString &
 TEST(CountryList, eachModeListsItsCountriesWithPortugalFirstAndOnce)
 {
     frmSelectCountry form;
+    EXPECT_EQ(form.objectName(), "frmSelectCountry") << "the name a host finds the form by";
     form.RelistCountries();
     const QStringList every = rows(form);
     ASSERT_EQ(every.size(), 249);
@@ -81,17 +81,15 @@ TEST(CountryList, aMissingFileIsReportedAndLeavesPortugalAlone)
 TEST(CountryList, numbersAreWrittenWithAtLeastThreeDigits)
 {
     QTemporaryDir dir;
-    QFile file(dir.filePath(QStringLiteral("iso3166.txt")));
-    ASSERT_TRUE(file.open(QIODevice::WriteOnly));
-    file.write("8\tAL\tALB\tAlb\xe2nia\r\n" // one digit, name in Windows-1252
-               "1234\tZZ\tZZZ\tLonga\r\n" // more than three digits stay
-               "0\tXA\tXAA\tSem n\xfamero\r\n" // 0 means none
-               " 42abc\tXC\tXCC\tSujo\n" // a bare LF ends a line too
-               "77\tXD\r\n" // no name: no country
-               "620\tPT\tPRT\tPortugal\r\n");
-    file.close();
+    const QString file = test::writeFile(dir.filePath(QStringLiteral("iso3166.txt")),
+        "8\tAL\tALB\tAlb\xe2nia\r\n" // one digit, name in Windows-1252
+        "1234\tZZ\tZZZ\tLonga\r\n" // more than three digits stay
+        "0\tXA\tXAA\tSem n\xfamero\r\n" // 0 means none
+        " 42abc\tXC\tXCC\tSujo\n" // a bare LF ends a line too
+        "77\tXD\r\n" // no name: no country
+        "620\tPT\tPRT\tPortugal\r\n");
     frmSelectCountry form;
-    form.setCountryFile(file.fileName());
+    form.setCountryFile(file);
     form.RelistCountries();
     EXPECT_EQ(rows(form),
         (QStringList { "PT Portugal 620", QStringLiteral("AL Albânia 008"), "ZZ Longa 1234",

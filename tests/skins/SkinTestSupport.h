@@ -92,6 +92,19 @@ protected:
             afterwards();
         }
     }
+    // Pressed on `control`, then moved out and released there: the control keeps the pointer
+    // for the release, which does not click. `events` are cleared once the pointer is away.
+    void pressAndReleaseOutside(QWidget *control, QPoint at, QStringList &events)
+    {
+        moveAway();
+        events.clear();
+        QTest::mouseMove(control, at);
+        QTest::mousePress(control, Qt::LeftButton, {}, at);
+        QTest::mouseMove(control, at + QPoint(180, 130));
+        EXPECT_EQ(platform::capturedWidget(), control);
+        QTest::mouseRelease(control, Qt::LeftButton, {}, at + QPoint(180, 130));
+        EXPECT_EQ(platform::capturedWidget(), nullptr);
+    }
     void TearDown() override { platform::releaseCapture(); }
 };
 
