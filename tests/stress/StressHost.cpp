@@ -538,7 +538,9 @@ bool HostForm::neighbourWorks()
 void HostForm::use(bool asHost)
 {
     QWindow *window = form->windowHandle();
-    const QPoint centre(120, 70);
+    // Into the object itself: some controls keep a height of their own.
+    const auto *widget = qobject_cast<QWidget *>(object.data());
+    const QPoint centre = widget ? widget->geometry().center() : QPoint(120, 70);
     Random random(1);
     Values values(random);
     values.objects.push_back(form.data());
