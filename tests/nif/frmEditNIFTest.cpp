@@ -22,13 +22,12 @@ enum Button { Apply = 0, Ok = 1, Cancel = 2, PublicInformation = 3 };
 
 // The record form over a control with no declaration: the record the user confirmed before
 // is the control's own, which is where values typed into the form were once lost.
-class RecordForm : public ::testing::Test
+class RecordForm : public NifFixture
 {
 protected:
     void SetUp() override
     {
-        control = new cNIF(&host);
-        control->InitNew();
+        NifFixture::SetUp();
         control->setValue("PT" + PlainNif);
         grabber = grabbers.last;
         grabber->answer("PT" + PlainNif, {});
@@ -37,14 +36,12 @@ protected:
                 { "email", "maria@example.invalid" }, { "datanascimento", "1980-05-07" }, { "status", "Activo" } })
             control->setInformation(id, value);
         control->setNome("MARIA");
-        host.show();
         editor = open();
-        log = std::make_unique<EventLog>(*control);
     }
 
     std::unique_ptr<frmEditNIF> open()
     {
-        auto form = std::make_unique<frmEditNIF>(&host);
+        auto form = std::make_unique<frmEditNIF>(&this->form);
         form->SetNIFControl(control);
         form->show();
         QApplication::setActiveWindow(form.get());
@@ -84,19 +81,15 @@ protected:
         QTest::keyClicks(box, text);
     }
 
-    ScriptedGrabberFactory grabbers;
+    // The control's own fetcher: the form's controls make fetchers of their own.
     ScriptedGrabber *grabber = nullptr;
-    QWidget host;
-    cNIF *control = nullptr;
     std::unique_ptr<frmEditNIF> editor;
-    std::unique_ptr<EventLog> log;
 };
 
 } // namespace
 
 TEST_F(RecordForm, loadsTheRecordIntoItsRows)
 {
-    EXPECT_EQ(editor->windowTitle(), "Editar informação de contribuinte");
     auto *shown = editor->findChild<cNIF *>("cNIF1");
     EXPECT_EQ(shown->Value(), "PT" + PlainNif);
     EXPECT_TRUE(shown->Locked());

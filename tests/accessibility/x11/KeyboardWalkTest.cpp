@@ -46,13 +46,6 @@ protected:
         QTest::keyClick(focus(), key, modifiers);
     }
 
-    // Each character to wherever the focus is by then.
-    static void type(const char *text)
-    {
-        for (const char *c = text; *c; ++c)
-            QTest::keyClick(focus(), *c);
-    }
-
     // Presses Tab until the focus is on a widget that `wanted` takes; nullptr when a whole
     // round of the form finds none.
     QWidget *tabTo(const std::function<bool(QWidget *)> &wanted)
@@ -119,7 +112,7 @@ TEST_F(KeyboardWalk, nifEntryAndItsCountryList)
     backOnTheForm();
     EXPECT_EQ(nif->CountryID(), listed);
     key(Qt::Key_A, Qt::ControlModifier);
-    type("PT123456789");
+    QTest::keyClicks(focus(), "PT123456789");
     EXPECT_EQ(nif->Value(), "PT123456789");
 }
 
