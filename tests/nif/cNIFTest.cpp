@@ -72,7 +72,6 @@ TEST_F(NifControl, typingSwitchesTheCountryAndCutsPortugueseNumbers)
 
 TEST_F(NifControl, coloursAndMarksFollowTheState)
 {
-    EXPECT_EQ(textColour(*control), 0u);
     type(PlainNif.left(8));
     EXPECT_EQ(textColour(*control), White);
     EXPECT_EQ(backColour(*control), Red);
