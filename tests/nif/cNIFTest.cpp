@@ -350,8 +350,6 @@ TEST(NifPersistence, savesAndLoadsItsPropertiesAndOldOnes)
     cNIF loaded;
     loaded.Load(saved.Save());
     EXPECT_EQ(loaded.Save(), saved.Save());
-    EXPECT_EQ(loaded.CountryID(), "ES");
-    EXPECT_TRUE(loaded.DisablePopupMenu());
 
     PropertyBag legacy;
     legacy.WriteProperty("Country", "ES");
