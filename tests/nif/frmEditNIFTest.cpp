@@ -39,11 +39,12 @@ protected:
         editor = open();
     }
 
+    // Shown before it is given the control, as a host may: the rows come up in a shown form.
     std::unique_ptr<frmEditNIF> open()
     {
         auto form = std::make_unique<frmEditNIF>(&this->form);
-        form->SetNIFControl(control);
         form->show();
+        form->SetNIFControl(control);
         QApplication::setActiveWindow(form.get());
         EXPECT_TRUE(QTest::qWaitForWindowActive(form.get()));
         return form;
