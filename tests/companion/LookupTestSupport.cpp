@@ -31,10 +31,7 @@ void LookupFixture::saveSetting(const char *key, const QString &value)
 
 companion::LookupSettings LookupFixture::settings() const
 {
-    companion::LookupSettings settings;
-    settings.remoteAllowed = true;
-    settings.serviceAddress = service.baseAddress();
-    settings.timeout = std::chrono::milliseconds(qRound(TimeoutSeconds.toDouble() * 1000));
+    companion::LookupSettings settings = companion::LookupSettings::fromUserSettings();
     settings.cacheFile = folder.filePath("nifcache.sqlite");
     settings.directoryFile = sourcePath("data/contribuintes.json");
     return settings;

@@ -31,7 +31,7 @@ protected:
     void TearDown() override;
     void saveSetting(const char *key, const QString &value);
 
-    // Settings for a fetcher the test makes: the fake service and a cache file of its own.
+    // The user's settings for a fetcher the test makes, with a cache file of its own.
     companion::LookupSettings settings() const;
     FakeVatService service;
     QTemporaryDir folder;

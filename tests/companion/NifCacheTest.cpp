@@ -37,25 +37,20 @@ TEST_F(NifCacheLookup, aStoredAnswerIsGivenWhileFreshAndStandsInWhenTheNetworkFa
         const char *when;
         int age;
         Reply reply;
-        bool remote, refresh;
+        bool remote;
         QString name, status;
         int asked;
     } cases[] = {
-        { "fresh", 29, newHolder, true, false, "NOME ANTIGO", "Válido", 0 },
-        { "fresh, refreshed", 29, newHolder, true, true, "NOME NOVO", "Válido", 1 },
-        { "stale, the network up", 31, newHolder, true, false, "NOME NOVO", "Válido", 1 },
-        { "stale, the member state down", 31, FakeVatService::userError("MS_UNAVAILABLE"), true, false, "NOME ANTIGO",
+        { "fresh", 29, newHolder, true, "NOME ANTIGO", "Válido", 0 },
+        { "stale, the network up", 31, newHolder, true, "NOME NOVO", "Válido", 1 },
+        { "stale, the member state down", 31, FakeVatService::userError("MS_UNAVAILABLE"), true, "NOME ANTIGO",
             stale + "Serviço do Estado-membro indisponível (MS_UNAVAILABLE)", 1 },
-        { "stale, no answer", 31, { 200, {}, FakeVatService::Manner::Silent }, true, false, "NOME ANTIGO",
-            stale + TimedOut, 1 },
-        { "stale, remote lookups off", 31, newHolder, false, false, "NOME ANTIGO",
-            stale + "consultas remotas desligadas", 0 },
+        { "stale, remote lookups off", 31, newHolder, false, "NOME ANTIGO", stale + "consultas remotas desligadas", 0 },
     };
     for (const auto &c : cases) {
         SCOPED_TRACE(c.when);
         LookupSettings lookup = settings();
         lookup.remoteAllowed = c.remote;
-        lookup.refresh = c.refresh;
         const std::shared_ptr<NifCache> cache = NifCache::open(lookup.cacheFile);
         ASSERT_TRUE(cache->store(UnknownHolder, { true, OldRecord, QDateTime::currentDateTimeUtc().addDays(-c.age) }));
         service.answerWith(c.reply);

@@ -1,12 +1,10 @@
 #include "NifTestSupport.h"
 
 #include "nif/PopupMenuPresenter.h"
-#include "support/TestSupport.h"
 
 #include <QAction>
 #include <QClipboard>
 #include <QContextMenuEvent>
-#include <QDialog>
 #include <QMenu>
 #include <QMimeData>
 #include <QTimer>
@@ -228,16 +226,10 @@ TEST_F(NifMenu, aBoxTheUserMayNotChangeKeepsItsText)
     EXPECT_EQ(backColour(*control), 0xFFFFFFu);
 }
 
-TEST_F(NifMenu, refreshAndRecordEntriesServeTheHolder)
+TEST_F(NifMenu, refreshFetchesTheHolderAgain)
 {
     control->setValue("PT" + AnaNif);
     grabbers.last->answer("PT" + AnaNif, {});
     choose("mnu_RefreshNIFInfo");
     EXPECT_EQ(grabbers.last->fetched, QStringList({ "PT" + AnaNif, "PT" + AnaNif }));
-    ModalDriver recordForm([](QDialog &dialog) {
-        EXPECT_EQ(dialog.findChild<cNIF *>("cNIF1")->Value(), "PT" + AnaNif);
-        return int(QDialog::Rejected);
-    });
-    choose("mnu_ficha");
-    EXPECT_EQ(recordForm.shownCount(), 1);
 }

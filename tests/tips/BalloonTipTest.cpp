@@ -82,12 +82,12 @@ TEST_F(AttachedTip, createSendsTheWholeTipAndChangesAreSentOnlyWhenTheyShow)
         { "Create", [&] { tip.Create(); }, "add Nome\r\nMorada|title 1 |delay 2 10000|delay 3 500" },
         { "the same text", [&] { tip.setTipText("Nome\r\nMorada"); }, "" },
         { "a new text", [&] { tip.setTipText("um\r\ndois\rtres"); }, "text um\r\ndois\rtres" },
-        { "a timeout waits for Create", [&] { tip.SetTimeout(250, 5000); }, "" },
+        { "a timeout waits for Create", [&] { tip.SetTimeout(0, 5000); }, "" },
         { "a title without an icon", [&] { tip.setIcon(Icon::TTNoIcon), tip.setTitle("Aviso"); }, "" },
         { "an icon to the title", [&] { tip.setIcon(Icon::TTIconWarning); }, "title 2 Aviso" },
         { "Create, a title alone", [&] { tip.setIcon(Icon::TTNoIcon), tip.Create(); },
-            "add um\r\ndois\rtres|title 0 Aviso|delay 2 5000|delay 3 250" },
-        { "Create, neither", [&] { tip.setTitle(""), tip.Create(); }, "add um\r\ndois\rtres|delay 2 5000|delay 3 250" },
+            "add um\r\ndois\rtres|title 0 Aviso|delay 2 5000|delay 3 0" },
+        { "Create, neither", [&] { tip.setTitle(""), tip.Create(); }, "add um\r\ndois\rtres|delay 2 5000|delay 3 0" },
         { "an icon to no title", [&] { tip.setIcon(Icon::TTIconError); }, "" },
         { "colour 0 is sent later", [&] { tip.setForeColor(0), tip.setBackColor(0); }, "fore 0|back 0" },
         { "ShowNow", [&] { parent.show(), tip.ShowNow(); }, "activate -1" },
@@ -96,7 +96,7 @@ TEST_F(AttachedTip, createSendsTheWholeTipAndChangesAreSentOnlyWhenTheyShow)
         EXPECT_EQ(sends(step.act), step.sent) << step.step;
     EXPECT_EQ(window()->text(), "um\ndois\ntres");
     EXPECT_TRUE(window()->isVisible());
-    EXPECT_EQ(QList<int>({ window()->initialDelay(), window()->autoPopDelay() }), QList<int>({ 250, 5000 }));
+    EXPECT_EQ(QList<int>({ window()->initialDelay(), window()->autoPopDelay() }), QList<int>({ 0, 5000 }));
     // 0 brings back the tips' own colours.
     EXPECT_EQ(window()->foreground(), platform::toQColor(platform::systemColor(platform::COLOR_INFOTEXT)));
     EXPECT_EQ(window()->background(), platform::toQColor(platform::systemColor(platform::COLOR_INFOBK)));

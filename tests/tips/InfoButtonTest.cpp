@@ -138,7 +138,6 @@ TEST(InfoButtonPersistence, aSavedButtonLoadsAsItWasUnderItsNamesAndAnOldTipText
     InfoButton loaded;
     loaded.Load(bag);
     EXPECT_EQ(loaded.Save(), bag);
-    EXPECT_FALSE(loaded.Enabled());
 
     PropertyBag old;
     old.WriteProperty("ToolTipText", "texto antigo");

@@ -7,7 +7,6 @@
 #include "companion/CommandButton.h"
 #include "nif/cNIF.h"
 #include "selection/frmSelector.h"
-#include "skins/cSlider.h"
 #include "skins/skGoButton.h"
 #include "subject/cSujeitoSelector.h"
 #include "support/TestSupport.h"
@@ -44,13 +43,6 @@ protected:
     static void key(Qt::Key key, Qt::KeyboardModifiers modifiers = Qt::NoModifier)
     {
         QTest::keyClick(focus(), key, modifiers);
-    }
-
-    // Each character to wherever the focus is by then.
-    static void type(const char *text)
-    {
-        for (const char *c = text; *c; ++c)
-            QTest::keyClick(focus(), *c);
     }
 
     // Presses Tab until the focus is on a widget that `wanted` takes; nullptr when a whole
@@ -119,7 +111,7 @@ TEST_F(KeyboardWalk, nifEntryAndItsCountryList)
     backOnTheForm();
     EXPECT_EQ(nif->CountryID(), listed);
     key(Qt::Key_A, Qt::ControlModifier);
-    type("PT123456789");
+    QTest::keyClicks(focus(), "PT123456789");
     EXPECT_EQ(nif->Value(), "PT123456789");
 }
 
@@ -180,19 +172,12 @@ TEST_F(KeyboardWalk, selectionDialogAnsweredWithArrowsSpaceAndEnter)
     EXPECT_TRUE(find<QLabel>([](auto *l) { return l->text() == "Escolhido: GB"; }));
 }
 
-TEST_F(KeyboardWalk, theFocusIsMarkedOnTheSkinsAndOpensTheClosedSlider)
+TEST_F(KeyboardWalk, theFocusIsMarkedOnTheSkins)
 {
     auto *go = find<skGoButton>();
     const QImage unfocused = go->grab().toImage();
     ASSERT_TRUE(tabInto(go));
     EXPECT_NE(go->grab().toImage(), unfocused);
-    auto *slider = find<cSlider>();
-    ASSERT_TRUE(tabInto(slider->button()));
-    key(Qt::Key_Space);
-    ASSERT_FALSE(slider->SlideOpen());
-    key(Qt::Key_Tab);
-    EXPECT_TRUE(slider->isAncestorOf(focus()));
-    EXPECT_TRUE(slider->SlideOpen()) << "the focus going into the closed slider opens it";
 }
 
 } // namespace
