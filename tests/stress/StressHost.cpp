@@ -546,6 +546,7 @@ void HostForm::use(bool asHost)
     values.objects.push_back(form.data());
     std::vector<std::function<void()>> steps = {
         [=] { QTest::mouseMove(window, centre); },
+        [=] { QTest::mouseMove(window, centre + QPoint(3, 2)); },
         [=] { QTest::mouseClick(window, Qt::LeftButton, {}, centre); },
         [=] { QTest::mouseDClick(window, Qt::LeftButton, {}, centre); },
         [=] { QTest::mouseClick(window, Qt::RightButton, {}, centre); },
