@@ -4,7 +4,6 @@
 #include "png/StdPNG.h"
 #include "support/TestSupport.h"
 
-#include <QDir>
 #include <QTemporaryDir>
 
 #include <gtest/gtest.h>
@@ -240,21 +239,5 @@ TEST(PngReader, loadsFromDiskButNothingThatIsNotABoundedFile)
     for (const auto &[path, reason] : cases) {
         EXPECT_FALSE(image.LoadFile(path));
         EXPECT_EQ(image.FailureReason(), reason);
-    }
-}
-
-TEST(PngReader, replaysEveryFileTheFuzzerFound)
-{
-    const QDir crashers(testDataPath("crashers"));
-    const QStringList names = crashers.entryList(QDir::Files);
-    ASSERT_FALSE(names.isEmpty());
-    for (const QString &name : names) {
-        QFile file(crashers.filePath(name));
-        ASSERT_TRUE(file.open(QIODevice::ReadOnly));
-        StdPNG image;
-        image.LoadData(file.readAll());
-        image.Comments();
-        image.Palette();
-        image.LastModified();
     }
 }
