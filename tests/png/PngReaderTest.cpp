@@ -106,6 +106,9 @@ TEST(PngReader, namesEachFailureAndKeepsNothingOfIt)
         { badKey, "8 bits" },
         { badKey, "8 bits", false },
         { smallFile(chunk("tRNS", QByteArray(1, '\0'))), "8 bits" },
+        { signature() + ihdr(1, 1, 8, 2) + chunk("tRNS", QByteArray::fromHex("0001"))
+                + chunk("IDAT", deflate(QByteArray(4, '\0'))) + iend,
+            "24 bits" },
         { rgba, "32 bits" },
     };
     for (const auto &c : cases) {
