@@ -124,15 +124,9 @@ inline QStringList decodeWithGiflib(const QByteArray &gif)
             const QByteArray colours(reinterpret_cast<const char *>(map->Colors), map->ColorCount * 3);
             const QByteArray indices(
                 reinterpret_cast<const char *>(file->SavedImages[i].RasterBits), d.Width * d.Height);
-            frames << QStringLiteral("%1,%2 %3x%4 disposal %5 delay %6 transparent %7 colours %8 indices %9")
-                          .arg(d.Left)
-                          .arg(d.Top)
-                          .arg(d.Width)
-                          .arg(d.Height)
-                          .arg(gcb.DisposalMode)
-                          .arg(gcb.DelayTime)
-                          .arg(gcb.TransparentColor)
-                          .arg(QString::fromLatin1(colours.toHex()), QString::fromLatin1(indices.toHex()));
+            frames << QString::asprintf("%d,%d %dx%d disposal %d delay %d transparent %d colours %s indices %s", d.Left,
+                d.Top, d.Width, d.Height, gcb.DisposalMode, gcb.DelayTime, gcb.TransparentColor,
+                colours.toHex().constData(), indices.toHex().constData());
         }
     }
     DGifCloseFile(file, &error);

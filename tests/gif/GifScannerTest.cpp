@@ -16,39 +16,25 @@ const QList<quint32> fourColours = { 0x000000, 0xFF0000, 0x00FF00, 0x0000FF };
 
 } // namespace
 
-TEST(GifScanner, readsFramesTablesAndCanvas)
+// What the control's written picture, compared with giflib, cannot show.
+TEST(GifScanner, readsTheCanvasAndTheFirstFramesDisposal)
 {
-    const QByteArray gif = GifBuilder(16, 8, fourColours)
-                               .netscape(3)
+    const gifScanner::GifLayout layout
+        = gifScanner::scan(GifBuilder(16, 8, fourColours)
                                .control(3, 5) // disposal 3 on the first frame has nothing to restore
                                .solid(0, 0, 4, 4, 1)
-                               .control(2, 0, 3)
-                               .solid(10, 2, 20, 6, 2, { 0x112233, 0x445566 }) // a 2-entry local table
-                               .bytes();
-    const gifScanner::GifLayout layout = gifScanner::scan(gif);
+                               .solid(10, 2, 20, 6, 2)
+                               .bytes());
     ASSERT_EQ(layout.Frames.size(), 2);
-    EXPECT_EQ(layout.LoopCount, 3);
-    ASSERT_EQ(layout.ColorTables.size(), 2);
-    EXPECT_EQ(layout.ColorTables[0].count, 4);
-    EXPECT_EQ(layout.ColorTables[0].entries[3], 0x0000FFu);
-    EXPECT_EQ(layout.ColorTables[1].count, 2);
-    EXPECT_EQ(layout.ColorTables[1].entries[1], 0x445566u);
-    const auto describe = [](const gifScanner::FrameRecord &f) {
-        return QList<int> { f.Left, f.Top, f.Width, f.Height, f.Delay, f.Disposal, f.HasTransparency,
-            f.TransparentIndex, f.ColorTable };
-    };
-    EXPECT_EQ(describe(layout.Frames[0]), (QList<int> { 0, 0, 4, 4, 50, 0, 0, 0, 0 }));
-    EXPECT_EQ(describe(layout.Frames[1]), (QList<int> { 10, 2, 20, 6, 0, 2, 1, 3, 1 }));
+    EXPECT_EQ(layout.Frames[0].Disposal, 0);
+    EXPECT_EQ(layout.Frames[0].Delay, 50);
     EXPECT_EQ(layout.CanvasWidth, 30) << "the frame reaches past the logical screen";
     EXPECT_EQ(layout.CanvasHeight, 8);
-    ASSERT_EQ(layout.BlockList.size(), 2);
-    EXPECT_EQ(gif[layout.BlockList[0].Start], '\x2C');
-    EXPECT_EQ(gif.mid(layout.BlockList[1].Start + layout.BlockList[1].Length - 1), QByteArray("\0\x3B", 2));
 }
 
-TEST(GifScanner, toleratesOddButHarmlessBytes)
+TEST(GifScanner, toleratesOddButHarmlessBytesAndRefusesWhatIsNotAGifOrHasNoColours)
 {
-    const QByteArray gif = GifBuilder(4, 4, fourColours, "gIf87A")
+    const QByteArray odd = GifBuilder(4, 4, fourColours, "gIf87A")
                                .netscape(0, "netscape2.0")
                                .raw(QByteArray(3, '\0')) // stray zero bytes between blocks
                                .raw(QByteArray("\x21\xFE\x03"
@@ -59,25 +45,20 @@ TEST(GifScanner, toleratesOddButHarmlessBytes)
                                .netscape(7, "netscape2.0")
                                .solid(0, 0, 4, 4, 2)
                                .withoutTrailer(); // a missing trailer loses nothing
-    const gifScanner::GifLayout layout = gifScanner::scan(gif);
-    EXPECT_EQ(layout.Frames.size(), 2);
-    EXPECT_EQ(layout.LoopCount, 7) << "the extension is recognised in lower case";
-}
-
-TEST(GifScanner, refusesWhatIsNotAGifOrHasNoColours)
-{
+    EXPECT_EQ(gifScanner::scan(odd).LoopCount, 7) << "the extension is recognised in lower case";
     // The second frame has no table of its own and there is no global one: nothing loads.
     const QByteArray noTable = GifBuilder(4, 4)
                                    .solid(0, 0, 4, 4, 1, { 0, 0xFFFFFF })
                                    .solid(0, 0, 4, 4, 1)
                                    .solid(0, 0, 4, 4, 1, { 0, 1 })
                                    .bytes();
-    for (const QByteArray &bad :
-        { QByteArray(), QByteArray("GIF88a"), GifBuilder(4, 4, fourColours, "GIF90a").solid(0, 0, 4, 4, 1).bytes(),
-            noTable, GifBuilder(4, 4, fourColours).bytes().left(20) }) { // a colour table cut short
-        const gifScanner::GifLayout layout = gifScanner::scan(bad);
-        EXPECT_TRUE(layout.Frames.isEmpty()) << bad.toHex().toStdString();
-        EXPECT_EQ(layout.CanvasWidth, 0);
+    const std::pair<QByteArray, int> cases[] = { { odd, 2 }, { QByteArray(), 0 }, { QByteArray("GIF88a"), 0 },
+        { GifBuilder(4, 4, fourColours, "GIF90a").solid(0, 0, 4, 4, 1).bytes(), 0 }, { noTable, 0 },
+        { GifBuilder(4, 4, fourColours).bytes().left(20), 0 } }; // a colour table cut short
+    for (const auto &[bytes, frames] : cases) {
+        const gifScanner::GifLayout layout = gifScanner::scan(bytes);
+        EXPECT_EQ(layout.Frames.size(), frames) << bytes.toHex().toStdString();
+        EXPECT_EQ(layout.CanvasWidth, frames ? 4 : 0);
     }
 }
 

@@ -29,7 +29,7 @@ std::string describe(const ImageRecipe &r)
 
 QByteArray inParts()
 {
-    return withImageDataSplit(writeWithLibpng({ 40, 30, 6, 16, false, false, 8 }), 100);
+    return writeWithLibpng({ 40, 30, 6, 16, false, false, 8, 100 });
 }
 
 // The fuzz seeds (another encoder: every format, interlaced or not, every filter at every
@@ -161,9 +161,11 @@ TEST(PngDecode, inflatesAtOnceOrStreamedAlikeAndOnlyAWholeStreamOfTheHeadersLeng
     uint32_t seed = 3;
     for (const auto &[colorType, bitDepth] : formats) {
         for (const bool interlaced : { false, true }) {
-            const ImageRecipe recipe { 20, 40, colorType, bitDepth, interlaced, true, seed++ };
-            for (const qsizetype part : { qsizetype(1) << 20, qsizetype(7) }) {
-                const QByteArray file = withImageDataSplit(writeWithLibpng(recipe), part);
+            ImageRecipe recipe { 20, 40, colorType, bitDepth, interlaced, true, seed++ };
+            for (const int part : { 0, 7 }) {
+                recipe.idatBytes = part;
+                const QByteArray file = writeWithLibpng(recipe);
+                ASSERT_EQ(file.count("IDAT") > 1, part > 0) << describe(recipe);
                 const Decoded whole = decodeWith(file, Mode::Whole);
                 ASSERT_TRUE(whole.ok) << describe(recipe);
                 EXPECT_EQ(decodeWith(file, Mode::Streaming), whole) << describe(recipe) << " parts " << part;
@@ -181,11 +183,14 @@ TEST(PngDecode, inflatesAtOnceOrStreamedAlikeAndOnlyAWholeStreamOfTheHeadersLeng
         { deflate(rows).chopped(3), false }, { "not deflate", false } };
     for (const auto &[stream, whole] : streams) {
         SCOPED_TRACE(stream.toHex().toStdString());
-        const QByteArray file = signature() + ihdr(4, 4, 8, 0) + chunk("IDAT", stream) + chunk("IEND", {});
+        const auto file = [&stream](qsizetype split) {
+            return signature() + ihdr(4, 4, 8, 0) + chunk("IDAT", stream.left(split)) + chunk("IDAT", stream.mid(split))
+                + chunk("IEND", {});
+        };
         StdPNG image;
-        EXPECT_EQ(image.LoadData(file) ? "loaded" : image.FailureReason(),
+        EXPECT_EQ(image.LoadData(file(3)) ? "loaded" : image.FailureReason(),
             whole ? "loaded" : "Failed to decompress image data.");
-        for (const QByteArray &parts : { file, withImageDataSplit(file, 3) }) {
+        for (const QByteArray &parts : { file(stream.size()), file(3) }) {
             EXPECT_EQ(decodeWith(parts, Mode::Whole).ok, whole);
             EXPECT_EQ(decodeWith(parts, Mode::Streaming).ok, whole);
         }
@@ -216,7 +221,6 @@ TEST(PngDecode, choosesTheBitmapFormatOfEachImage)
         ASSERT_TRUE(image.LoadData(writeWithLibpng(recipe)));
         EXPECT_EQ(image.BitCount_BMP(), row[3]);
         EXPECT_EQ(image.ImageData().ColorTable().size(), size_t(row[4]));
-        EXPECT_EQ(image.ScanLineWidth(), ((10 * row[3] + 31) & ~31) / 8);
     }
 }
 

@@ -4,7 +4,6 @@
 #include "png/StdPNG.h"
 #include "support/TestSupport.h"
 
-#include <QDir>
 #include <QTemporaryDir>
 
 #include <gtest/gtest.h>
@@ -107,6 +106,9 @@ TEST(PngReader, namesEachFailureAndKeepsNothingOfIt)
         { badKey, "8 bits" },
         { badKey, "8 bits", false },
         { smallFile(chunk("tRNS", QByteArray(1, '\0'))), "8 bits" },
+        { signature() + ihdr(1, 1, 8, 2) + chunk("tRNS", QByteArray::fromHex("0001"))
+                + chunk("IDAT", deflate(QByteArray(4, '\0'))) + iend,
+            "24 bits" },
         { rgba, "32 bits" },
     };
     for (const auto &c : cases) {
@@ -240,21 +242,5 @@ TEST(PngReader, loadsFromDiskButNothingThatIsNotABoundedFile)
     for (const auto &[path, reason] : cases) {
         EXPECT_FALSE(image.LoadFile(path));
         EXPECT_EQ(image.FailureReason(), reason);
-    }
-}
-
-TEST(PngReader, replaysEveryFileTheFuzzerFound)
-{
-    const QDir crashers(testDataPath("crashers"));
-    const QStringList names = crashers.entryList(QDir::Files);
-    ASSERT_FALSE(names.isEmpty());
-    for (const QString &name : names) {
-        QFile file(crashers.filePath(name));
-        ASSERT_TRUE(file.open(QIODevice::ReadOnly));
-        StdPNG image;
-        image.LoadData(file.readAll());
-        image.Comments();
-        image.Palette();
-        image.LastModified();
     }
 }

@@ -180,7 +180,6 @@ TEST(PngTransparency, laysAlphaAndKeyedImagesOnTheirBackgroundByStyle)
             { 0xFF000000u | (info & 0xFF) << 16 | (info & 0xFF00) | (info >> 16 & 0xFF) } },
         { rgbaFile(), 0x0000FF, 32, { 0x80800000u, 0x803F4000u, 0x80000080u }, 128 }, // the opacity baked in
         { keyed, StdPNG::alphaTransColorBkg, 32, { 0xFF010203u, 0xFFAABBCCu } },
-        { keyed, StdPNG::alphaTransparent, 32, { 0, 0xFFAABBCCu } },
         { indexed, StdPNG::alphaTransColorBkg, 8, { 0xFF102030u, 0xFF405060u } }, // keeps its palette
     };
     for (const auto &c : cases) {

@@ -44,6 +44,8 @@ QByteArray writeWithLibpng(const ImageRecipe &recipe)
     }
     png_set_write_fn(png, &out, appendToBuffer, nullptr);
     png_set_filter(png, PNG_FILTER_TYPE_BASE, PNG_ALL_FILTERS);
+    if (recipe.idatBytes)
+        png_set_compression_buffer_size(png, size_t(recipe.idatBytes));
     png_set_IHDR(png, info, png_uint_32(recipe.width), png_uint_32(recipe.height), recipe.bitDepth, recipe.colorType,
         recipe.interlaced ? PNG_INTERLACE_ADAM7 : PNG_INTERLACE_NONE, PNG_COMPRESSION_TYPE_BASE, PNG_FILTER_TYPE_BASE);
 
@@ -179,28 +181,6 @@ QByteArray greyFile(int width, int height, const QByteArray &extraChunks, uint8_
             rows.append(char(y + x));
     }
     return signature() + ihdr(width, height, 8, 0) + extraChunks + chunk("IDAT", deflate(rows)) + chunk("IEND", {});
-}
-
-QByteArray withImageDataSplit(const QByteArray &file, qsizetype partSize)
-{
-    QByteArray before;
-    QByteArray data;
-    QByteArray after;
-    qsizetype position = 8;
-    while (position + 12 <= file.size()) {
-        const auto *p = reinterpret_cast<const uchar *>(file.constData() + position);
-        const qsizetype length = qsizetype(uint32_t(p[0]) << 24 | uint32_t(p[1]) << 16 | uint32_t(p[2]) << 8 | p[3]);
-        const QByteArray whole = file.mid(position, length + 12);
-        if (std::memcmp(p + 4, "IDAT", 4) == 0)
-            data += whole.mid(8, length);
-        else
-            (data.isEmpty() ? before : after) += whole;
-        position += length + 12;
-    }
-    QByteArray parts;
-    for (qsizetype at = 0; at < data.size(); at += partSize)
-        parts += chunk("IDAT", data.mid(at, partSize));
-    return signature() + before + parts + after;
 }
 
 } // namespace zelctl::test

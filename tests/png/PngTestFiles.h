@@ -26,6 +26,7 @@ struct ImageRecipe
     bool interlaced = false;
     bool withTransparency = false;
     uint32_t seed = 1;
+    int idatBytes = 0; // the size of each IDAT chunk but the last, 0 for libpng's own
 
     int channels() const { return colorType == 2 ? 3 : colorType == 4 ? 2 : colorType == 6 ? 4 : 1; }
     // Bytes of a pixel in the stream, at least 1.
@@ -50,9 +51,6 @@ QByteArray ihdr(
 // IDAT data: the rows (each starting with its filter byte) deflated.
 QByteArray deflate(const QByteArray &rows);
 QByteArray be32(uint32_t value);
-
-// The same file with its image data in IDAT chunks of partSize bytes (the last one shorter).
-QByteArray withImageDataSplit(const QByteArray &file, qsizetype partSize);
 
 // A complete grey 8-bit file of width × height pixels whose row y holds the value y + x,
 // every row with filter type `filter` (0 gives the stored values).
