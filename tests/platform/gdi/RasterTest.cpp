@@ -29,25 +29,21 @@ int pick(Rng &rng, int low, int high)
     return std::uniform_int_distribution<int>(low, high)(rng);
 }
 
-// Mostly across a bitmap of `size` pixels; rarely far beyond it, or beyond the limits of
-// blits (2^27) and pens (2^20).
-int far(Rng &rng)
+// Mostly from low to high (or, where it may, 0); now and then far beyond a bitmap, or beyond
+// the limits of blits (2^27) and pens (2^20).
+int position(Rng &rng, int low, int high, bool mayBeEmpty = false)
 {
-    static const int values[]
+    static const int far[]
         = { INT_MIN, -(1 << 27) - 1, -(1 << 27), -(1 << 20) - 1, -65536, 65536, 1 << 20, 1 << 27, INT_MAX };
-    return values[pick(rng, 0, 8)];
-}
-
-int position(Rng &rng, int size)
-{
-    return pick(rng, 0, 40) == 0 ? far(rng) : pick(rng, -3, size);
+    if (pick(rng, 0, 40) == 0)
+        return far[pick(rng, 0, 8)];
+    return mayBeEmpty && pick(rng, 0, 12) == 0 ? 0 : pick(rng, low, high);
 }
 
 // An origin and extent: now and then empty, or mirrored (counting back from the origin).
 std::pair<int, int> span(Rng &rng, int size, int mirrorOdds = 4)
 {
-    const int start = pick(rng, 0, 40) == 0 ? far(rng) : pick(rng, -1, size - 1);
-    const int length = pick(rng, 0, 40) == 0 ? far(rng) : pick(rng, 0, 12) == 0 ? 0 : pick(rng, 1, size + 2);
+    const int start = position(rng, -1, size - 1), length = position(rng, 1, size + 2, true);
     const bool mirrored = pick(rng, 1, mirrorOdds) == 1 && std::abs(qint64(start)) + std::abs(qint64(length)) < 1 << 20;
     return mirrored ? std::pair { start + length - 1, -length } : std::pair { start, length };
 }
@@ -252,10 +248,11 @@ template <typename Model, typename Call> std::string check(TestBitmap &dst, Mode
 std::string describe(int n, const TestBitmap &dst, const TestBitmap &src, const Blit &a)
 {
     std::ostringstream out;
-    out << "case " << n << ": " << dst.width << "x" << dst.height << "x" << dst.bpp << (dst.topDown ? "" : " bottom-up")
-        << " from " << (&src == &dst ? "itself, " : "") << src.width << "x" << src.height << "x" << src.bpp << ", ("
-        << a.x << "," << a.y << " " << a.w << "x" << a.h << ") from (" << a.sx << "," << a.sy << " " << a.sw << "x"
-        << a.sh << ")";
+    for (const TestBitmap *b : { &dst, &src })
+        out << (b == &src ? " from " : "case " + std::to_string(n) + ": ") << b->width << "x" << b->height << "x"
+            << b->bpp << (b->topDown ? "" : " bottom-up") << (b == &src && &src == &dst ? " (itself)" : "");
+    out << ", (" << a.x << "," << a.y << " " << a.w << "x" << a.h << ") from (" << a.sx << "," << a.sy << " " << a.sw
+        << "x" << a.sh << ")";
     return out.str();
 }
 
@@ -336,26 +333,24 @@ TEST(Raster, alphaBlendingMatchesThePixelModel)
     }
 }
 
-TEST(Raster, largeBlitsSharedAmongThreadsMatchTheModelToo)
+// Large jobs are shared among threads, in bands of rows.
+TEST(Raster, largeBlitsAndBlendsMatchTheModelToo)
 {
-    TestBitmap src(300, 200, 32);
-    for (int y = 0; y < 200; ++y)
-        for (int x = 0; x < 300; ++x)
-            src.setValue(
-                x, y, 0xFF000000u | quint32(x & 0xFF) << 16 | quint32(y & 0xFF) << 8 | quint32((x + y) & 0xFF));
-    TestBitmap dst(900, 600, 32);
-    const Blit a { 0, 0, 900, 600, 0, 0, 300, 200 }, whole { 0, 0, 900, 600, 0, 0, 900, 600 };
+    Rng rng(4);
+    TestBitmap src(300, 200, 32), dst(900, 600, 32), blended(900, 600, 32);
+    for (int i = 0; i < src.stride * src.height; ++i)
+        static_cast<uchar *>(src.bits)[i] = uchar(rng());
     for (int mode : { COLORONCOLOR, HALFTONE }) {
         SetStretchBltMode(dst.dc, mode);
+        const Blit a { 0, 0, 900, 600, 0, 0, 300, 200 };
         ASSERT_EQ(check(
                       dst, [&](Picture &want) { return modelStretch(want, dst, src, a, SRCCOPY, mode == HALFTONE); },
                       [&] { return StretchBlt(dst.dc, 0, 0, 900, 600, src.dc, 0, 0, 300, 200, SRCCOPY); }, 1.0),
             "")
             << mode;
     }
-    TestBitmap blended(900, 600, 32);
-    BLENDFUNCTION half;
-    half.SourceConstantAlpha = 128;
+    const BLENDFUNCTION half { AC_SRC_OVER, 0, 128, 0 };
+    const Blit whole { 0, 0, 900, 600, 0, 0, 900, 600 };
     ASSERT_EQ(check(
                   blended, [&](Picture &want) { return modelBlend(want, blended, dst, whole, half); },
                   [&] { return AlphaBlend(blended.dc, 0, 0, 900, 600, dst.dc, 0, 0, 900, 600, half); }, 0.501),
@@ -369,7 +364,7 @@ TEST(Raster, fillsOutlinesAndLinesMatchThePixelModel)
         const auto b = randomBitmap(rng, 12);
         std::array<int, 6> c;
         for (size_t i = 0; i < c.size(); ++i)
-            c[i] = position(rng, i % 2 ? b->height : b->width);
+            c[i] = position(rng, -3, i % 2 ? b->height : b->width);
         if (n % 3 == 0 && pick(rng, 0, 3) != 0) // mostly the right way round
             std::tie(c[0], c[1], c[2], c[3])
                 = std::tuple { std::min(c[0], c[2]), std::min(c[1], c[3]), std::max(c[0], c[2]), std::max(c[1], c[3]) };
