@@ -12,7 +12,6 @@
 #include <cmath>
 #include <memory>
 #include <random>
-#include <sstream>
 #include <tuple>
 
 using namespace zelctl::gdi;
@@ -158,6 +157,12 @@ struct Blit
     int x, y, w, h, sx, sy, sw, sh;
 };
 
+std::ostream &operator<<(std::ostream &out, const Blit &a)
+{
+    return out << "(" << a.x << "," << a.y << " " << a.w << "x" << a.h << ") from (" << a.sx << "," << a.sy << " "
+               << a.sw << "x" << a.sh << ")";
+}
+
 bool withinLimits(const Blit &a)
 {
     for (int v : { a.x, a.y, a.w, a.h, a.sx, a.sy, a.sw, a.sh })
@@ -245,17 +250,6 @@ template <typename Model, typename Call> std::string check(TestBitmap &dst, Mode
     return mismatch(dst, want, before, tolerance);
 }
 
-std::string describe(int n, const TestBitmap &dst, const TestBitmap &src, const Blit &a)
-{
-    std::ostringstream out;
-    for (const TestBitmap *b : { &dst, &src })
-        out << (b == &src ? " from " : "case " + std::to_string(n) + ": ") << b->width << "x" << b->height << "x"
-            << b->bpp << (b->topDown ? "" : " bottom-up") << (b == &src && &src == &dst ? " (itself)" : "");
-    out << ", (" << a.x << "," << a.y << " " << a.w << "x" << a.h << ") from (" << a.sx << "," << a.sy << " " << a.sw
-        << "x" << a.sh << ")";
-    return out.str();
-}
-
 } // namespace
 
 TEST(Raster, blitsMatchThePixelModel)
@@ -287,7 +281,7 @@ TEST(Raster, blitsMatchThePixelModel)
                       },
                       tolerance),
             "")
-            << describe(n, *dst, src, a) << " rop " << (rop >> 16) << (halftone ? " halftone" : "");
+            << "case " << n << ": " << a << " rop " << (rop >> 16) << (halftone ? " halftone" : "");
     }
 }
 
@@ -328,7 +322,7 @@ TEST(Raster, alphaBlendingMatchesThePixelModel)
                 *dst, [&](Picture &want) { return modelBlend(want, *dst, src, a, f); },
                 [&] { return AlphaBlend(dst->dc, a.x, a.y, a.w, a.h, src.dc, a.sx, a.sy, a.sw, a.sh, f); }, 0.501),
             "")
-            << describe(n, *dst, src, a) << " alpha " << int(f.SourceConstantAlpha)
+            << "case " << n << ": " << a << " alpha " << int(f.SourceConstantAlpha)
             << (f.AlphaFormat ? " per pixel" : "");
     }
 }
