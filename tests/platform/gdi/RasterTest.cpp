@@ -163,12 +163,15 @@ std::ostream &operator<<(std::ostream &out, const Blit &a)
                << a.sw << "x" << a.sh << ")";
 }
 
+// Coordinates beyond 2^27 fail a blit, beyond 2^20 a pen.
+bool within(std::initializer_list<int> values, int limit)
+{
+    return std::all_of(values.begin(), values.end(), [limit](int v) { return std::abs(qint64(v)) <= limit; });
+}
+
 bool withinLimits(const Blit &a)
 {
-    for (int v : { a.x, a.y, a.w, a.h, a.sx, a.sy, a.sw, a.sh })
-        if (v < -(1 << 27) || v > 1 << 27)
-            return false;
-    return true;
+    return within({ a.x, a.y, a.w, a.h, a.sx, a.sy, a.sw, a.sh }, 1 << 27);
 }
 
 // Each target pixel a blit draws, with the source pixel under its centre.
@@ -388,19 +391,14 @@ TEST(Raster, fillsOutlinesAndLinesMatchThePixelModel)
                 for (qint64 x = std::max<qint64>(left, 0); x < std::min<qint64>(right, b->width); ++x)
                     draw(x, y);
         };
-        const auto penOk = [](std::initializer_list<int> values) {
-            return std::all_of(values.begin(), values.end(), [](int v) { return std::abs(qint64(v)) <= 1 << 20; });
-        };
-        std::string trace = "case " + std::to_string(n) + ", " + std::to_string(b->bpp) + " bits:";
-        for (int v : c)
-            trace += " " + std::to_string(v);
+        SCOPED_TRACE(testing::Message() << "case " << n << ", " << b->bpp << " bits: " << testing::PrintToString(c));
         if (n % 3 == 0) {
             if (brush != GetStockObject(NULL_BRUSH))
                 area(c[0], c[1], c[2], c[3], [&](qint64 x, qint64 y) { mark(x, y, painted, false); });
-            ASSERT_NE(FillRect(b->dc, RECT { c[0], c[1], c[2], c[3] }, brush), 0) << trace;
+            ASSERT_NE(FillRect(b->dc, RECT { c[0], c[1], c[2], c[3] }, brush), 0);
         } else if (n % 3 == 1) {
             // Corners in any order; the outline has the pen, the inside within it the brush.
-            const bool ok = penOk({ c[0], c[1], c[2], c[3] });
+            const bool ok = within({ c[0], c[1], c[2], c[3] }, 1 << 20);
             const qint64 l = std::min(c[0], c[2]), r = std::max(c[0], c[2]), t = std::min(c[1], c[3]),
                          bottom = std::max(c[1], c[3]), inset = pen != GetStockObject(NULL_PEN);
             if (ok && brush != GetStockObject(NULL_BRUSH))
@@ -411,13 +409,13 @@ TEST(Raster, fillsOutlinesAndLinesMatchThePixelModel)
                     if (x == l || x == r - 1 || y == t || y == bottom - 1)
                         mark(x, y, ink, xorPen);
                 });
-            ASSERT_EQ(Rectangle(b->dc, c[0], c[1], c[2], c[3]), ok) << trace;
+            ASSERT_EQ(Rectangle(b->dc, c[0], c[1], c[2], c[3]), ok);
         } else {
             // Two joined lines, each without its end point: one pixel a step along the longer
             // axis, across it the pixel nearest the true line (a tie away from the start).
             MoveToEx(b->dc, c[0], c[1]);
             for (int end : { 2, 4 }) {
-                const bool ok = penOk({ c[size_t(end)], c[size_t(end) + 1], c[0], c[1] });
+                const bool ok = within({ c[size_t(end)], c[size_t(end) + 1], c[0], c[1] }, 1 << 20);
                 const qint64 dx = qint64(c[size_t(end)]) - c[0], dy = qint64(c[size_t(end) + 1]) - c[1];
                 const qint64 steps = std::max(std::abs(dx), std::abs(dy));
                 for (qint64 t = 0; ok && pen != GetStockObject(NULL_PEN) && t < steps; ++t) {
@@ -425,15 +423,15 @@ TEST(Raster, fillsOutlinesAndLinesMatchThePixelModel)
                         = [&](qint64 d) { return (2 * t * std::abs(d) + steps) / (2 * steps) * (d < 0 ? -1 : 1); };
                     mark(c[0] + across(dx), c[1] + across(dy), ink, xorPen);
                 }
-                ASSERT_EQ(LineTo(b->dc, c[size_t(end)], c[size_t(end) + 1]), ok) << trace;
+                ASSERT_EQ(LineTo(b->dc, c[size_t(end)], c[size_t(end) + 1]), ok);
                 if (ok)
                     c[0] = c[size_t(end)], c[1] = c[size_t(end) + 1];
             }
         }
         const int x = pick(rng, 0, b->width - 1), y = pick(rng, 0, b->height - 1);
         const quint32 shown = b->colorOf(b->value(x, y));
-        EXPECT_EQ(GetPixel(b->dc, x, y), (shown & 0xFF) << 16 | (shown & 0xFF00) | (shown >> 16 & 0xFF)) << trace;
-        ASSERT_EQ(mismatch(*b, want, before, 0), "") << trace;
+        EXPECT_EQ(GetPixel(b->dc, x, y), (shown & 0xFF) << 16 | (shown & 0xFF00) | (shown >> 16 & 0xFF));
+        ASSERT_EQ(mismatch(*b, want, before, 0), "");
         SelectObject(b->dc, GetStockObject(BLACK_PEN));
         SelectObject(b->dc, GetStockObject(WHITE_BRUSH));
         DeleteObject(pen);
