@@ -71,30 +71,25 @@ TEST(Settings, aStoreThatCannotBeReadIsNeverWrittenOver)
     QFile original(path);
     ASSERT_TRUE(original.rename(path + ".kept"));
 
-    // A folder where the file should be: nothing can be read, nothing may be put there.
-    ASSERT_TRUE(QDir().mkpath(path + "/kept"));
-    EXPECT_EQ(rootPathInANewThread().toStdString(), (QDir::currentPath() + '/').toStdString())
-        << "the session still has a root";
-    EXPECT_FALSE(SaveSetting("zEL", "Setup", "RootPath", "/tmp/"));
-    EXPECT_FALSE(DeleteSetting("zEL", "Setup", "RootPath"));
-    EXPECT_TRUE(QFileInfo(path + "/kept").isDir());
-    ASSERT_TRUE(QDir(path).removeRecursively());
-
-    // A person's typos, which the reader passes over or reads round: the file stays as typed.
+    // A folder where the file should be, and a person's typos, which the reader passes over or
+    // reads round: the session still has a root, and the store stays as it was.
     const struct
     {
-        QByteArray typed;
+        QByteArray typed; // none: a folder
         QString root;
-    } typos[] = {
+    } stores[] = {
+        { {}, QDir::currentPath() + '/' },
         { "[Setup]\nRootPath /opt/zel\nSkinPreviewPath=/srv/skins\n", QDir::currentPath() + '/' },
         { "[Setup\nRootPath=/opt/zel\nSkinPreviewPath=/srv/skins\n", "/opt/zel/" },
     };
-    for (const auto &typo : typos) {
-        writeFile(path, typo.typed);
-        EXPECT_EQ(rootPathInANewThread().toStdString(), typo.root.toStdString());
+    for (const auto &store : stores) {
+        ASSERT_TRUE(store.typed.isNull() ? QDir().mkpath(path + "/kept") : !writeFile(path, store.typed).isEmpty());
+        EXPECT_EQ(rootPathInANewThread().toStdString(), store.root.toStdString());
         EXPECT_FALSE(SaveSetting("zEL", "Setup", "SkinPreviewPath", "/tmp/"));
         EXPECT_FALSE(DeleteSetting("zEL", "Setup", "SkinPreviewPath"));
-        EXPECT_EQ(contents(path), typo.typed);
+        EXPECT_EQ(contents(path), store.typed);
+        EXPECT_EQ(QFileInfo(path + "/kept").isDir(), store.typed.isNull());
+        QDir(path).removeRecursively();
     }
     QFile::remove(path);
     original.rename(path);
