@@ -9,10 +9,6 @@
 
 #include <gtest/gtest.h>
 
-#include <thread>
-
-#include <csignal>
-#include <fcntl.h>
 #include <unistd.h>
 
 using namespace zelctl::platform;
@@ -50,10 +46,6 @@ TEST(FileRead, readsRegularFilesWithinTheBoundAndRefusesTheRestAtOnce)
         // What a save must not replace; a missing file may be made.
         EXPECT_EQ(isSpecialFile(c.path), c.status == FileRead::NotRegularFile) << c.path.toStdString();
     }
-    EXPECT_EQ(readFile(dir.filePath("missing"), 10).message(10), QStringLiteral("No such file or directory"));
-    EXPECT_EQ(readFile("/dev/zero", 10).message(10), QStringLiteral("is not a regular file"));
-    EXPECT_EQ(readFile(dir.filePath("eleven"), 10).message(10), QStringLiteral("is larger than 10 bytes"));
-
     // Files under /proc report no size, yet have content; and no more than the bound is read.
     const FileRead status = readFile("/proc/self/status", 1 << 20);
     ASSERT_TRUE(status.ok());
@@ -61,31 +53,17 @@ TEST(FileRead, readsRegularFilesWithinTheBoundAndRefusesTheRestAtOnce)
     EXPECT_EQ(readFile("/proc/self/status", 10).status, FileRead::TooLarge);
 }
 
-TEST(FileRead, readsAPipeOnlyWhenAskedAndOnlyUpToTheBound)
+// The bound on an endless pipe and the messages are driven through the command line.
+TEST(FileRead, readsAPipeOnlyWhenAsked)
 {
     int ends[2];
     ASSERT_EQ(::pipe(ends), 0);
-    const QString path = QStringLiteral("/proc/self/fd/%1").arg(ends[0]);
-    EXPECT_EQ(readFile(path, 1 << 20).status, FileRead::NotRegularFile);
-
-    // An endless writer: the read stops one byte past the bound.
-    std::signal(SIGPIPE, SIG_IGN);
-    std::thread writer([fd = ends[1]] {
-        const QByteArray block(4096, 'z');
-        while (::write(fd, block.constData(), size_t(block.size())) > 0) { }
-        ::close(fd);
-    });
-    const FileRead endless = readFile(path, 1 << 20, Pipes::Read);
-    ::close(ends[0]);
-    writer.join();
-    EXPECT_EQ(endless.status, FileRead::TooLarge);
-
-    ASSERT_EQ(::pipe(ends), 0);
     ASSERT_EQ(::write(ends[1], "GIF89a", 6), 6);
     ::close(ends[1]);
-    const FileRead six = readFile(QStringLiteral("/proc/self/fd/%1").arg(ends[0]), 10, Pipes::Read);
+    const QString path = QStringLiteral("/proc/self/fd/%1").arg(ends[0]);
+    EXPECT_EQ(readFile(path, 10).status, FileRead::NotRegularFile);
+    EXPECT_EQ(readFile(path, 10, Pipes::Read).bytes, QByteArray("GIF89a"));
     ::close(ends[0]);
-    EXPECT_EQ(six.bytes, QByteArray("GIF89a"));
 }
 
 // A settings file that is a link: to a regular file it is written through, keeping the

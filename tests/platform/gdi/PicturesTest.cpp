@@ -13,35 +13,30 @@ TEST(Pictures, becomeBitmapsAndBack)
     QImage withAlpha(2, 1, QImage::Format_ARGB32);
     withAlpha.setPixel(0, 0, qRgba(255, 0, 0, 255));
     withAlpha.setPixel(1, 0, qRgba(200, 100, 50, 128));
-    const HBITMAP alpha = createBitmapFromImage(withAlpha);
-    DIBSECTION section;
-    ASSERT_TRUE(GetObject(alpha, section));
-    EXPECT_EQ(section.dsBm.bmBitsPixel, 32);
-    EXPECT_LT(section.dsBmih.biHeight, 0);
-    const quint32 *bits = static_cast<const quint32 *>(section.dsBm.bmBits);
-    EXPECT_EQ(bits[0], 0xFFFF0000u);
-    EXPECT_EQ(bits[1], qPremultiply(qRgba(200, 100, 50, 128))) << "premultiplied";
-    EXPECT_EQ(imageFromBitmap(alpha).pixel(1, 0), qPremultiply(qRgba(200, 100, 50, 128)));
-    EXPECT_EQ(imageFromBitmap(alpha).format(), QImage::Format_ARGB32_Premultiplied);
-
     QImage opaque(3, 2, QImage::Format_RGB32);
     opaque.fill(qRgb(1, 2, 3));
     opaque.setPixel(2, 1, qRgb(7, 8, 9));
-    const HBITMAP rgb = createBitmapFromImage(opaque);
-    ASSERT_TRUE(GetObject(rgb, section));
-    EXPECT_EQ(section.dsBm.bmBitsPixel, 24);
-    EXPECT_EQ(imageFromBitmap(rgb), opaque);
+    // With alpha: 32 bits, premultiplied; without: 24 bits.
+    for (const auto &[image, back] :
+        { std::pair { withAlpha, withAlpha.convertToFormat(QImage::Format_ARGB32_Premultiplied) },
+            { opaque, opaque } }) {
+        const HBITMAP bitmap = createBitmapFromImage(image);
+        DIBSECTION section;
+        ASSERT_TRUE(GetObject(bitmap, section));
+        EXPECT_EQ(section.dsBm.bmBitsPixel, image.hasAlphaChannel() ? 32 : 24);
+        EXPECT_LT(section.dsBmih.biHeight, 0);
+        EXPECT_EQ(static_cast<const uchar *>(section.dsBm.bmBits)[0], qBlue(back.pixel(0, 0)));
+        EXPECT_EQ(imageFromBitmap(bitmap), back);
+        DeleteObject(bitmap);
+    }
 
     TestBitmap indexed(2, 1, 4, false, { 0x000000, 0x0A0B0C });
     indexed.row(0)[0] = 0x10;
     const QImage fromTable = imageFromBitmap(indexed.bitmap);
     EXPECT_EQ(fromTable.pixel(0, 0), qRgb(0x0A, 0x0B, 0x0C));
     EXPECT_EQ(fromTable.pixel(1, 0), qRgb(0, 0, 0));
-
     EXPECT_EQ(createBitmapFromImage(QImage()), 0);
     EXPECT_TRUE(imageFromBitmap(indexed.dc).isNull()) << "a DC is not a bitmap";
-    DeleteObject(alpha);
-    DeleteObject(rgb);
 }
 
 TEST(Pictures, drawStretchedLeavingTransparentPixelsAlone)
@@ -70,12 +65,8 @@ TEST(OpaqueRegion, coversEveryPixelThatDiffersFromTheKey)
     const QRegion region = opaqueRegion(b.dc, 0xFFFFFF);
     EXPECT_EQ(region, QRegion(1, 0, 2, 2) + QRegion(4, 3, 1, 1));
     EXPECT_EQ(region.rectCount(), 2) << "identical rows share one band";
-    EXPECT_TRUE(region.contains(QPoint(2, 1)));
-    EXPECT_FALSE(region.contains(QPoint(3, 1))) << "pointer hits pass through the key colour";
-
     // System colours name their RGB value; an all-key surface is empty.
-    EXPECT_TRUE(
-        opaqueRegion(b.dc, zelctl::platform::systemColor(zelctl::platform::COLOR_WINDOW)).contains(QPoint(4, 3)));
+    EXPECT_EQ(opaqueRegion(b.dc, zelctl::platform::systemColor(zelctl::platform::COLOR_WINDOW)), region);
     b.fill(0x000000);
     EXPECT_TRUE(opaqueRegion(b.dc, 0x000000).isEmpty());
     EXPECT_TRUE(opaqueRegion(b.bitmap, 0).isEmpty());
@@ -86,12 +77,12 @@ TEST(PersistentSurface, showsWhatWasDrawnAndKeepsItAcrossResizes)
     SurfaceWidget widget;
     widget.resize(20, 10);
     PersistentSurface &surface = widget.surface();
-    EXPECT_EQ(surface.size(), QSize(20, 10));
     const HDC dc = surface.hdc();
     surface.clear(0x0000FF);
     EXPECT_EQ(GetBkColor(dc), 0x0000FFu);
     const HBRUSH blue = CreateSolidBrush(0xFF0000);
     FillRect(dc, RECT { 1, 1, 3, 3 }, blue);
+    DeleteObject(blue);
     EXPECT_EQ(widget.grab().toImage().pixel(2, 2), qRgb(0, 0, 255));
     EXPECT_EQ(widget.grab().toImage().pixel(5, 5), qRgb(255, 0, 0));
 
@@ -101,7 +92,6 @@ TEST(PersistentSurface, showsWhatWasDrawnAndKeepsItAcrossResizes)
     EXPECT_EQ(GetPixel(dc, 2, 2), 0xFF0000u) << "kept";
     EXPECT_EQ(GetPixel(dc, 25, 11), 0x0000FFu) << "new area in the background colour";
     EXPECT_EQ(surface.image().size(), QSize(30, 12));
-    EXPECT_EQ(surface.image().pixel(1, 1), qRgb(0, 0, 255));
 
     // Masking by colour: only the blue square stays, for the eye and the pointer.
     surface.setMaskColor(0x0000FF);
@@ -112,8 +102,6 @@ TEST(PersistentSurface, showsWhatWasDrawnAndKeepsItAcrossResizes)
     EXPECT_FALSE(widget.mask().contains(QPoint(0, 0)));
     surface.clearMask();
     EXPECT_TRUE(widget.mask().isEmpty());
-    DeleteObject(blue);
-
     widget.resize(0, 0);
     EXPECT_EQ(surface.size(), QSize(1, 1));
 }

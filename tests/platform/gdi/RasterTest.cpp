@@ -12,7 +12,6 @@
 #include <cmath>
 #include <memory>
 #include <random>
-#include <sstream>
 #include <tuple>
 
 using namespace zelctl::gdi;
@@ -29,25 +28,21 @@ int pick(Rng &rng, int low, int high)
     return std::uniform_int_distribution<int>(low, high)(rng);
 }
 
-// Mostly across a bitmap of `size` pixels; rarely far beyond it, or beyond the limits of
-// blits (2^27) and pens (2^20).
-int far(Rng &rng)
+// Mostly from low to high (or, where it may, 0); now and then far beyond a bitmap, or beyond
+// the limits of blits (2^27) and pens (2^20).
+int position(Rng &rng, int low, int high, bool mayBeEmpty = false)
 {
-    static const int values[]
+    static const int far[]
         = { INT_MIN, -(1 << 27) - 1, -(1 << 27), -(1 << 20) - 1, -65536, 65536, 1 << 20, 1 << 27, INT_MAX };
-    return values[pick(rng, 0, 8)];
-}
-
-int position(Rng &rng, int size)
-{
-    return pick(rng, 0, 40) == 0 ? far(rng) : pick(rng, -3, size);
+    if (pick(rng, 0, 40) == 0)
+        return far[pick(rng, 0, 8)];
+    return mayBeEmpty && pick(rng, 0, 12) == 0 ? 0 : pick(rng, low, high);
 }
 
 // An origin and extent: now and then empty, or mirrored (counting back from the origin).
 std::pair<int, int> span(Rng &rng, int size, int mirrorOdds = 4)
 {
-    const int start = pick(rng, 0, 40) == 0 ? far(rng) : pick(rng, -1, size - 1);
-    const int length = pick(rng, 0, 40) == 0 ? far(rng) : pick(rng, 0, 12) == 0 ? 0 : pick(rng, 1, size + 2);
+    const int start = position(rng, -1, size - 1), length = position(rng, 1, size + 2, true);
     const bool mirrored = pick(rng, 1, mirrorOdds) == 1 && std::abs(qint64(start)) + std::abs(qint64(length)) < 1 << 20;
     return mirrored ? std::pair { start + length - 1, -length } : std::pair { start, length };
 }
@@ -162,12 +157,21 @@ struct Blit
     int x, y, w, h, sx, sy, sw, sh;
 };
 
+std::ostream &operator<<(std::ostream &out, const Blit &a)
+{
+    return out << "(" << a.x << "," << a.y << " " << a.w << "x" << a.h << ") from (" << a.sx << "," << a.sy << " "
+               << a.sw << "x" << a.sh << ")";
+}
+
+// Coordinates beyond 2^27 fail a blit, beyond 2^20 a pen.
+bool within(std::initializer_list<int> values, int limit)
+{
+    return std::all_of(values.begin(), values.end(), [limit](int v) { return std::abs(qint64(v)) <= limit; });
+}
+
 bool withinLimits(const Blit &a)
 {
-    for (int v : { a.x, a.y, a.w, a.h, a.sx, a.sy, a.sw, a.sh })
-        if (v < -(1 << 27) || v > 1 << 27)
-            return false;
-    return true;
+    return within({ a.x, a.y, a.w, a.h, a.sx, a.sy, a.sw, a.sh }, 1 << 27);
 }
 
 // Each target pixel a blit draws, with the source pixel under its centre.
@@ -249,16 +253,6 @@ template <typename Model, typename Call> std::string check(TestBitmap &dst, Mode
     return mismatch(dst, want, before, tolerance);
 }
 
-std::string describe(int n, const TestBitmap &dst, const TestBitmap &src, const Blit &a)
-{
-    std::ostringstream out;
-    out << "case " << n << ": " << dst.width << "x" << dst.height << "x" << dst.bpp << (dst.topDown ? "" : " bottom-up")
-        << " from " << (&src == &dst ? "itself, " : "") << src.width << "x" << src.height << "x" << src.bpp << ", ("
-        << a.x << "," << a.y << " " << a.w << "x" << a.h << ") from (" << a.sx << "," << a.sy << " " << a.sw << "x"
-        << a.sh << ")";
-    return out.str();
-}
-
 } // namespace
 
 TEST(Raster, blitsMatchThePixelModel)
@@ -290,7 +284,7 @@ TEST(Raster, blitsMatchThePixelModel)
                       },
                       tolerance),
             "")
-            << describe(n, *dst, src, a) << " rop " << (rop >> 16) << (halftone ? " halftone" : "");
+            << "case " << n << ": " << a << " rop " << (rop >> 16) << (halftone ? " halftone" : "");
     }
 }
 
@@ -331,31 +325,29 @@ TEST(Raster, alphaBlendingMatchesThePixelModel)
                 *dst, [&](Picture &want) { return modelBlend(want, *dst, src, a, f); },
                 [&] { return AlphaBlend(dst->dc, a.x, a.y, a.w, a.h, src.dc, a.sx, a.sy, a.sw, a.sh, f); }, 0.501),
             "")
-            << describe(n, *dst, src, a) << " alpha " << int(f.SourceConstantAlpha)
+            << "case " << n << ": " << a << " alpha " << int(f.SourceConstantAlpha)
             << (f.AlphaFormat ? " per pixel" : "");
     }
 }
 
-TEST(Raster, largeBlitsSharedAmongThreadsMatchTheModelToo)
+// Large jobs are shared among threads, in bands of rows.
+TEST(Raster, largeBlitsAndBlendsMatchTheModelToo)
 {
-    TestBitmap src(300, 200, 32);
-    for (int y = 0; y < 200; ++y)
-        for (int x = 0; x < 300; ++x)
-            src.setValue(
-                x, y, 0xFF000000u | quint32(x & 0xFF) << 16 | quint32(y & 0xFF) << 8 | quint32((x + y) & 0xFF));
-    TestBitmap dst(900, 600, 32);
-    const Blit a { 0, 0, 900, 600, 0, 0, 300, 200 }, whole { 0, 0, 900, 600, 0, 0, 900, 600 };
+    Rng rng(4);
+    TestBitmap src(300, 200, 32), dst(900, 600, 32), blended(900, 600, 32);
+    for (int i = 0; i < src.stride * src.height; ++i)
+        static_cast<uchar *>(src.bits)[i] = uchar(rng());
     for (int mode : { COLORONCOLOR, HALFTONE }) {
         SetStretchBltMode(dst.dc, mode);
+        const Blit a { 0, 0, 900, 600, 0, 0, 300, 200 };
         ASSERT_EQ(check(
                       dst, [&](Picture &want) { return modelStretch(want, dst, src, a, SRCCOPY, mode == HALFTONE); },
                       [&] { return StretchBlt(dst.dc, 0, 0, 900, 600, src.dc, 0, 0, 300, 200, SRCCOPY); }, 1.0),
             "")
             << mode;
     }
-    TestBitmap blended(900, 600, 32);
-    BLENDFUNCTION half;
-    half.SourceConstantAlpha = 128;
+    const BLENDFUNCTION half { AC_SRC_OVER, 0, 128, 0 };
+    const Blit whole { 0, 0, 900, 600, 0, 0, 900, 600 };
     ASSERT_EQ(check(
                   blended, [&](Picture &want) { return modelBlend(want, blended, dst, whole, half); },
                   [&] { return AlphaBlend(blended.dc, 0, 0, 900, 600, dst.dc, 0, 0, 900, 600, half); }, 0.501),
@@ -369,7 +361,7 @@ TEST(Raster, fillsOutlinesAndLinesMatchThePixelModel)
         const auto b = randomBitmap(rng, 12);
         std::array<int, 6> c;
         for (size_t i = 0; i < c.size(); ++i)
-            c[i] = position(rng, i % 2 ? b->height : b->width);
+            c[i] = position(rng, -3, i % 2 ? b->height : b->width);
         if (n % 3 == 0 && pick(rng, 0, 3) != 0) // mostly the right way round
             std::tie(c[0], c[1], c[2], c[3])
                 = std::tuple { std::min(c[0], c[2]), std::min(c[1], c[3]), std::max(c[0], c[2]), std::max(c[1], c[3]) };
@@ -399,19 +391,14 @@ TEST(Raster, fillsOutlinesAndLinesMatchThePixelModel)
                 for (qint64 x = std::max<qint64>(left, 0); x < std::min<qint64>(right, b->width); ++x)
                     draw(x, y);
         };
-        const auto penOk = [](std::initializer_list<int> values) {
-            return std::all_of(values.begin(), values.end(), [](int v) { return std::abs(qint64(v)) <= 1 << 20; });
-        };
-        std::string trace = "case " + std::to_string(n) + ", " + std::to_string(b->bpp) + " bits:";
-        for (int v : c)
-            trace += " " + std::to_string(v);
+        SCOPED_TRACE(testing::Message() << "case " << n << ", " << b->bpp << " bits: " << testing::PrintToString(c));
         if (n % 3 == 0) {
             if (brush != GetStockObject(NULL_BRUSH))
                 area(c[0], c[1], c[2], c[3], [&](qint64 x, qint64 y) { mark(x, y, painted, false); });
-            ASSERT_NE(FillRect(b->dc, RECT { c[0], c[1], c[2], c[3] }, brush), 0) << trace;
+            ASSERT_NE(FillRect(b->dc, RECT { c[0], c[1], c[2], c[3] }, brush), 0);
         } else if (n % 3 == 1) {
             // Corners in any order; the outline has the pen, the inside within it the brush.
-            const bool ok = penOk({ c[0], c[1], c[2], c[3] });
+            const bool ok = within({ c[0], c[1], c[2], c[3] }, 1 << 20);
             const qint64 l = std::min(c[0], c[2]), r = std::max(c[0], c[2]), t = std::min(c[1], c[3]),
                          bottom = std::max(c[1], c[3]), inset = pen != GetStockObject(NULL_PEN);
             if (ok && brush != GetStockObject(NULL_BRUSH))
@@ -422,13 +409,13 @@ TEST(Raster, fillsOutlinesAndLinesMatchThePixelModel)
                     if (x == l || x == r - 1 || y == t || y == bottom - 1)
                         mark(x, y, ink, xorPen);
                 });
-            ASSERT_EQ(Rectangle(b->dc, c[0], c[1], c[2], c[3]), ok) << trace;
+            ASSERT_EQ(Rectangle(b->dc, c[0], c[1], c[2], c[3]), ok);
         } else {
             // Two joined lines, each without its end point: one pixel a step along the longer
             // axis, across it the pixel nearest the true line (a tie away from the start).
             MoveToEx(b->dc, c[0], c[1]);
             for (int end : { 2, 4 }) {
-                const bool ok = penOk({ c[size_t(end)], c[size_t(end) + 1], c[0], c[1] });
+                const bool ok = within({ c[size_t(end)], c[size_t(end) + 1], c[0], c[1] }, 1 << 20);
                 const qint64 dx = qint64(c[size_t(end)]) - c[0], dy = qint64(c[size_t(end) + 1]) - c[1];
                 const qint64 steps = std::max(std::abs(dx), std::abs(dy));
                 for (qint64 t = 0; ok && pen != GetStockObject(NULL_PEN) && t < steps; ++t) {
@@ -436,15 +423,15 @@ TEST(Raster, fillsOutlinesAndLinesMatchThePixelModel)
                         = [&](qint64 d) { return (2 * t * std::abs(d) + steps) / (2 * steps) * (d < 0 ? -1 : 1); };
                     mark(c[0] + across(dx), c[1] + across(dy), ink, xorPen);
                 }
-                ASSERT_EQ(LineTo(b->dc, c[size_t(end)], c[size_t(end) + 1]), ok) << trace;
+                ASSERT_EQ(LineTo(b->dc, c[size_t(end)], c[size_t(end) + 1]), ok);
                 if (ok)
                     c[0] = c[size_t(end)], c[1] = c[size_t(end) + 1];
             }
         }
         const int x = pick(rng, 0, b->width - 1), y = pick(rng, 0, b->height - 1);
         const quint32 shown = b->colorOf(b->value(x, y));
-        EXPECT_EQ(GetPixel(b->dc, x, y), (shown & 0xFF) << 16 | (shown & 0xFF00) | (shown >> 16 & 0xFF)) << trace;
-        ASSERT_EQ(mismatch(*b, want, before, 0), "") << trace;
+        EXPECT_EQ(GetPixel(b->dc, x, y), (shown & 0xFF) << 16 | (shown & 0xFF00) | (shown >> 16 & 0xFF));
+        ASSERT_EQ(mismatch(*b, want, before, 0), "");
         SelectObject(b->dc, GetStockObject(BLACK_PEN));
         SelectObject(b->dc, GetStockObject(WHITE_BRUSH));
         DeleteObject(pen);
