@@ -81,7 +81,7 @@ TEST(PngPaint, drawsNothingWithoutWhatItNeedsOrWhollyBesideTheTarget)
 {
     static constexpr quint32 untouched = 0xFF123456u;
     TestBitmap target(10, 10, 32);
-    target.fill(untouched, 10, 32);
+    target.fill(untouched);
     const auto expectUntouched = [&target](const std::string &what) {
         for (int y = 0; y < 10; ++y)
             ASSERT_EQ(gdi::test::rowOf(target, y, 10), gdi::test::Values(10, untouched)) << what << " row " << y;

@@ -65,9 +65,8 @@ public:
         uchar &byte = row(y)[x * bpp / 8];
         byte = uchar((byte & ~(((1u << bpp) - 1) << shift)) | (v & ((1u << bpp) - 1)) << shift);
     }
-    // Callers in other areas still pass the width and depth to fill; both are known here.
     quint32 argb(int x, int y) const { return value(x, y); }
-    void fill(quint32 v, int = 0, int = 0)
+    void fill(quint32 v)
     {
         for (int y = 0; y < height; ++y)
             for (int x = 0; x < width; ++x)
