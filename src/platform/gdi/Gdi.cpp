@@ -484,6 +484,9 @@ bool Rectangle(HDC hdc, int left, int top, int right, int bottom)
         outline.addLine(right - 1, top, right - 1, bottom - 1, pen.width);
         outline.addLine(right - 1, bottom - 1, left, bottom - 1, pen.width);
         outline.addLine(left, bottom - 1, left, top, pen.width);
+        // The edges of a one-pixel rectangle have no length; its outline is that pixel.
+        if (right - left == 1 && bottom - top == 1)
+            outline.addLine(left, top, right, top, pen.width);
         stroke(*dc, outline, pen.color);
     }
     return true;
