@@ -306,9 +306,16 @@ TEST_F(Accessibility, nifIsNamedByItsAccessibleNameLabelTooltipOrName)
         { [&] { (new QLabel("&NIF do titular:", &form))->setBuddy(nif); }, "NIF do titular:" },
         { [&] { nif->setAccessibleName("NIF do cônjuge"); }, "NIF do cônjuge" },
     };
-    for (const auto &[step, name] : steps) {
+    auto *other = new QLineEdit(&form);
+    other->show();
+    QApplication::setActiveWindow(&form);
+    ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
+    for (const auto &[step, given] : steps) {
         step();
-        EXPECT_EQ(accessible(nif)->text(QAccessible::Name), name);
+        EXPECT_EQ(accessible(nif)->text(QAccessible::Name), given);
+        other->setFocus();
+        box(nif)->setFocus();
+        EXPECT_EQ(name(box(nif)), given) << "the box that takes the focus speaks for the control";
     }
 }
 

@@ -59,12 +59,18 @@ protected:
 
 } // namespace
 
-// The grey look is in the golden pictures; disabling must repaint even while hovered.
-TEST_F(GoButton, disablingShowsTheNormalPictureAndedOnGrey)
+// The grey look is in the golden pictures; disabling, the button or the form it is on, must
+// repaint even while hovered.
+TEST_F(GoButton, disabledByItselfOrItsFormShowsTheNormalPictureAndedOnGrey)
 {
+    constexpr platform::OleColor Greyed = 0x306048; // RGB(200, 100, 50) AND RGB(120, 120, 120)
     button->setHovering(true);
+    form.setEnabled(false);
+    EXPECT_EQ(centre(), Greyed);
+    form.setEnabled(true);
+    EXPECT_NE(centre(), Greyed);
     button->setEnabled(false);
-    EXPECT_EQ(centre(), 0x306048u) << "RGB(200, 100, 50) AND RGB(120, 120, 120)";
+    EXPECT_EQ(centre(), Greyed);
 }
 
 TEST_F(GoButton, keepsItselfSquare)

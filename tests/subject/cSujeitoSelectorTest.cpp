@@ -324,6 +324,7 @@ TEST_F(SubjectSelector, namesAndNumbersComeFromTheDeclaration)
     auto declaration = declarationWith({ { "D1", "234567813", "MARTA SOFIA FERREIRA LOPES" } });
     selector->setIRSClass(declaration.get());
     EXPECT_EQ(button('A')->Caption(), "Ana M. Lopes");
+    EXPECT_EQ(button('B')->accessibleName(), "Rui P. Lopes") << "a screen reader hears whom a button holds";
     EXPECT_EQ(selector->SelectedNIF(), "210345675");
     EXPECT_EQ(selector->SelectedNIF("B"), "198765436");
     click(u"D");
