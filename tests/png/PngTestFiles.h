@@ -30,7 +30,6 @@ struct ImageRecipe
 
     int channels() const { return colorType == 2 ? 3 : colorType == 4 ? 2 : colorType == 6 ? 4 : 1; }
     // Bytes of a pixel in the stream, at least 1.
-    int bytesPerPixel() const { return std::max(1, channels() * bitDepth / 8); }
 };
 
 // A file written by libpng with deterministic pseudo-random samples (every filter allowed).
