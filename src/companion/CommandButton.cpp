@@ -68,9 +68,9 @@ QSize CommandButton::sizeFor(const QString &text) const
         width = iconSize().width() + 4;
         height = iconSize().height();
     }
-    // An empty caption still gets the height and, without an icon, the width of "XXXX", as
-    // QPushButton measures it.
-    const QString measured = text.isEmpty() ? QStringLiteral("XXXX") : text;
+    // An empty caption still gets the height and, without an icon, the width of four capital
+    // X's, as QPushButton measures it.
+    const QString measured = text.isEmpty() ? QString(4, u'X') : text;
     const QSize textSize = fontMetrics().size(Qt::TextShowMnemonic, measured);
     if (!text.isEmpty() || width == 0)
         width += textSize.width();
