@@ -12,12 +12,7 @@
 using namespace zelctl;
 using namespace zelctl::stress;
 
-namespace {
-
-class DisabledParent : public ::testing::TestWithParam<std::string>
-{ };
-
-} // namespace
+using DisabledParent = ::testing::TestWithParam<std::string>;
 
 TEST_P(DisabledParent, looksAndActsDisabledAndKeepsItsOwnSetting)
 {

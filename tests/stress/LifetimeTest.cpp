@@ -11,12 +11,7 @@
 using namespace zelctl;
 using namespace zelctl::stress;
 
-namespace {
-
-class Lifetime : public ::testing::TestWithParam<std::string>
-{ };
-
-} // namespace
+using Lifetime = ::testing::TestWithParam<std::string>;
 
 TEST_P(Lifetime, theHostMayDeleteTheObjectInAnyOfItsEvents)
 {

@@ -14,12 +14,7 @@
 
 using namespace zelctl::stress;
 
-namespace {
-
-class RandomUse : public ::testing::TestWithParam<std::string>
-{ };
-
-} // namespace
+using RandomUse = ::testing::TestWithParam<std::string>;
 
 TEST_P(RandomUse, aCarelessHostBreaksNothing)
 {
