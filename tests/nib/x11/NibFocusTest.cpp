@@ -27,10 +27,7 @@ protected:
         column->addWidget(label);
         column->addWidget(nib = new cNIB);
         label->setBuddy(nib);
-    }
-
-    void showActive()
-    {
+        nib->setText(number);
         form.show();
         form.activateWindow();
         ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
@@ -48,8 +45,6 @@ protected:
 
 TEST_F(NibFocus, focusGivenToTheControlLandsInTheFirstBoxAndWritesMoveNone)
 {
-    nib->setText(number);
-    showActive();
     EXPECT_EQ(QApplication::focusWidget(), first) << "a form filled before it is shown opens where it would";
 
     nib->setFocus();
@@ -66,7 +61,6 @@ TEST_F(NibFocus, focusGivenToTheControlLandsInTheFirstBoxAndWritesMoveNone)
 
 TEST_F(NibFocus, deletedWhileOneOfItsBoxesHasTheFocus)
 {
-    showActive();
     box(2)->setFocus();
     QTest::keyClicks(box(2), "123");
     ASSERT_TRUE(box(2)->hasFocus());
