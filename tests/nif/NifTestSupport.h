@@ -1,23 +1,24 @@
 #pragma once
 
+#include "companion/CommandButton.h"
 #include "companion/JsonDeclaration.h"
 #include "companion/NIFGrabber.h"
+#include "nif/PopupMenuPresenter.h"
 #include "nif/cNIF.h"
 #include "platform/OleColor.h"
+#include "tips/clsBalloonTip.h"
 
+#include <QAction>
 #include <QApplication>
 #include <QHash>
 #include <QLineEdit>
 #include <QMenu>
-#include <QPalette>
-#include <QStringList>
+#include <QPointer>
 #include <QTest>
-
-#include <functional>
 
 #include <gtest/gtest.h>
 
-#include <memory>
+#include <functional>
 #include <ostream>
 
 // Readable texts in the test's messages.
@@ -29,7 +30,7 @@ inline void PrintTo(const QString &text, std::ostream *out)
 namespace zelctl::test {
 
 // A fetcher the test answers by hand: Fetch only records the number; answer() raises the
-// three events as a real fetch would, later. Field keys are compared exactly.
+// events a real fetch raises later: Starting, ReceivedInformation (unless data is empty), Finished.
 class ScriptedGrabber : public companion::NIFGrabber
 {
     Q_OBJECT
@@ -47,20 +48,32 @@ public:
         busy = true;
     }
 
-    // Starting, then (unless data is empty) ReceivedInformation for number, then Finished.
-    void answer(const QString &number, const QHash<QString, QString> &data);
+    void answer(const QString &number, const QHash<QString, QString> &data)
+    {
+        Q_EMIT Starting();
+        if (!data.isEmpty()) {
+            fields = data;
+            fields.insert(QStringLiteral("ID"), number);
+            Q_EMIT ReceivedInformation(number);
+        }
+        busy = false;
+        Q_EMIT Finished();
+    }
 
     QStringList fetched;
     bool busy = false;
     QHash<QString, QString> fields;
 };
 
-// Installs a factory of ScriptedGrabber for the controls made while it lives.
+// Controls made while it lives get a ScriptedGrabber.
 class ScriptedGrabberFactory
 {
 public:
-    ScriptedGrabberFactory();
-    ~ScriptedGrabberFactory();
+    ScriptedGrabberFactory()
+        : m_previous(
+            companion::setNIFGrabberFactory([this](QObject *parent) { return last = new ScriptedGrabber(parent); }))
+    { }
+    ~ScriptedGrabberFactory() { companion::setNIFGrabberFactory(std::move(m_previous)); }
     ScriptedGrabber *last = nullptr;
 
 private:
@@ -68,37 +81,41 @@ private:
 };
 
 // Calls `heard` with every event of a control, as "Name" or "Name:argument", in the order raised.
-void onEveryEvent(cNIF &control, const std::function<void(const QString &)> &heard);
-
-// Every event of a control, in the order raised.
-class EventLog
+inline void onEveryEvent(cNIF &control, const std::function<void(const QString &)> &heard)
 {
-public:
-    explicit EventLog(cNIF &control)
-    {
-        onEveryEvent(control, [this](const QString &event) { events << event; });
-    }
-    QStringList events;
-    int count(const QString &event) const { return int(events.count(event)); }
-    void clear() { events.clear(); }
-};
+    const std::pair<const char *, void (cNIF::*)()> plain[]
+        = { { "Changed", &cNIF::Changed }, { "Validated", &cNIF::Validated }, { "NIFIndicated", &cNIF::NIFIndicated },
+              { "Cleared", &cNIF::Cleared }, { "DataFinished", &cNIF::DataFinished } };
+    for (const auto &[name, signal] : plain)
+        QObject::connect(&control, signal, [heard, name] { heard(QString::fromLatin1(name)); });
+    QObject::connect(
+        &control, &cNIF::UpdatedInformation, [heard](const QString &id) { heard("UpdatedInformation:" + id); });
+    QObject::connect(&control, &cNIF::NameUpdated, [heard](const QString &name) { heard("NameUpdated:" + name); });
+}
 
-// Stands in for the user at the context menu: records what it offered and chooses the
-// entry named `choice` (when it is enabled), or runs `user` instead.
+// Stands in for the user at the context menu: records the enabled entries and chooses the
+// one named `choice` (when it is enabled), or runs `user` instead.
 class MenuChooser
 {
 public:
-    explicit MenuChooser(QString choice = {}, std::function<void()> user = {});
-    ~MenuChooser();
-    MenuChooser(const MenuChooser &) = delete;
-    MenuChooser &operator=(const MenuChooser &) = delete;
-
-    // Whether the entry was offered and enabled the last time.
-    bool offered(const QString &name) const;
+    explicit MenuChooser(QString choice = {}, std::function<void()> user = {})
+        : m_previous(setPopupMenuPresenter([this, choice, user](QMenu &menu, const QPoint &) {
+            ++shown;
+            offered.clear();
+            for (const QAction *action : menu.actions()) {
+                if (action->isEnabled())
+                    offered << action->objectName();
+            }
+            if (user)
+                return user();
+            if (offered.contains(choice))
+                menu.findChild<QAction *>(choice)->trigger();
+        }))
+    { }
+    ~MenuChooser() { setPopupMenuPresenter(std::move(m_previous)); }
 
     int shown = 0;
-    QStringList entries;
-    QString defaultEntry;
+    QStringList offered;
 
 private:
     std::function<void(QMenu &, const QPoint &)> m_previous;
@@ -122,34 +139,62 @@ inline void runDeferredDeletes()
     QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
 }
 
-inline platform::OleColor colourOf(QWidget *widget, QPalette::ColorRole role)
+inline platform::OleColor colour(cNIF &control, QPalette::ColorRole role = QPalette::Base)
 {
-    return platform::fromQColor(widget->palette().color(role));
-}
-inline platform::OleColor textColour(cNIF &control)
-{
-    return colourOf(entryBox(control), QPalette::Text);
-}
-inline platform::OleColor backColour(cNIF &control)
-{
-    return colourOf(entryBox(control), QPalette::Base);
+    return platform::fromQColor(entryBox(control)->palette().color(role));
 }
 inline platform::OleColor statusColour(cNIF &control)
 {
     return control.findChild<QWidget *>(QStringLiteral("Shape1"))->property("BorderColor").toUInt();
 }
-QString tipText(cNIF &control);
+inline QString tipText(cNIF &control)
+{
+    const auto *tip = control.findChild<clsBalloonTip *>(QStringLiteral("tip"));
+    return tip ? tip->TipText() : QStringLiteral("<no tip>");
+}
 
 // Clicks the record form's command button of that index (0 Apply, 1 OK, 2 Cancel, 3 public information).
-void press(const QWidget &form, int index);
+inline void press(const QWidget &form, int index)
+{
+    for (auto *button : form.findChildren<CommandButton *>()) {
+        if (button->Index() == index)
+            return QTest::mouseClick(button, Qt::LeftButton); // the click may delete the form
+    }
+}
 
 // A shown, active form holding a fresh control (focused) and another input to move focus to.
 class NifFixture : public ::testing::Test
 {
 protected:
-    void SetUp() override;
-    // A fresh control in place of the current one, focused.
-    void replaceControl();
+    void SetUp() override
+    {
+        form = new QWidget;
+        other = new QLineEdit(form);
+        other->move(0, 40);
+        form->show();
+        form->activateWindow(); // an X server activates on request
+        QApplication::setActiveWindow(form);
+        ASSERT_TRUE(QTest::qWaitForWindowActive(form));
+        replaceControl();
+    }
+
+    void TearDown() override
+    {
+        delete form.data();
+        runDeferredDeletes();
+    }
+
+    void replaceControl()
+    {
+        delete control.data();
+        control = new cNIF(form);
+        control->InitNew();
+        control->show();
+        box = entryBox(*control);
+        box->setFocus();
+        events.clear();
+        onEveryEvent(*control, [this](const QString &event) { events << event; });
+    }
 
     void type(const QString &text)
     {
@@ -165,23 +210,13 @@ protected:
     }
 
     ScriptedGrabberFactory grabbers;
-    QWidget form;
-    cNIF *control = nullptr;
+    QPointer<QWidget> form;
+    QPointer<cNIF> control;
     QLineEdit *other = nullptr;
     QLineEdit *box = nullptr;
-    std::unique_ptr<EventLog> log;
+    QStringList events; // every event of the control, in the order raised
     companion::JsonDeclaration declaration;
 };
-
-// A declaration's NIF information store.
-inline void storeInfo(companion::Declaration &declaration, const QString &key, const QString &value)
-{
-    declaration.DeclarationData().NifInfoStore().Write(key, value);
-}
-inline QString storedInfo(companion::Declaration &declaration, const QString &key)
-{
-    return declaration.DeclarationData().NifInfoStore().Read(key).toString();
-}
 
 // Valid Portuguese numbers.
 inline const QString AnaNif = QStringLiteral("210345675");

@@ -4,53 +4,42 @@
 
 #include <QClipboard>
 #include <QLabel>
-#include <QPointer>
-#include <QVBoxLayout>
 
 using namespace zelctl;
 using namespace zelctl::test;
 
-// Keyboard focus, activation and the X11 selection as a real X server gives them: a form
-// with a box, a label whose buddy is the control ("&NIF:", Alt+N), and the control.
+// Keyboard focus, activation and the X11 selection as a real X server gives them, with a
+// label whose buddy is the control ("&NIF:", Alt+N).
 namespace {
 
-class NifFocus : public ::testing::Test
+class NifFocus : public NifFixture
 {
 protected:
     void SetUp() override
     {
-        auto *column = new QVBoxLayout(&form);
-        column->addWidget(first = new QLineEdit);
-        auto *label = new QLabel(QStringLiteral("&NIF:"));
-        column->addWidget(label);
-        column->addWidget(control = new cNIF);
+        NifFixture::SetUp();
+        auto *label = new QLabel(QStringLiteral("&NIF:"), form);
+        label->move(0, 80);
         label->setBuddy(control);
-        form.show();
-        form.activateWindow();
-        ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
+        label->show();
+        other->setFocus();
     }
-
-    ScriptedGrabberFactory grabbers;
-    QWidget form;
-    QLineEdit *first = nullptr;
-    QPointer<cNIF> control;
 };
 
 } // namespace
 
 TEST_F(NifFocus, focusGivenToTheControlLandsInTheBoxAndWritesMoveNone)
 {
-    EXPECT_EQ(control->height(), 21) << "one line high in a column";
     control->setFocus();
-    EXPECT_EQ(QApplication::focusWidget(), entryBox(*control));
-    first->setFocus();
-    QTest::keyClick(first, Qt::Key_N, Qt::AltModifier);
-    EXPECT_EQ(QApplication::focusWidget(), entryBox(*control)) << "the label's mnemonic";
+    EXPECT_EQ(QApplication::focusWidget(), box);
+    other->setFocus();
+    QTest::keyClick(other, Qt::Key_N, Qt::AltModifier);
+    EXPECT_EQ(QApplication::focusWidget(), box) << "the label's mnemonic";
 
-    first->setFocus();
+    other->setFocus();
     control->setValue("PT" + PlainNif);
     control->setValue("ES12345678Z");
-    EXPECT_EQ(QApplication::focusWidget(), first) << "writing Value leaves the user's caret alone";
+    EXPECT_EQ(QApplication::focusWidget(), other) << "writing Value leaves the user's caret alone";
 }
 
 TEST_F(NifFocus, middleClickPastesTheSelectionWithItsCountry)
@@ -58,20 +47,20 @@ TEST_F(NifFocus, middleClickPastesTheSelectionWithItsCountry)
     QClipboard *clipboard = QGuiApplication::clipboard();
     ASSERT_TRUE(clipboard->supportsSelection());
     clipboard->setText(QStringLiteral("ES12345678Z"), QClipboard::Selection);
-    QTest::mouseClick(entryBox(*control), Qt::MiddleButton);
+    QTest::mouseClick(box, Qt::MiddleButton);
     EXPECT_EQ(control->CountryID(), "ES");
-    EXPECT_EQ(entryBox(*control)->text(), "12345678Z") << "nothing lost to the Portuguese limit";
+    EXPECT_EQ(box->text(), "12345678Z") << "nothing lost to the Portuguese limit";
 
     control->setLocked(true);
     clipboard->setText(PlainNif, QClipboard::Selection);
-    QTest::mouseClick(entryBox(*control), Qt::MiddleButton);
+    QTest::mouseClick(box, Qt::MiddleButton);
     EXPECT_EQ(control->Value(), "ES12345678Z") << "a locked box takes no paste";
 }
 
 TEST_F(NifFocus, deletedWhileItsBoxOrItsRecordFormHasTheFocus)
 {
     control->setValue("PT" + PlainNif);
-    QPointer<frmEditNIF> editor = new frmEditNIF(&form);
+    QPointer<frmEditNIF> editor = new frmEditNIF(form);
     editor->SetNIFControl(control);
     editor->show();
     editor->activateWindow();
@@ -83,13 +72,12 @@ TEST_F(NifFocus, deletedWhileItsBoxOrItsRecordFormHasTheFocus)
     QTest::keyClicks(name, "NOVO");
     delete editor.data();
 
-    form.activateWindow();
-    ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
-    QLineEdit *box = entryBox(*control);
+    form->activateWindow();
+    ASSERT_TRUE(QTest::qWaitForWindowActive(form));
     box->setFocus();
-    ASSERT_TRUE(QTest::qWaitFor([box] { return box->hasFocus(); }));
+    ASSERT_TRUE(QTest::qWaitFor([this] { return box->hasFocus(); }));
     QTest::keyClicks(box, "1");
     delete control.data();
-    QTest::keyClicks(first, "ok");
-    EXPECT_EQ(first->text(), "ok") << "the form lives on";
+    QTest::keyClicks(other, "ok");
+    EXPECT_EQ(other->text(), "ok") << "the form lives on";
 }
