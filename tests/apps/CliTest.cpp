@@ -21,12 +21,7 @@ namespace {
 class Cli : public LookupFixture
 {
 protected:
-    QString written(const QString &name, const QByteArray &bytes)
-    {
-        QFile file(folder.filePath(name));
-        EXPECT_TRUE(file.open(QIODevice::WriteOnly) && file.write(bytes) == bytes.size());
-        return file.fileName();
-    }
+    QString written(const QString &name, const QByteArray &bytes) { return writeFile(folder.filePath(name), bytes); }
 };
 
 // A number nobody else in this program looks up, so the user's cache holds only what these

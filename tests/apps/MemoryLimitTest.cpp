@@ -15,7 +15,6 @@ using namespace zelctl::test;
 TEST(MemoryLimit, everyCommandStaysWithinTheDecodersCapsOnItsWorstInputs)
 {
     QTemporaryDir dir;
-    const QString cli = QStringLiteral(ZELCTL_CLI_FILE);
     const QString pam = dir.filePath("out.pam");
     const struct
     {
@@ -24,29 +23,26 @@ TEST(MemoryLimit, everyCommandStaysWithinTheDecodersCapsOnItsWorstInputs)
         int exitCode;
         const char *says;
     } cases[] = {
-        { "gif-info /dev/zero", runLimited(cli, { "gif-info", "/dev/zero" }), 1, "is not a regular file" },
-        { "png-info /dev/zero", runLimited(cli, { "png-info", "/dev/zero" }), 1, "is not a regular file" },
-        { "png-decode /dev/zero", runLimited(cli, { "png-decode", "/dev/zero", pam }), 1, "is not a regular file" },
+        { "gif-info /dev/zero", runCli({ "gif-info", "/dev/zero" }), 1, "is not a regular file" },
+        { "png-info /dev/zero", runCli({ "png-info", "/dev/zero" }), 1, "is not a regular file" },
+        { "png-decode /dev/zero", runCli({ "png-decode", "/dev/zero", pam }), 1, "is not a regular file" },
         { "gif-info on an endless pipe",
-            runShellLimited(R"(cat /dev/zero 2>/dev/null | exec "$0" gif-info --hash /dev/stdin)"), 1,
+            runShell(R"(cat /dev/zero 2>/dev/null | exec "$0" gif-info --hash /dev/stdin)"), 1,
             "is larger than 268435456 bytes" },
-        { "png-info on an endless pipe",
-            runShellLimited(R"(cat /dev/zero 2>/dev/null | exec "$0" png-info /dev/stdin)"), 1,
+        { "png-info on an endless pipe", runShell(R"(cat /dev/zero 2>/dev/null | exec "$0" png-info /dev/stdin)"), 1,
             "is larger than 268435456 bytes" },
         { "png-decode on an endless pipe",
-            runShellLimited(
-                QStringLiteral(R"(cat /dev/zero 2>/dev/null | exec "$0" png-decode /dev/stdin %1)").arg(pam)),
-            1, "is larger than 268435456 bytes" },
+            runShell(QStringLiteral(R"(cat /dev/zero 2>/dev/null | exec "$0" png-decode /dev/stdin %1)").arg(pam)), 1,
+            "is larger than 268435456 bytes" },
         { "gif-info, a 65535 × 65535 frame in 35 bytes",
-            runLimited(cli, { "gif-info", "--hash", testDataPath("gif/huge-frame.gif") }), 1,
+            runCli({ "gif-info", "--hash", testDataPath("gif/huge-frame.gif") }), 1,
             "holds no GIF frame that can be shown" },
         { "gif-info, 1,000 frames of 16384 × 16384",
-            runLimited(cli, { "gif-info", "--hash", testDataPath("gif/thousand-huge-frames.gif") }), 1,
+            runCli({ "gif-info", "--hash", testDataPath("gif/thousand-huge-frames.gif") }), 1,
             "holds no GIF frame that can be shown" },
-        { "nif --batch, a line of 100 MB of NULs",
-            runShellLimited(R"(head -c 100000000 /dev/zero | exec "$0" nif --batch)"), 1,
-            "line 1: longer than 1024 bytes" },
-        { "gallery --form /dev/zero", runLimited(ZELCTL_GALLERY_FILE, { "--form", "/dev/zero" }), 1,
+        { "nif --batch, a line of 100 MB of NULs", runShell(R"(head -c 100000000 /dev/zero | exec "$0" nif --batch)"),
+            1, "line 1: longer than 1024 bytes" },
+        { "gallery --form /dev/zero", runProgram(ZELCTL_GALLERY_FILE, { "--form", "/dev/zero" }), 1,
             "não é um ficheiro comum" },
     };
     for (const auto &c : cases) {
@@ -58,7 +54,7 @@ TEST(MemoryLimit, everyCommandStaysWithinTheDecodersCapsOnItsWorstInputs)
     }
 
     // The largest strip a GIF may fill (16 frames of 4096 × 4096), hashed whole.
-    const ProgramRun strip = runLimited(cli, { "gif-info", "--hash", testDataPath("gif/strip-limit.gif") });
+    const ProgramRun strip = runCli({ "gif-info", "--hash", testDataPath("gif/strip-limit.gif") });
     EXPECT_EQ(strip.exitCode, 0) << strip.err.toStdString();
     EXPECT_EQ(strip.out.count(" damaged hash "), 16);
     EXPECT_LT(strip.peakBytes, MemoryLimit);

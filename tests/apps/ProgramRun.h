@@ -13,7 +13,8 @@ struct ProgramRun
     int exitCode = -1;
     QByteArray out;
     QByteArray err;
-    // The most memory it held at once (resident; under AddressSanitizer its shadow too).
+    // The most memory any program run so far held at once (resident; under AddressSanitizer
+    // its shadow too), so at least this run's peak.
     qint64 peakBytes = 0;
 };
 
@@ -21,17 +22,21 @@ struct ProgramRun
 // own caps and no more.
 inline constexpr qint64 MemoryLimit = qint64(1536) << 20;
 
-// Runs program with args and standard input from stdinPath, limited to MemoryLimit: its
-// address space by setrlimit, or, in a build with AddressSanitizer (which reserves terabytes
-// of address space for its shadow), its resident memory through the sanitizer's own limit.
-// A program that goes beyond ends with an error instead of its own answer.
-ProgramRun runLimited(const QString &program, const QStringList &args, const QString &stdinPath = "/dev/null");
+// Runs program with args and input on its standard input while this process's event loop
+// turns (a test may serve the program from it), limited to MemoryLimit: a program that goes
+// beyond ends with an error instead of its own answer.
+ProgramRun runProgram(const QString &program, const QStringList &args, const QByteArray &input = {});
+
+inline ProgramRun runCli(const QStringList &args, const QByteArray &input = {})
+{
+    return runProgram(QStringLiteral(ZELCTL_CLI_FILE), args, input);
+}
 
 // Runs a shell command line the same way; "$0" in it is the zelctl tool.
-ProgramRun runShellLimited(const QString &commandLine);
-
-// Runs the zelctl tool with args and input on its standard input while this process's event
-// loop turns (a test may serve the tool from it). No peak memory is measured.
-ProgramRun runCli(const QStringList &args, const QByteArray &input = {});
+inline ProgramRun runShell(const QString &commandLine)
+{
+    return runProgram(
+        QStringLiteral("/bin/sh"), { QStringLiteral("-c"), commandLine, QStringLiteral(ZELCTL_CLI_FILE) });
+}
 
 } // namespace zelctl::test

@@ -1,8 +1,7 @@
-// The stress host's machinery and its main: private settings and data folders and the
-// source tree as root, as in every test program, but with the library's real menus, modal
-// forms and message boxes, which a watcher dismisses.
-
-#include "StressHost.h"
+// The stress host: a host that uses every class of the library as careless real hosts do,
+// at random but from a seed, journaling each step so that a failure can be replayed. Its
+// main is every test program's, but with the library's real menus, modal forms and message
+// boxes, which a watcher dismisses.
 
 #include "support/TestSupport.h"
 
@@ -21,14 +20,16 @@
 #include <QApplication>
 #include <QClipboard>
 #include <QCursor>
+#include <QDebug>
 #include <QDialog>
 #include <QDir>
+#include <QElapsedTimer>
+#include <QLineEdit>
 #include <QMetaProperty>
 #include <QMouseEvent>
 #include <QSignalSpy>
 #include <QTemporaryDir>
 #include <QTest>
-#include <QTimer>
 #include <QVBoxLayout>
 #include <QWheelEvent>
 #include <QWindow>
@@ -39,14 +40,16 @@
 #include <sanitizer/common_interface_defs.h>
 #endif
 
-#include <atomic>
 #include <bit>
 #include <climits>
 #include <cmath>
+#include <csignal>
 #include <cstdio>
+#include <functional>
 #include <numeric>
 #include <random>
-#include <thread>
+
+#include <unistd.h>
 
 using namespace Qt::StringLiterals;
 
@@ -54,47 +57,27 @@ namespace zelctl::stress {
 
 namespace {
 
-struct Random : std::mt19937_64
-{
-    using std::mt19937_64::mt19937_64;
-    // 0 .. n-1 (n > 0).
-    int below(int n) { return int((*this)() % quint64(n)); }
-    bool chance(double p) { return double((*this)() % 1000000) < p * 1000000.0; }
-    template <typename T> const T &pick(const std::vector<T> &from) { return from[size_t(below(int(from.size())))]; }
-};
-
-qint64 nowMs()
-{
-    using namespace std::chrono;
-    return duration_cast<milliseconds>(steady_clock::now().time_since_epoch()).count();
-}
-
-// The steps of the episode that runs now, printed when it fails, also from a sanitizer's
-// report or from a watchdog that sees no progress.
+// The steps of the episode that runs now, printed when it fails, crashes or hangs.
 struct Journal
 {
-    void begin(const QString &className, quint64 seed)
+    // The episode's name, and what runs it again.
+    void begin(const QString &name, const QString &filter, const QString &replaying = {})
     {
-        const QString platform = QGuiApplication::platformName();
-        episode = u"%1, seed %2, on %3"_s.arg(className).arg(seed).arg(platform);
-        command = u"ZELCTL_STRESS_REPLAY=%1:%2 QT_QPA_PLATFORM=%3"_s.arg(className).arg(seed).arg(platform);
+        episode = name;
+        command = u"%1 QT_QPA_PLATFORM=%2 tests/test_stress --gtest_filter='%3'"_s.arg(
+            replaying, QGuiApplication::platformName(), filter);
         steps.clear();
-        lastStep = nowMs();
-        // The last of these lines names the episode to replay when a sanitizer stops the
-        // process without calling back (UBSan has a runtime of its own).
+        // Names the episode also when UBSan, which does not call back, stops the process.
         std::fprintf(stderr, "[ episode  ] %s\n", qPrintable(episode));
     }
 
     void note(const QString &step)
     {
-        // A step that took long is named, so a long run shows where its time went.
-        if (const qint64 took = nowMs() - lastStep; lastStep != 0 && took > 2000 && !steps.isEmpty())
-            std::fprintf(stderr, "[ slow     ] %s: %lld ms in step %lld, %s\n", qPrintable(episode), took, steps.size(),
-                qPrintable(steps.last()));
         steps << step;
         if (echo)
             std::fprintf(stderr, "  %lld. %s\n", steps.size(), qPrintable(step));
-        lastStep = nowMs();
+        // A step still running in two minutes hangs: the alarm prints the journal.
+        ::alarm(120);
     }
 
     QString replay() const
@@ -102,14 +85,12 @@ struct Journal
         QString text = u"stress host: %1, after these steps:\n"_s.arg(episode);
         for (qsizetype i = 0; i < steps.size(); ++i)
             text += u"  %1. %2\n"_s.arg(i + 1).arg(steps[i]);
-        return text + u"replay: %1 tests/test_stress --gtest_filter='EveryClass/RandomUse.*'\n"_s.arg(command);
+        return text + u"replay:%1\n"_s.arg(command);
     }
 
     QString episode, command;
     QStringList steps;
     bool echo = false;
-    // When the last step began; 0 while no episode runs and the watchdog rests.
-    std::atomic<qint64> lastStep { 0 };
 } journal;
 
 void printJournal()
@@ -117,21 +98,16 @@ void printJournal()
     std::fputs(qPrintable(journal.replay()), stderr);
 }
 
-void watchForHangs(qint64 limitMs)
+void watchForHangs()
 {
 #if defined(__SANITIZE_ADDRESS__)
     __sanitizer_set_death_callback(printJournal);
 #endif
-    std::thread([limitMs] {
-        for (;;) {
-            std::this_thread::sleep_for(std::chrono::seconds(1));
-            if (const qint64 last = journal.lastStep; last != 0 && nowMs() - last > limitMs) {
-                std::fprintf(stderr, "stress host: no progress for %lld s\n", limitMs / 1000);
-                printJournal();
-                std::abort();
-            }
-        }
-    }).detach();
+    std::signal(SIGALRM, [](int) {
+        std::fputs("stress host: a step made no progress for 120 s\n", stderr);
+        printJournal();
+        std::abort();
+    });
 }
 
 bool declaredByTheLibrary(const QMetaObject *meta)
@@ -139,17 +115,14 @@ bool declaredByTheLibrary(const QMetaObject *meta)
     return QByteArray(meta->className()).startsWith("zelctl::");
 }
 
+// A value as the journal shows it, cut short.
 QString shortly(const QVariant &value)
 {
-    const int id = value.metaType().id();
-    QString text = id == QMetaType::QByteArray ? u"%1 bytes"_s.arg(value.toByteArray().size())
-        : id == QMetaType::QSize               ? u"%1 x %2"_s.arg(value.toSize().width()).arg(value.toSize().height())
-                                               : value.toString();
-    if (text.isEmpty() && value.isValid() && !value.canConvert<QString>())
-        text = QLatin1String(value.typeName());
-    if (text.size() > 40)
-        text = text.left(37) + u"... (%1 characters)"_s.arg(text.size());
-    return u"\"%1\""_s.arg(text.replace(u'\n', "\\n"_L1));
+    if (value.metaType().id() == QMetaType::QByteArray)
+        return u"%1 bytes"_s.arg(value.toByteArray().size());
+    QString text;
+    QDebug(&text).nospace() << value;
+    return text.size() > 60 ? text.left(57) + u"... (%1 characters)"_s.arg(text.size()) : text;
 }
 
 QString describe(const QWidget *widget)
@@ -157,8 +130,7 @@ QString describe(const QWidget *widget)
     return (QLatin1String(widget->metaObject()->className()) + u' ' + widget->objectName()).trimmed();
 }
 
-// The text a key press carries, as a keyboard gives it; QTest's own table stops the
-// process on keys it does not know.
+// The text a key press carries, as a keyboard gives it (QTest aborts on keys it does not know).
 QString keyText(Qt::Key key, Qt::KeyboardModifiers modifiers)
 {
     static const QHash<int, QString> controls = { { Qt::Key_Return, u"\r"_s }, { Qt::Key_Enter, u"\r"_s },
@@ -174,17 +146,15 @@ QString keyText(Qt::Key key, Qt::KeyboardModifiers modifiers)
 
 int unsafeDepth = 0;
 
-// Input events of the library's widgets and of the inner boxes of its controls (the text
-// boxes of the NIF and NIB boxes), timers and queued calls are safe: the library keeps
-// alive whatever of it their code still uses.
+// Input events of the library's widgets and their inner boxes, timers and queued calls are
+// safe: the library keeps alive whatever of it their code still uses.
 bool safeToDeleteIn(const QWidget *receiver, const QEvent *event)
 {
     static const QList<QEvent::Type> safe = { QEvent::MouseButtonPress, QEvent::MouseButtonDblClick,
         QEvent::MouseButtonRelease, QEvent::MouseMove, QEvent::KeyPress, QEvent::KeyRelease, QEvent::Wheel,
         QEvent::Timer, QEvent::MetaCall, QEvent::ContextMenu };
     const QEvent::Type type = event->type();
-    // Qt follows a right-button press with a context menu event to the same widget, through
-    // a plain pointer.
+    // Qt follows a right-button press with a context menu event through a plain pointer.
     if (!safe.contains(type)
         || ((type == QEvent::MouseButtonPress || type == QEvent::MouseButtonDblClick)
             && static_cast<const QMouseEvent *>(event)->button() == Qt::RightButton))
@@ -208,6 +178,57 @@ public:
         unsafeDepth -= unsafe;
         return handled;
     }
+};
+
+// Whether Qt is delivering an event after which Qt itself still touches the widget (paint,
+// show, focus, a right-button press...): a handler inside one may only delete it later.
+bool insideUnsafeEvent()
+{
+    return unsafeDepth > 0;
+}
+
+// Runs an action whenever an object raises a signal chosen at run time, as a host's
+// late-bound event handler does.
+class SignalHook : public QObject
+{
+    Q_OBJECT
+
+public:
+    SignalHook(QObject *sender, const QMetaMethod &signal, std::function<void()> action)
+        : m_action(std::move(action))
+    {
+        connect(sender, signal, this, staticMetaObject.method(staticMetaObject.indexOfSlot("fire()")));
+    }
+
+private Q_SLOTS:
+    void fire() { m_action(); }
+
+private:
+    std::function<void()> m_action;
+};
+
+// The public signals (events) or methods that the library's classes declare.
+std::vector<QMetaMethod> membersOf(const QObject *object, QMetaMethod::MethodType kind)
+{
+    std::vector<QMetaMethod> found;
+    const QMetaObject *meta = object->metaObject();
+    for (int i = 0; i < meta->methodCount(); ++i) {
+        const QMetaMethod method = meta->method(i);
+        // propertyChanged is the container's bookkeeping, not an event a host handles.
+        if (method.methodType() == kind && method.access() == QMetaMethod::Public
+            && declaredByTheLibrary(method.enclosingMetaObject()) && method.name() != "propertyChanged")
+            found.push_back(method);
+    }
+    return found;
+}
+
+struct Random : std::mt19937_64
+{
+    using std::mt19937_64::mt19937_64;
+    // 0 .. n-1 (n > 0).
+    int below(int n) { return int((*this)() % quint64(n)); }
+    bool chance(double p) { return double((*this)() % 1000000) < p * 1000000.0; }
+    template <typename T> const T &pick(const std::vector<T> &from) { return from[size_t(below(int(from.size())))]; }
 };
 
 // Values for every type a member of the library takes: ordinary, boundary and hostile.
@@ -240,59 +261,48 @@ public:
 
     Values(const Values &) = delete;
 
-    // A value of the metatype; `name` (of a parameter or property) steers handles, colours
-    // and files towards meaningful ones.
+    // `name` (of a parameter or property) steers handles, colours and files to meaningful ones.
     QVariant make(QMetaType type, const QByteArray &name)
     {
         static const QList<int> integers
             = { QMetaType::Short, QMetaType::UShort, QMetaType::Int, QMetaType::UInt, QMetaType::Long, QMetaType::ULong,
                   QMetaType::LongLong, QMetaType::ULongLong, QMetaType::UChar, QMetaType::Char, QMetaType::SChar };
         static const std::vector<double> reals = { 0.0, -1.0, 0.5, 1.0, 2.2, 100.0, 1e308, -1e308, std::nan("") };
+        static const std::vector<QSize> sizes = { QSize(0, 0), QSize(1, 1), QSize(2, 3), QSize(17, 9), QSize(300, 40),
+            QSize(40, 300), QSize(3000, 2000), QSize(70000, 4), QSize(4, 70000) };
         const QByteArray lower = name.toLower();
         const auto named = [&](std::initializer_list<const char *> words) {
-            return std::any_of(words.begin(), words.end(), [&](const char *word) { return lower.contains(word); });
+            return m_random.chance(0.8)
+                && std::any_of(words.begin(), words.end(), [&](const char *word) { return lower.contains(word); });
         };
-        QVariant result;
-        if (type.id() == QMetaType::Bool) {
-            return m_random.chance(0.5);
-        } else if (integers.contains(type.id()) || type.flags().testFlag(QMetaType::IsEnumeration)) {
-            qint64 value = integer();
-            if ((named({ "hdc" }) || name.endsWith("DC")) && m_random.chance(0.8))
-                value = m_random.pick(m_devices);
-            else if (named({ "hwnd" }) && !windows.empty() && m_random.chance(0.8))
-                value = m_random.pick(windows);
-            else if (named({ "color", "colour", "back", "fore", "ground" }) && m_random.chance(0.8))
-                value = color();
-            result = value;
-        } else if (type.id() == QMetaType::Double || type.id() == QMetaType::Float) {
-            result = m_random.pick(reals);
-        } else if (type.id() == QMetaType::QString) {
-            return named({ "file", "path", "image" }) || m_random.chance(0.05) ? file() : text();
-        } else if (type.id() == QMetaType::QSize) {
-            static const std::vector<QSize> sizes = { QSize(0, 0), QSize(1, 1), QSize(2, 3), QSize(17, 9),
-                QSize(300, 40), QSize(40, 300), QSize(3000, 2000), QSize(70000, 4), QSize(4, 70000) };
-            return m_random.chance(0.5) ? m_random.pick(sizes) : QSize(m_random.below(600), m_random.below(400));
-        } else if (type.id() == QMetaType::QByteArray) {
-            QFile source(file());
-            if (m_random.chance(0.7) && source.open(QIODevice::ReadOnly))
-                return source.read(1 << 20);
-            QByteArray garbage(m_random.below(64), '\0');
-            for (char &c : garbage)
-                c = char(m_random.below(256));
-            return garbage;
-        } else if (type.id() == QMetaType::QVariant) {
+        QVariant value;
+        if (type.id() == QMetaType::Bool)
+            value = m_random.chance(0.5);
+        else if (integers.contains(type.id()) || type.flags().testFlag(QMetaType::IsEnumeration))
+            value = named({ "hdc" }) || (name.endsWith("DC") && m_random.chance(0.8)) ? m_random.pick(m_devices)
+                : named({ "hwnd" }) && !windows.empty()                               ? m_random.pick(windows)
+                : named({ "color", "colour", "back", "fore", "ground" })              ? qint64(color())
+                                                                                      : integer();
+        else if (type.id() == QMetaType::Double || type.id() == QMetaType::Float)
+            value = m_random.pick(reals);
+        else if (type.id() == QMetaType::QString)
+            value = named({ "file", "path", "image" }) || m_random.chance(0.05) ? file() : text();
+        else if (type.id() == QMetaType::QSize)
+            value = m_random.chance(0.5) ? m_random.pick(sizes) : QSize(m_random.below(600), m_random.below(400));
+        else if (type.id() == QMetaType::QByteArray)
+            value = bytes();
+        else if (type.id() == QMetaType::QVariant)
             return m_random.chance(0.5) ? QVariant(text()) : QVariant(integer());
-        } else if (type.id() == QMetaType::QFont) {
-            return QFont(u"Liberation Sans"_s, m_random.pick(std::vector<int> { 1, 6, 8, 11, 72, 400 }),
+        else if (type.id() == QMetaType::QFont)
+            value = QFont(u"Liberation Sans"_s, m_random.pick(std::vector<int> { 1, 6, 8, 11, 72, 400 }),
                 m_random.chance(0.5) ? QFont::Bold : QFont::Normal);
-        } else if (type == QMetaType::fromType<QList<qint32>>()) {
+        else if (type == QMetaType::fromType<QList<qint32>>()) {
             QList<qint32> list(m_random.below(300));
-            for (qint32 &entry : list)
-                entry = qint32(integer());
-            return QVariant::fromValue(list);
-        } else if (type == QMetaType::fromType<Picture>()) {
-            return QVariant::fromValue(m_random.chance(0.2) ? Picture() : Picture::fromFile(file()));
-        } else if (type == QMetaType::fromType<GFXSelection>()) {
+            std::generate(list.begin(), list.end(), [this] { return qint32(integer()); });
+            value = QVariant::fromValue(list);
+        } else if (type == QMetaType::fromType<Picture>())
+            value = QVariant::fromValue(m_random.chance(0.2) ? Picture() : Picture::fromFile(file()));
+        else if (type == QMetaType::fromType<GFXSelection>()) {
             GFXSelection selection;
             selection.Title = text();
             selection.Subtitle = text();
@@ -300,7 +310,7 @@ public:
             if (!objects.empty() && m_random.chance(0.7))
                 selection.ParentObj = m_random.pick(objects).data();
             selection.WindowPositionRelation = GFXPositioning(m_random.below(12) - 1);
-            return QVariant::fromValue(selection);
+            value = QVariant::fromValue(selection);
         } else if (type == QMetaType::fromType<QList<GFXItem>>()) {
             QList<GFXItem> items(m_random.below(m_random.chance(0.1) ? 200 : 8));
             for (GFXItem &item : items) {
@@ -311,9 +321,9 @@ public:
                 item.Default = m_random.chance(0.2);
                 item.Value = text();
             }
-            return QVariant::fromValue(items);
+            value = QVariant::fromValue(items);
         }
-        return result.convert(type) ? result : QVariant(type);
+        return value.convert(type) ? value : QVariant(type);
     }
 
     QString text()
@@ -341,6 +351,18 @@ public:
     std::vector<QPointer<QObject>> objects;
 
 private:
+    // A file's first megabyte, or garbage.
+    QByteArray bytes()
+    {
+        QFile source(file());
+        if (m_random.chance(0.7) && source.open(QIODevice::ReadOnly))
+            return source.read(1 << 20);
+        QByteArray garbage(m_random.below(64), '\0');
+        for (char &c : garbage)
+            c = char(m_random.below(256));
+        return garbage;
+    }
+
     qint64 integer()
     {
         static const std::vector<qint64> boundaries = { 0, 1, -1, 2, 3, 4, 5, 9, 10, 15, 99, 100, 255, 256, 1000, 32767,
@@ -382,6 +404,127 @@ private:
     std::vector<qint32> m_bitmaps;
 };
 
+// Closes the menus, modal forms and message boxes a step left open, after pressing a few of
+// their keys and buttons.
+class Watcher : public QObject
+{
+public:
+    explicit Watcher(quint64 seed)
+        : m_random(seed)
+    {
+        startTimer(10);
+    }
+
+    std::function<void()> onModal;
+
+private:
+    void timerEvent(QTimerEvent *) override
+    {
+        QWidget *open
+            = QApplication::activePopupWidget() ? QApplication::activePopupWidget() : QApplication::activeModalWidget();
+        m_ticks = open ? m_ticks + 1 : 0;
+        const QPointer<QWidget> guard(open);
+        if (m_ticks == 1 && onModal)
+            std::exchange(onModal, nullptr)();
+        if (!guard)
+            return;
+        // Queued: a form this opens must not run inside this timer's event, which it blocks.
+        if (m_ticks < 5 && m_random.chance(0.6)) {
+            QList<QAbstractButton *> buttons = open->findChildren<QAbstractButton *>();
+            buttons.removeIf([](QAbstractButton *button) { return !button->isVisible() || !button->isEnabled(); });
+            if (!buttons.isEmpty() && m_random.chance(0.5)) {
+                QAbstractButton *button = buttons.at(m_random.below(int(buttons.size())));
+                journal.note(u"watcher clicks %1 \"%2\" in %3"_s.arg(describe(button), button->text(), describe(open)));
+                return void(QMetaObject::invokeMethod(button, &QAbstractButton::click, Qt::QueuedConnection));
+            }
+            static const std::vector<Qt::Key> keys = { Qt::Key_Down, Qt::Key_Up, Qt::Key_Tab, Qt::Key_Space,
+                Qt::Key_Return, Qt::Key_Escape, Qt::Key_Right };
+            const Qt::Key key = m_random.pick(keys);
+            journal.note(u"watcher presses %1 in %2"_s.arg(QKeySequence(key).toString(), describe(open)));
+            return void(QMetaObject::invokeMethod(
+                open, [open, key] { QTest::sendKeyEvent(QTest::Click, open, key, keyText(key, {}), {}); },
+                Qt::QueuedConnection));
+        }
+        journal.note(u"watcher closes %1"_s.arg(describe(open)));
+        if (auto *dialog = qobject_cast<QDialog *>(open))
+            dialog->reject();
+        else
+            open->close();
+    }
+
+    Random m_random;
+    int m_ticks = 0;
+};
+
+// A host's form: a text box and, beside it, an object of the class; a watcher dismisses the
+// menus and modal forms the object opens. The form may die before the host.
+struct HostForm
+{
+    HostForm(const QString &className, quint64 seed)
+        : className(className)
+        , form(new QWidget)
+        , neighbour(new QLineEdit(form))
+        , random(seed)
+        , values(random)
+        , watcher(seed ^ 0x9E3779B97F4A7C15ull)
+    {
+        form->setObjectName(u"form"_s);
+        neighbour->setObjectName(u"neighbour"_s);
+        neighbour->setGeometry(0, 0, 120, 22);
+        values.objects.push_back(form.data());
+    }
+
+    // The object created by name, initialised as new, at 20,40 200 x 60 of a shown form.
+    HostForm(const QString &className, QSize size)
+        : HostForm(className, quint64(7))
+    {
+        journal.begin(className, u"EveryControl/DisabledParent.*/"_s + className);
+        form->resize(size);
+        object = CreateObject(className, form);
+        if (UserControl *created = control())
+            created->InitNew();
+        if (QWidget *created = widget())
+            created->setGeometry(20, 40, 200, 60);
+        form->show();
+        EXPECT_TRUE(QTest::qWaitForWindowExposed(form));
+    }
+
+    ~HostForm()
+    {
+        delete form.data();
+        ::alarm(0);
+    }
+
+    // Called once when a menu or modal form is open, before it is dismissed.
+    void onModal(std::function<void()> action) { watcher.onModal = std::move(action); }
+
+    // Whether the text box still takes typing, in the form enabled and shown again.
+    bool neighbourWorks()
+    {
+        form->setEnabled(true);
+        form->show();
+        neighbour->setFocus();
+        neighbour->clear();
+        QTest::keyClicks(neighbour, u"ok"_s);
+        return neighbour->text() == "ok"_L1;
+    }
+
+    QWindow *window() const { return form ? form->windowHandle() : nullptr; }
+    QWidget *widget() const { return qobject_cast<QWidget *>(object.data()); }
+    UserControl *control() const { return qobject_cast<UserControl *>(object.data()); }
+
+    QString className;
+    QPointer<QWidget> form;
+    QPointer<QLineEdit> neighbour;
+    QPointer<QObject> object;
+    Random random;
+    Values values;
+    Watcher watcher;
+    // What the steps found wrong; the locks the host holds on the library.
+    QStringList faults;
+    int locks = 0;
+};
+
 // Calls a method late-bound with arguments from `values`, noting the call in the journal.
 void call(QObject *object, const QMetaMethod &method, Values &values)
 {
@@ -402,195 +545,243 @@ void call(QObject *object, const QMetaMethod &method, Values &values)
     std::apply([&](auto... argument) { method.invoke(object, Qt::DirectConnection, returned, argument...); }, generic);
 }
 
-} // namespace
-
-// Closes whatever a step left open in a nested event loop (menus, modal forms, message
-// boxes), after pressing a few of their keys and buttons as a user would.
-class Watcher : public QObject
+// A part of the object, the object itself or the form.
+QWidget *target(HostForm &h)
 {
-public:
-    explicit Watcher(quint64 seed)
-        : m_random(seed)
-    {
-        m_timer.setInterval(10);
-        connect(&m_timer, &QTimer::timeout, this, &Watcher::look);
-        m_timer.start();
+    if (!h.widget() || h.random.chance(0.1))
+        return h.form;
+    QList<QWidget *> parts = h.widget()->findChildren<QWidget *>();
+    parts.removeIf([](QWidget *part) { return !part->isVisible() || part->isWindow(); });
+    return parts.isEmpty() || h.random.chance(0.4) ? h.widget() : parts.at(h.random.below(int(parts.size())));
+}
+
+QPoint pointIn(HostForm &h, QWidget *on)
+{
+    QPoint point(h.random.below(std::max(on->width(), 1)), h.random.below(std::max(on->height(), 1)));
+    if (h.random.chance(0.1))
+        point += QPoint(h.random.below(21) - 10, h.random.below(21) - 10);
+    return on->mapTo(on->window(), point);
+}
+
+void click(HostForm &h, QWidget *on, bool twice)
+{
+    static const std::vector<std::pair<Qt::MouseButton, const char *>> buttons
+        = { { Qt::LeftButton, "left" }, { Qt::RightButton, "right" }, { Qt::MiddleButton, "middle" } };
+    const int roll = h.random.below(20);
+    const auto [button, side] = buttons[roll < 15 ? 0 : roll < 19 ? 1 : 2];
+    const QPoint at = pointIn(h, on);
+    journal.note(
+        u"%1 %2 on %3 at %4,%5"_s.arg(twice ? "double-click" : "click", side, describe(on)).arg(at.x()).arg(at.y()));
+    // One double click is one Click (or Clicked) of a control that draws itself.
+    std::unique_ptr<QSignalSpy> clicks;
+    if (twice && on == h.object && button == Qt::LeftButton && !on->childAt(on->mapFrom(on->window(), at))) {
+        const QMetaObject *meta = h.object->metaObject();
+        if (const int index = std::max(meta->indexOfSignal("Click()"), meta->indexOfSignal("Clicked()")); index >= 0)
+            clicks = std::make_unique<QSignalSpy>(h.object.data(), meta->method(index));
     }
+    if (twice)
+        QTest::mouseDClick(h.window(), button, {}, at);
+    else
+        QTest::mouseClick(h.window(), button, {}, at);
+    if (clicks && h.object && clicks->count() > 1)
+        h.faults << u"a double click raised %1 Click events"_s.arg(clicks->count());
+}
 
-    std::function<void()> onModal;
+void write(HostForm &h, QObject *object, const QMetaProperty &property, const QString &owner)
+{
+    const QVariant value = h.values.make(property.metaType(), property.name());
+    journal.note(u"set %1%2 = %3"_s.arg(owner, QLatin1String(property.name()), shortly(value)));
+    property.write(object, value);
+}
 
-private:
-    void look()
-    {
-        QWidget *open
-            = QApplication::activePopupWidget() ? QApplication::activePopupWidget() : QApplication::activeModalWidget();
-        m_ticks = open ? m_ticks + 1 : 0;
-        const QPointer<QWidget> guard(open);
-        if (m_ticks == 1 && onModal)
-            std::exchange(onModal, nullptr)();
-        if (!guard)
-            return;
-        if (m_ticks < 5 && m_random.chance(0.6)) {
-            const QList<QAbstractButton *> buttons = open->findChildren<QAbstractButton *>();
-            if (!buttons.isEmpty() && m_random.chance(0.5)) {
-                QAbstractButton *button = buttons.at(m_random.below(int(buttons.size())));
-                if (button->isVisible() && button->isEnabled()) {
-                    journal.note(
-                        u"watcher clicks %1 \"%2\" in %3"_s.arg(describe(button), button->text(), describe(open)));
-                    // Queued: a form the click opens must not run inside this timer's own
-                    // slot, where the timer cannot fire again to close it.
-                    QMetaObject::invokeMethod(button, &QAbstractButton::click, Qt::QueuedConnection);
-                    return;
-                }
-            }
-            static const std::vector<Qt::Key> keys = { Qt::Key_Down, Qt::Key_Up, Qt::Key_Tab, Qt::Key_Space,
-                Qt::Key_Return, Qt::Key_Escape, Qt::Key_Right };
-            const Qt::Key key = m_random.pick(keys);
-            journal.note(u"watcher presses %1 in %2"_s.arg(QKeySequence(key).toString(), describe(open)));
-            QMetaObject::invokeMethod(
-                open, [open, key] { QTest::sendKeyEvent(QTest::Click, open, key, keyText(key, {}), {}); },
-                Qt::QueuedConnection);
-            return;
-        }
-        journal.note(u"watcher closes %1"_s.arg(describe(open)));
-        if (auto *dialog = qobject_cast<QDialog *>(open))
-            dialog->reject();
-        else
-            open->close();
-    }
+void lock(HostForm &h)
+{
+    journal.note(u"LockServer(true)"_s);
+    ClassFactory::LockServer(true);
+    ++h.locks;
+}
 
-    Random m_random;
-    QTimer m_timer;
-    int m_ticks = 0;
+struct StepKind
+{
+    int weight;
+    // A step a user takes by hand, not the host's code.
+    bool byUser;
+    void (*step)(HostForm &);
 };
 
-bool insideUnsafeEvent()
-{
-    return unsafeDepth > 0;
-}
-
-SignalHook::SignalHook(QObject *sender, const QMetaMethod &signal, std::function<void()> action)
-    : m_action(std::move(action))
-{
-    connect(sender, signal, this, staticMetaObject.method(staticMetaObject.indexOfSlot("fire()")));
-}
-
-std::vector<QMetaMethod> membersOf(const QObject *object, QMetaMethod::MethodType kind)
-{
-    std::vector<QMetaMethod> found;
-    const QMetaObject *meta = object->metaObject();
-    for (int i = 0; i < meta->methodCount(); ++i) {
-        const QMetaMethod method = meta->method(i);
-        // propertyChanged is the container's bookkeeping of a modified form, not an event of
-        // the control that a host handles.
-        if (method.methodType() == kind && method.access() == QMetaMethod::Public
-            && declaredByTheLibrary(method.enclosingMetaObject()) && method.name() != "propertyChanged")
-            found.push_back(method);
-    }
-    return found;
-}
-
-HostForm::HostForm(quint64 seed)
-    : form(new QWidget)
-    , neighbour(new QLineEdit(form))
-    , watcher(std::make_unique<Watcher>(seed))
-{
-    form->setObjectName(u"form"_s);
-    neighbour->setObjectName(u"neighbour"_s);
-    neighbour->setGeometry(0, 0, 120, 22);
-}
-
-HostForm::HostForm(const QString &className, QSize size)
-    : HostForm(7)
-{
-    journal.begin(className, 0);
-    form->resize(size);
-    object = CreateObject(className, form);
-    if (auto *control = qobject_cast<UserControl *>(object.data()))
-        control->InitNew();
-    if (auto *widget = qobject_cast<QWidget *>(object.data()))
-        widget->setGeometry(20, 40, 200, 60);
-    form->show();
-    EXPECT_TRUE(QTest::qWaitForWindowExposed(form));
-}
-
-HostForm::~HostForm()
-{
-    delete form.data();
-    journal.lastStep = 0;
-}
-
-void HostForm::onModal(std::function<void()> action)
-{
-    watcher->onModal = std::move(action);
-}
-
-bool HostForm::neighbourWorks()
-{
-    form->setEnabled(true);
-    form->show();
-    neighbour->setFocus();
-    neighbour->clear();
-    QTest::keyClicks(neighbour, u"ok"_s);
-    return neighbour->text() == "ok"_L1;
-}
-
-void HostForm::use(bool asHost)
-{
-    QWindow *window = form->windowHandle();
-    // Into the object itself: some controls keep a height of their own.
-    const auto *widget = qobject_cast<QWidget *>(object.data());
-    const QPoint centre = widget ? widget->geometry().center() : QPoint(120, 70);
-    Random random(1);
-    Values values(random);
-    values.objects.push_back(form.data());
-    std::vector<std::function<void()>> steps = {
-        [=] { QTest::mouseMove(window, centre); },
-        [=] { QTest::mouseMove(window, centre + QPoint(3, 2)); },
-        [=] { QTest::mouseClick(window, Qt::LeftButton, {}, centre); },
-        [=] { QTest::mouseDClick(window, Qt::LeftButton, {}, centre); },
-        [=] { QTest::mouseClick(window, Qt::RightButton, {}, centre); },
-        [=] {
-            QWheelEvent wheel(QPointF(centre), QPointF(window->mapToGlobal(centre)), {}, { 0, 120 }, Qt::NoButton, {},
+// What a careless host does, weighted: input first, then its late-bound calls, then the rest.
+const std::vector<StepKind> stepKinds = {
+    { 24, true,
+        [](HostForm &h) {
+            static const std::vector<Qt::Key> keys
+                = { Qt::Key_0, Qt::Key_1, Qt::Key_5, Qt::Key_9, Qt::Key_A, Qt::Key_E, Qt::Key_L, Qt::Key_P, Qt::Key_T,
+                      Qt::Key_Z, Qt::Key_Tab, Qt::Key_Backtab, Qt::Key_Backspace, Qt::Key_Delete, Qt::Key_Left,
+                      Qt::Key_Right, Qt::Key_Home, Qt::Key_End, Qt::Key_Up, Qt::Key_Down, Qt::Key_Return, Qt::Key_Enter,
+                      Qt::Key_Escape, Qt::Key_Space, Qt::Key_F1, Qt::Key_F4, Qt::Key_Insert, Qt::Key_Menu };
+            static const std::vector<Qt::KeyboardModifiers> modifiers = { Qt::NoModifier, Qt::NoModifier,
+                Qt::NoModifier, Qt::ShiftModifier, Qt::ControlModifier, Qt::AltModifier };
+            // Keys with modifiers, text typed, and pastes by either route, 14 : 7 : 3.
+            const int how = h.random.below(24);
+            const QString text = how < 14 ? QString() : h.values.text().left(how < 21 ? 60 : 20000);
+            if (how >= 14 && how < 21) {
+                journal.note(u"type %1"_s.arg(shortly(text)));
+                for (const QChar c : text) {
+                    const char32_t upper = c.toUpper().unicode();
+                    const bool plain
+                        = (upper >= u'0' && upper <= u'9') || (upper >= u'A' && upper <= u'Z') || upper == u' ';
+                    if (h.window())
+                        QTest::sendKeyEvent(QTest::Click, h.window(), plain ? Qt::Key(upper) : Qt::Key_unknown,
+                            QString(c), Qt::NoModifier);
+                }
+                return;
+            }
+            Qt::Key key = h.random.pick(keys);
+            Qt::KeyboardModifiers modifier = h.random.pick(modifiers);
+            if (how >= 21) {
+                QGuiApplication::clipboard()->setText(text);
+                key = how == 21 ? Qt::Key_Insert : Qt::Key_V;
+                modifier = how == 21 ? Qt::ShiftModifier : Qt::ControlModifier;
+            }
+            journal.note(u"press %1%2"_s.arg(
+                QKeySequence(key | modifier).toString(), how >= 21 ? u", pasting "_s + shortly(text) : QString()));
+            if (h.window())
+                QTest::sendKeyEvent(QTest::Click, h.window(), key, keyText(key, modifier), modifier);
+        } },
+    { 28, true,
+        [](HostForm &h) {
+            QWidget *on = target(h);
+            if (!on || !h.window())
+                return;
+            // Clicks, double clicks, pointer moves and the wheel, 12 : 5 : 8 : 3.
+            const int roll = h.random.below(28);
+            if (roll < 17)
+                return click(h, on, roll >= 12);
+            if (roll < 25) {
+                const QPoint at
+                    = h.random.chance(0.2) ? QPoint(h.form->width() + 20, h.form->height() + 20) : pointIn(h, on);
+                // Warped, the real pointer goes through grabs and crossing events on an X server.
+                const bool warp = !h.random.chance(0.5);
+                journal.note(
+                    u"%1 the pointer to %2,%3 of the form"_s.arg(warp ? "warp" : "move").arg(at.x()).arg(at.y()));
+                if (warp)
+                    QCursor::setPos(h.form->mapToGlobal(at));
+                else
+                    QTest::mouseMove(h.window(), at);
+                return QCoreApplication::processEvents();
+            }
+            const QPoint at = on->mapFrom(on->window(), pointIn(h, on));
+            const int delta = h.random.chance(0.5) ? 120 : -120;
+            journal.note(u"turn the wheel %1 over %2"_s.arg(delta).arg(describe(on)));
+            QWheelEvent event(at, on->mapToGlobal(at), QPoint(), QPoint(0, delta), Qt::NoButton, Qt::NoModifier,
                 Qt::NoScrollPhase, false);
-            QApplication::sendEvent(window, &wheel);
-        },
-        [=, this] { QTest::mouseMove(window, QPoint(form->width() - 10, form->height() - 10)); },
-        [this] {
-            if (auto *widget = qobject_cast<QWidget *>(object.data()))
-                widget->setFocus();
-        },
-        [] {
-            if (QWidget *focus = QApplication::focusWidget())
-                QTest::keyClicks(focus, u"PT501964843"_s);
-        },
-    };
-    for (const Qt::Key key :
-        { Qt::Key_Space, Qt::Key_Return, Qt::Key_1, Qt::Key_Down, Qt::Key_Menu, Qt::Key_Tab, Qt::Key_Escape })
-        steps.push_back([window, key] { QTest::keyClick(window, key); });
-    if (asHost && object) {
-        steps.push_back([this] {
-            if (auto *widget = qobject_cast<QWidget *>(object.data()))
-                widget->resize(90, 30);
-        });
-        steps.push_back([this] { form->setEnabled(false); });
-        steps.push_back([this] { form->setEnabled(true); });
-        for (const QMetaMethod &method : membersOf(object, QMetaMethod::Method))
-            steps.push_back([&, method] {
-                call(object, method, values);
-                QTest::qWait(5);
-            });
-        steps.push_back([] { QTest::qWait(100); });
-    }
-    for (const auto &step : steps) {
-        if (!object)
-            return;
-        step();
-        QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
-    }
-}
+            QApplication::sendEvent(on, &event);
+        } },
+    { 6, true,
+        [](HostForm &h) {
+            QWidget *on = target(h);
+            const int how = h.random.below(4);
+            if (how == 0) {
+                journal.note(u"focus the neighbouring text box"_s);
+                h.neighbour->setFocus(Qt::TabFocusReason);
+            } else if (how == 1 && on) {
+                journal.note(u"setFocus() on %1"_s.arg(describe(on)));
+                on->setFocus(Qt::OtherFocusReason);
+            } else if (how == 2) {
+                journal.note(u"activate the form"_s);
+                h.form->activateWindow();
+                QCoreApplication::processEvents();
+            } else if (how == 3 && QApplication::focusWidget()) {
+                journal.note(u"clear the focus"_s);
+                QApplication::focusWidget()->clearFocus();
+            }
+        } },
+    { 9, false,
+        [](HostForm &h) {
+            // The control as a widget: enabled, shown, of odd sizes; or the form enabled.
+            static const std::vector<const char *> names = { "enabled", "visible", "size", "size" };
+            QObject *which = h.widget() && h.random.chance(0.6) ? h.object.data() : h.form.data();
+            const char *name = which == h.form.data() ? "enabled" : h.random.pick(names);
+            const QMetaObject *meta = which->metaObject();
+            write(h, which, meta->property(meta->indexOfProperty(name)),
+                which == h.form.data() ? u"the form's "_s : u"the control's "_s);
+        } },
+    { 12, false,
+        [](HostForm &h) {
+            const QMetaObject *meta = h.object->metaObject();
+            std::vector<QMetaProperty> writable;
+            for (int i = 0; i < meta->propertyCount(); ++i)
+                if (meta->property(i).isWritable() && declaredByTheLibrary(meta->property(i).enclosingMetaObject()))
+                    writable.push_back(meta->property(i));
+            if (!writable.empty())
+                write(h, h.object, h.random.pick(writable), QString());
+        } },
+    { 10, false,
+        [](HostForm &h) {
+            const std::vector<QMetaMethod> methods = membersOf(h.object, QMetaMethod::Method);
+            if (!methods.empty())
+                call(h.object, h.random.pick(methods), h.values);
+        } },
+    { 5, false,
+        [](HostForm &h) {
+            journal.note(u"read every property, Save, then Load what was saved"_s);
+            const QMetaObject *meta = h.object->metaObject();
+            for (int i = 0; i < meta->propertyCount() && h.object; ++i)
+                meta->property(i).read(h.object);
+            const QPointer<UserControl> control = h.control();
+            if (!control)
+                return;
+            const PropertyBag saved = control->Save();
+            control->Load(saved);
+            const PropertyBag again = control ? control->Save() : saved;
+            for (const QString &name : saved.names() + again.names()) {
+                const QVariant before = saved.ReadProperty(name), after = again.ReadProperty(name);
+                // The number badge's empty caption is not written and reads back as "1", as
+                // its saved forms always have.
+                if (before != after
+                    && !(h.className == "skNumber"_L1 && name == "Caption"_L1 && !before.isValid() && after == "1"_L1))
+                    return void(h.faults << u"a Save/Load round trip changed %1 from %2 to %3"_s.arg(
+                                    name, shortly(before), shortly(after)));
+            }
+        } },
+    { 2, false,
+        [](HostForm &h) {
+            if (!h.control())
+                return;
+            Ambient ambient = h.control()->ambient();
+            const int which = h.random.below(3);
+            if (which == 0)
+                ambient.UserMode = !ambient.UserMode;
+            else if (which == 1)
+                ambient.UIDead = !ambient.UIDead;
+            else
+                ambient.BackColor = h.values.make(QMetaType::fromType<quint32>(), "BackColor").toUInt();
+            journal.note(u"the container changes its ambient properties (design mode %1, UI dead %2)"_s.arg(
+                ambient.UserMode ? "off" : "on", ambient.UIDead ? "yes" : "no"));
+            h.control()->setAmbient(ambient);
+        } },
+    { 4, false,
+        [](HostForm &h) {
+            const int ms = h.random.below(60);
+            journal.note(u"let the event loop run %1 ms"_s.arg(ms));
+            QTest::qWait(ms);
+        } },
+    { 1, false,
+        [](HostForm &h) {
+            if (h.random.below(3) == 0) {
+                lock(h);
+            } else {
+                // With no lock of its own, a careless host's unlock that the library must ignore.
+                journal.note(u"LockServer(false)%1"_s.arg(h.locks > 0 ? "" : ", holding no lock"));
+                ClassFactory::LockServer(false);
+                h.locks = std::max(h.locks - 1, 0);
+            }
+            if (DllCanUnloadNow() != S_FALSE)
+                h.faults << u"DllCanUnloadNow lets the library unload under a live object"_s;
+        } },
+};
 
-std::vector<std::string> servedClasses(bool controlsOnly)
+// The names of the classes the registry can create in this build (of the controls only).
+std::vector<std::string> servedClasses(bool controlsOnly = false)
 {
     std::vector<std::string> names;
     for (const ClassInfo &info : ClassRegistry::classes())
@@ -599,31 +790,15 @@ std::vector<std::string> servedClasses(bool controlsOnly)
     return names;
 }
 
-// --- The episode ------------------------------------------------------------------------
-
-namespace {
-
 struct Episode : HostForm
 {
-    Episode(const QString &className, quint64 seed)
-        : HostForm(seed ^ 0x9E3779B97F4A7C15ull)
-        , random(seed)
-        , values(random)
-        , className(className)
-    { }
-
-    QWindow *window() const { return form ? form->windowHandle() : nullptr; }
-    QWidget *widget() const { return qobject_cast<QWidget *>(object.data()); }
-    UserControl *control() const { return qobject_cast<UserControl *>(object.data()); }
-    void note(const QString &step) { journal.note(step); }
+    using HostForm::HostForm;
 
     void place()
     {
-        // The pointer and the clipboard are the machine's: each episode starts them afresh,
-        // so that it follows from its seed alone.
+        // The pointer and clipboard start afresh, so that the episode follows from its seed alone.
         QCursor::setPos(0, 0);
         QGuiApplication::clipboard()->clear();
-        form->setWindowTitle(u"stress "_s + className);
         form->resize(300 + random.below(400), 200 + random.below(300));
         // As a host does: the class factory through the entry point, locked while it is kept.
         const GUID classId = std::bit_cast<GUID>(ClassRegistry::factoryFor(className)->info().classId);
@@ -633,7 +808,7 @@ struct Episode : HostForm
             return;
         }
         if (random.chance(0.5))
-            lock();
+            lock(*this);
         object = static_cast<const ClassFactory *>(factory)->CreateInstance(form);
         const bool laidOut = random.chance(0.5);
         if (laidOut) {
@@ -644,33 +819,27 @@ struct Episode : HostForm
             layout->addStretch();
         } else if (widget())
             widget()->move(10, 40);
-        note(u"create %1 on a form, %2"_s.arg(className, laidOut ? "in a vertical layout" : "placed"));
-        values.objects = { form.data(), object };
+        journal.note(u"create %1 on a form, %2"_s.arg(className, laidOut ? "in a vertical layout" : "placed"));
+        values.objects.push_back(object);
         values.windows.push_back(platform::handleOf(form));
         if (widget())
             values.windows.push_back(platform::handleOf(widget()));
-        if (UserControl *control = this->control()) {
-            if (random.chance(0.1)) {
-                Ambient designer;
-                designer.UserMode = false;
-                note(u"the container is a form designer"_s);
-                control->setAmbient(designer);
-            }
+        if (UserControl *created = control()) {
             if (random.chance(0.5)) {
-                note(u"InitNew"_s);
-                control->InitNew();
+                journal.note(u"InitNew"_s);
+                created->InitNew();
             } else {
                 const PropertyBag bag = randomBag();
-                note(u"Load a bag of %1 properties"_s.arg(bag.names().size()));
-                control->Load(bag);
+                journal.note(u"Load a bag of %1 properties"_s.arg(bag.names().size()));
+                created->Load(bag);
             }
         }
         if (!form)
             return;
-        note(u"show the form"_s);
+        journal.note(u"show the form"_s);
         form->show();
         if (!QTest::qWaitForWindowExposed(form, 2000))
-            note(u"the form was not exposed in time"_s);
+            journal.note(u"the form was not exposed in time"_s);
     }
 
     // The names a fresh control saves, with random values of any type.
@@ -693,27 +862,18 @@ struct Episode : HostForm
         return bag;
     }
 
-    void lock()
-    {
-        note(u"LockServer(true)"_s);
-        ClassFactory::LockServer(true);
-        ++locks;
-    }
-
     void destroy(const QString &how)
     {
         QPointer<QObject> victim = victimIsForm ? QPointer<QObject>(form.data()) : object;
         if (!victim)
             return;
         if (!victimIsForm && random.chance(0.3) && control()) {
-            note(u"the container releases the control (%1)"_s.arg(how));
+            journal.note(u"the container releases the control (%1)"_s.arg(how));
             control()->Release();
             return;
         }
-        // Inside an event after which Qt itself goes on with the widget, deletion can only
-        // wait for the event loop.
         const bool later = insideUnsafeEvent();
-        note(u"the host deletes the %1 %2%3"_s.arg(
+        journal.note(u"the host deletes the %1 %2%3"_s.arg(
             victimIsForm ? "form" : "control", how, later ? " (later: Qt goes on with the widget)" : ""));
         if (later)
             victim->deleteLater();
@@ -722,19 +882,20 @@ struct Episode : HostForm
     }
 
     // Modes 0 and 1 delete the object now (or release it), 2 the form; 3 arms a deletion of
-    // either inside one of the object's events, 4 while a menu or modal form is open.
-    void arm(int mode)
+    // either inside one of the object's events (the one at `index`, if any), 4 while a menu
+    // or modal form is open.
+    void arm(int mode, int index)
     {
         const std::vector<QMetaMethod> events
             = mode == 3 ? membersOf(object, QMetaMethod::Signal) : std::vector<QMetaMethod>();
         victimIsForm = mode == 2;
         if (mode < 3 || (mode == 3 && events.empty()))
             return destroy(u"between two steps"_s);
-        const QMetaMethod event = mode == 3 ? random.pick(events) : QMetaMethod();
+        const QMetaMethod event = mode == 4 ? QMetaMethod() : index >= 0 ? events[size_t(index)] : random.pick(events);
         const QString when
             = mode == 4 ? u"while a menu or modal form is open"_s : u"inside "_s + QLatin1String(event.name());
         victimIsForm = random.chance(0.3);
-        note(u"from now on the host deletes the %1 %2"_s.arg(victimIsForm ? "form" : "control", when));
+        journal.note(u"from now on the host deletes the %1 %2"_s.arg(victimIsForm ? "form" : "control", when));
         if (mode == 4)
             onModal([this, when] { destroy(when); });
         else
@@ -743,9 +904,8 @@ struct Episode : HostForm
 
     void check()
     {
-        note(u"the host checks its form"_s);
-        // Long enough for the timers the object may have left behind (a tip's first delay is
-        // half a second) to come due: none of them may reach it.
+        journal.note(u"the host checks its form"_s);
+        // Now and then long enough for the timers left behind (a tip's is 500 ms) to come due.
         QTest::qWait(random.chance(0.1) ? 600 : 30);
         QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
         if (object)
@@ -759,308 +919,167 @@ struct Episode : HostForm
         form->grab();
     }
 
-    // A part of the object, the object itself or the form.
-    QWidget *target()
+    int run(int steps, int deleteIn)
     {
-        if (!widget() || random.chance(0.1))
-            return form;
-        QList<QWidget *> parts = widget()->findChildren<QWidget *>();
-        parts.removeIf([](QWidget *part) { return !part->isVisible() || part->isWindow(); });
-        return parts.isEmpty() || random.chance(0.4) ? widget() : parts.at(random.below(int(parts.size())));
-    }
-
-    QPoint pointIn(QWidget *on)
-    {
-        QPoint point(random.below(std::max(on->width(), 1)), random.below(std::max(on->height(), 1)));
-        if (random.chance(0.1))
-            point += QPoint(random.below(21) - 10, random.below(21) - 10);
-        return on->mapTo(on->window(), point);
-    }
-
-    void click(bool twice)
-    {
-        QWidget *on = target();
-        if (!on || !window())
-            return;
-        static const std::vector<std::pair<Qt::MouseButton, const char *>> buttons
-            = { { Qt::LeftButton, "left" }, { Qt::RightButton, "right" }, { Qt::MiddleButton, "middle" } };
-        const int roll = random.below(20);
-        const auto [button, side] = buttons[roll < 15 ? 0 : roll < 19 ? 1 : 2];
-        const QPoint at = pointIn(on);
-        note(u"%1 %2 on %3 at %4,%5"_s.arg(twice ? "double-click" : "click", side, describe(on))
-                 .arg(at.x())
-                 .arg(at.y()));
-        // One double click is one Click (or Clicked) of a control that draws itself.
-        std::unique_ptr<QSignalSpy> clicks;
-        if (twice && on == object && button == Qt::LeftButton && !on->childAt(on->mapFrom(on->window(), at))) {
-            const QMetaObject *meta = object->metaObject();
-            if (const int index = std::max(meta->indexOfSignal("Click()"), meta->indexOfSignal("Clicked()"));
-                index >= 0)
-                clicks = std::make_unique<QSignalSpy>(object.data(), meta->method(index));
+        static const int totalWeight = std::accumulate(
+            stepKinds.begin(), stepKinds.end(), 0, [](int sum, const StepKind &kind) { return sum + kind.weight; });
+        const int liveBefore = LiveObject::count();
+        const qsizetype windowsBefore = QApplication::topLevelWidgets().size();
+        place();
+        const int deleteAt = deleteIn >= 0 ? 0 : random.below(steps + 1);
+        const size_t events = object ? membersOf(object, QMetaMethod::Signal).size() : 0;
+        const int mode = deleteIn < 0 ? random.below(5) : size_t(deleteIn) < events ? 3 : 4;
+        int ran = 0;
+        for (; ran < steps && form && object; ++ran) {
+            if (ran == deleteAt)
+                arm(mode, mode == 3 ? deleteIn : -1);
+            if (!object || !form)
+                break;
+            int roll = random.below(totalWeight);
+            std::find_if(stepKinds.begin(), stepKinds.end(), [&](const StepKind &kind) {
+                return (roll -= kind.weight) < 0;
+            })->step(*this);
         }
-        if (twice)
-            QTest::mouseDClick(window(), button, {}, at);
-        else
-            QTest::mouseClick(window(), button, {}, at);
-        if (clicks && object && clicks->count() > 1)
-            faults << u"a double click raised %1 Click events"_s.arg(clicks->count());
+        if (object && !hook)
+            destroy(u"between two steps"_s);
+        else if (object) {
+            journal.note(u"the event never came: the host deletes the control"_s);
+            delete object.data();
+        }
+        check();
+        hook.reset();
+        delete form.data();
+        QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
+        for (; locks > 0; --locks)
+            ClassFactory::LockServer(false);
+        if (liveBefore == 0 && LiveObject::count() == 0 && DllCanUnloadNow() != S_OK)
+            faults << u"DllCanUnloadNow keeps the library loaded with nothing alive and no lock"_s;
+        if (QApplication::topLevelWidgets().size() > windowsBefore)
+            faults << u"%1 windows outlive their form"_s.arg(QApplication::topLevelWidgets().size() - windowsBefore);
+        if (LiveObject::count() != liveBefore)
+            faults << u"%1 public objects outlive their form"_s.arg(LiveObject::count() - liveBefore);
+        return ran;
     }
 
-    int run(int steps);
-
-    Random random;
-    Values values;
-    QString className;
     std::unique_ptr<SignalHook> hook;
-    QStringList faults;
     bool victimIsForm = false;
-    // Locks this host holds on the library, as a host that keeps a class factory does.
-    int locks = 0;
 };
 
-// What a careless host does, weighted: input first, then its late-bound calls, then the rest.
-const std::vector<std::pair<int, void (*)(Episode &)>> stepKinds = {
-    { 14,
-        [](Episode &e) {
-            static const std::vector<Qt::Key> keys
-                = { Qt::Key_0, Qt::Key_1, Qt::Key_5, Qt::Key_9, Qt::Key_A, Qt::Key_E, Qt::Key_L, Qt::Key_P, Qt::Key_T,
-                      Qt::Key_Z, Qt::Key_Tab, Qt::Key_Backtab, Qt::Key_Backspace, Qt::Key_Delete, Qt::Key_Left,
-                      Qt::Key_Right, Qt::Key_Home, Qt::Key_End, Qt::Key_Up, Qt::Key_Down, Qt::Key_Return, Qt::Key_Enter,
-                      Qt::Key_Escape, Qt::Key_Space, Qt::Key_F1, Qt::Key_F4, Qt::Key_Insert, Qt::Key_Menu };
-            static const std::vector<Qt::KeyboardModifiers> modifiers = { Qt::NoModifier, Qt::NoModifier,
-                Qt::NoModifier, Qt::ShiftModifier, Qt::ControlModifier, Qt::AltModifier };
-            if (!e.window())
-                return;
-            const Qt::Key key = e.random.pick(keys);
-            const Qt::KeyboardModifiers modifier = e.random.pick(modifiers);
-            e.note(u"press %1"_s.arg(QKeySequence(key | modifier).toString()));
-            QTest::sendKeyEvent(QTest::Click, e.window(), key, keyText(key, modifier), modifier);
-        } },
-    { 7,
-        [](Episode &e) {
-            const QPointer<QWidget> focus = QApplication::focusWidget();
-            const QString text = e.values.text().left(60);
-            if (!focus || focus->window() != e.form)
-                return;
-            e.note(u"type %1 into %2"_s.arg(shortly(text), describe(focus)));
-            for (const QChar c : text) {
-                const char32_t upper = c.toUpper().unicode();
-                const bool plain
-                    = (upper >= u'0' && upper <= u'9') || (upper >= u'A' && upper <= u'Z') || upper == u' ';
-                if (focus)
-                    QTest::sendKeyEvent(
-                        QTest::Click, focus, plain ? Qt::Key(upper) : Qt::Key_unknown, QString(c), Qt::NoModifier);
-            }
-        } },
-    { 3,
-        [](Episode &e) {
-            const QString text = e.values.text();
-            QGuiApplication::clipboard()->setText(text);
-            const bool shiftInsert = e.random.chance(0.5);
-            e.note(u"paste %1 with %2"_s.arg(shortly(text), shiftInsert ? "Shift+Insert" : "Ctrl+V"));
-            if (e.window())
-                QTest::keyClick(e.window(), shiftInsert ? Qt::Key_Insert : Qt::Key_V,
-                    shiftInsert ? Qt::ShiftModifier : Qt::ControlModifier);
-        } },
-    { 12, [](Episode &e) { e.click(false); } },
-    { 5, [](Episode &e) { e.click(true); } },
-    { 8,
-        [](Episode &e) {
-            QWidget *on = e.target();
-            if (!on || !e.window())
-                return;
-            const QPoint at
-                = e.random.chance(0.2) ? QPoint(e.form->width() + 20, e.form->height() + 20) : e.pointIn(on);
-            // Warped, the real pointer goes through grabs and crossing events on an X server.
-            const bool warp = !e.random.chance(0.5);
-            e.note(u"%1 the pointer to %2,%3 of the form"_s.arg(warp ? "warp" : "move").arg(at.x()).arg(at.y()));
-            if (warp)
-                QCursor::setPos(e.form->mapToGlobal(at));
-            else
-                QTest::mouseMove(e.window(), at);
-            QCoreApplication::processEvents();
-        } },
-    { 3,
-        [](Episode &e) {
-            const QPointer<QWidget> on = e.target();
-            if (!on)
-                return;
-            const QPoint at = on->mapFrom(on->window(), e.pointIn(on));
-            const int delta = e.random.chance(0.5) ? 120 : -120;
-            e.note(u"turn the wheel %1 over %2"_s.arg(delta).arg(describe(on)));
-            QWheelEvent event(at, on->mapToGlobal(at), QPoint(), QPoint(0, delta), Qt::NoButton, Qt::NoModifier,
-                Qt::NoScrollPhase, false);
-            QApplication::sendEvent(on, &event);
-        } },
-    { 6,
-        [](Episode &e) {
-            QWidget *on = e.target();
-            const int how = e.random.below(4);
-            if (how == 0) {
-                e.note(u"focus the neighbouring text box"_s);
-                e.neighbour->setFocus(Qt::TabFocusReason);
-            } else if (how == 1 && on) {
-                e.note(u"setFocus() on %1"_s.arg(describe(on)));
-                on->setFocus(Qt::OtherFocusReason);
-            } else if (how == 2) {
-                e.note(u"activate the form"_s);
-                e.form->activateWindow();
-                QCoreApplication::processEvents();
-            } else if (how == 3 && QApplication::focusWidget()) {
-                e.note(u"clear the focus"_s);
-                QApplication::focusWidget()->clearFocus();
-            }
-        } },
-    { 9,
-        [](Episode &e) {
-            // The control as a widget: enabled, shown, of odd sizes; or the form enabled.
-            static const std::vector<QByteArray> names = { "enabled", "visible", "size", "size" };
-            QWidget *which = e.widget() && e.random.chance(0.6) ? e.widget() : e.form.data();
-            const QByteArray name = which == e.form ? "enabled" : e.random.pick(names);
-            const QVariant value = e.values.make(which->property(name).metaType(), name);
-            e.note(u"set the %1's %2 = %3"_s.arg(which == e.form ? "form" : "control", name, shortly(value)));
-            which->setProperty(name, value);
-        } },
-    { 12,
-        [](Episode &e) {
-            const QMetaObject *meta = e.object->metaObject();
-            std::vector<QMetaProperty> writable;
-            for (int i = 0; i < meta->propertyCount(); ++i)
-                if (meta->property(i).isWritable() && declaredByTheLibrary(meta->property(i).enclosingMetaObject()))
-                    writable.push_back(meta->property(i));
-            if (writable.empty())
-                return;
-            const QMetaProperty property = e.random.pick(writable);
-            const QVariant value = e.values.make(property.metaType(), property.name());
-            e.note(u"set %1 = %2"_s.arg(QLatin1String(property.name()), shortly(value)));
-            property.write(e.object, value);
-        } },
-    { 2,
-        [](Episode &e) {
-            e.note(u"read every property"_s);
-            const QMetaObject *meta = e.object->metaObject();
-            for (int i = 0; i < meta->propertyCount() && e.object; ++i)
-                meta->property(i).read(e.object);
-        } },
-    { 10,
-        [](Episode &e) {
-            const std::vector<QMetaMethod> methods = membersOf(e.object, QMetaMethod::Method);
-            if (!methods.empty())
-                call(e.object, e.random.pick(methods), e.values);
-        } },
-    { 3,
-        [](Episode &e) {
-            const QPointer<UserControl> control = e.control();
-            if (!control)
-                return;
-            e.note(u"Save, then Load what was saved"_s);
-            const PropertyBag saved = control->Save();
-            control->Load(saved);
-            const PropertyBag again = control ? control->Save() : saved;
-            for (const QString &name : saved.names() + again.names()) {
-                const QVariant before = saved.ReadProperty(name), after = again.ReadProperty(name);
-                // The number badge's empty caption is not written and reads back as "1", as
-                // its saved forms always have.
-                const bool documented
-                    = e.className == "skNumber"_L1 && name == "Caption"_L1 && !before.isValid() && after == "1"_L1;
-                if (before != after && !documented) {
-                    e.faults << u"a Save/Load round trip changed %1 from %2 to %3"_s.arg(
-                        name, shortly(before), shortly(after));
-                    return;
-                }
-            }
-        } },
-    { 2,
-        [](Episode &e) {
-            if (!e.control())
-                return;
-            Ambient ambient = e.control()->ambient();
-            const int which = e.random.below(3);
-            if (which == 0)
-                ambient.UserMode = !ambient.UserMode;
-            else if (which == 1)
-                ambient.UIDead = !ambient.UIDead;
-            else
-                ambient.BackColor = e.values.make(QMetaType::fromType<quint32>(), "BackColor").toUInt();
-            e.note(u"the container changes its ambient properties (design mode %1, UI dead %2)"_s.arg(
-                ambient.UserMode ? "off" : "on", ambient.UIDead ? "yes" : "no"));
-            e.control()->setAmbient(ambient);
-        } },
-    { 4,
-        [](Episode &e) {
-            const int ms = e.random.below(60);
-            e.note(u"let the event loop run %1 ms"_s.arg(ms));
-            QTest::qWait(ms);
-        } },
-    { 1,
-        [](Episode &e) {
-            if (e.random.below(3) == 0) {
-                e.lock();
-            } else {
-                // With no lock of its own, a careless host's unlock that the library must ignore.
-                e.note(u"LockServer(false)%1"_s.arg(e.locks > 0 ? "" : ", holding no lock"));
-                ClassFactory::LockServer(false);
-                e.locks = std::max(e.locks - 1, 0);
-            }
-            if (DllCanUnloadNow() != S_FALSE)
-                e.faults << u"DllCanUnloadNow lets the library unload under a live object"_s;
-        } },
-};
-
-int Episode::run(int steps)
+// One episode of `steps` random steps (printed as they run when `echo`) in which the host
+// deletes the object, then checks its form: at random, or from the first step inside event
+// `deleteIn` of the object (past the last, while a menu or modal form is open). Answers the
+// steps run, and in `failure` the faults found with the steps that replay them.
+int runEpisode(const QString &className, quint64 seed, int steps, bool echo, QString &failure, int deleteIn = -1)
 {
-    static const int totalWeight = std::accumulate(
-        stepKinds.begin(), stepKinds.end(), 0, [](int sum, const auto &kind) { return sum + kind.first; });
-    const int liveBefore = LiveObject::count();
-    const qsizetype windowsBefore = QApplication::topLevelWidgets().size();
-    place();
-    const int deleteAt = random.below(steps + 1);
-    const int mode = random.below(5);
-    int ran = 0;
-    for (; ran < steps && form && object; ++ran) {
-        if (ran == deleteAt)
-            arm(mode);
-        if (!object || !form)
-            break;
-        int roll = random.below(totalWeight);
-        const auto kind = std::find_if(
-            stepKinds.begin(), stepKinds.end(), [&](const auto &kind) { return (roll -= kind.first) < 0; });
-        kind->second(*this);
-    }
-    if (object && !hook)
-        destroy(u"between two steps"_s);
-    else if (object) {
-        note(u"the event never came: the host deletes the control"_s);
-        delete object.data();
-    }
-    check();
-    hook.reset();
-    delete form.data();
-    QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
-    for (; locks > 0; --locks)
-        ClassFactory::LockServer(false);
-    if (liveBefore == 0 && LiveObject::count() == 0 && DllCanUnloadNow() != S_OK)
-        faults << u"DllCanUnloadNow keeps the library loaded with nothing alive and no lock"_s;
-    if (QApplication::topLevelWidgets().size() > windowsBefore)
-        faults << u"%1 windows outlive their form"_s.arg(QApplication::topLevelWidgets().size() - windowsBefore);
-    if (LiveObject::count() != liveBefore)
-        faults << u"%1 public objects outlive their form"_s.arg(LiveObject::count() - liveBefore);
+    journal.echo = echo;
+    journal.begin(u"%1, seed %2"_s.arg(className).arg(seed),
+        deleteIn < 0 ? u"EveryClass/RandomUse.*"_s : u"EveryClass/Lifetime.*/"_s + className,
+        deleteIn < 0 ? u" ZELCTL_STRESS_REPLAY=%1:%2"_s.arg(className).arg(seed) : QString());
+    Episode episode(className, seed);
+    const int ran = episode.run(steps, deleteIn);
+    failure = episode.faults.isEmpty() ? QString() : episode.faults.join(u"; ") + u'\n' + journal.replay();
     return ran;
 }
 
 } // namespace
 
-int runEpisode(const QString &className, quint64 seed, int steps, bool echo, QString &failure)
+} // namespace zelctl::stress
+
+using namespace zelctl;
+using namespace zelctl::stress;
+
+using RandomUse = ::testing::TestWithParam<std::string>;
+using Lifetime = ::testing::TestWithParam<std::string>;
+using DisabledParent = ::testing::TestWithParam<std::string>;
+
+// Random episodes, each from its own seed, for a budget of seconds shared among the classes
+// (ZELCTL_STRESS_SECONDS, 12 by default; ZELCTL_STRESS_SEED picks another series).
+// ZELCTL_STRESS_REPLAY=Class:seed replays one episode and prints its steps as they run.
+TEST_P(RandomUse, aCarelessHostBreaksNothing)
 {
-    journal.echo = echo;
-    journal.begin(className, seed);
-    Episode episode(className, seed);
-    const int ran = episode.run(steps);
-    failure = episode.faults.isEmpty() ? QString() : episode.faults.join(u"; ") + u'\n' + journal.replay();
-    return ran;
+    const QString name = QString::fromStdString(GetParam());
+    const QList<QByteArray> replaying = qgetenv("ZELCTL_STRESS_REPLAY").split(':');
+    if (replaying.size() == 2 && replaying[0] != name.toLatin1())
+        GTEST_SKIP() << "replaying another class";
+    const std::vector<std::string> classes = servedClasses();
+    const int seconds = qEnvironmentVariableIntValue("ZELCTL_STRESS_SECONDS");
+    const qint64 budget = (seconds > 0 ? seconds : 12) * 1000ll / qint64(classes.size());
+    const quint64 series
+        = qEnvironmentVariableIsSet("ZELCTL_STRESS_SEED") ? qgetenv("ZELCTL_STRESS_SEED").toULongLong() : 1;
+    // Neighbouring series and classes give unrelated seeds.
+    Random seeds(
+        series * classes.size() + size_t(std::find(classes.begin(), classes.end(), GetParam()) - classes.begin()));
+    QElapsedTimer clock;
+    clock.start();
+    int episodes = 0, steps = 0, failures = 0;
+    for (; episodes == 0 || (replaying.size() != 2 && clock.elapsed() < budget); ++episodes) {
+        const quint64 seed = replaying.size() == 2 ? replaying[1].toULongLong() : seeds() >> 16;
+        QString failure;
+        steps += runEpisode(name, seed, 50 + int(seed % 350), replaying.size() == 2, failure);
+        if (!failure.isEmpty() && ++failures <= 3)
+            ADD_FAILURE() << qPrintable(failure);
+    }
+    std::printf("[ stress   ] %s: %d episodes, %d steps, series %llu\n", GetParam().c_str(), episodes, steps,
+        static_cast<unsigned long long>(series));
 }
 
-} // namespace zelctl::stress
+// For each event of the class, and while a menu or modal form of it is open, an episode in
+// which the host deletes the object (or its form) then, from the first step on.
+TEST_P(Lifetime, theHostMayDeleteTheObjectInAnyOfItsEventsOrWhileItsMenuOrFormIsOpen)
+{
+    const QString name = QString::fromStdString(GetParam());
+    const size_t events = membersOf(std::unique_ptr<QObject>(CreateObject(name)).get(), QMetaMethod::Signal).size();
+    for (size_t event = 0; event <= events; ++event) {
+        QString failure;
+        runEpisode(name, event, 60, false, failure, int(event));
+        EXPECT_TRUE(failure.isEmpty()) << qPrintable(failure);
+    }
+}
+
+// Inside a disabled form a control looks as when disabled itself, answers no input with an
+// event, a menu or a form, and keeps its own setting.
+TEST_P(DisabledParent, looksAndActsDisabledAndKeepsItsOwnSetting)
+{
+    HostForm host(QString::fromStdString(GetParam()), QSize(300, 200));
+    const QPointer<UserControl> control = qobject_cast<UserControl *>(host.object.data());
+    ASSERT_NE(control, nullptr);
+    const auto picture = [&] { return control->grab().toImage().convertToFormat(QImage::Format_RGB32); };
+    const PropertyBag saved = control->Save();
+    // Through the control's own Enabled where it has one, as a host sets it.
+    const auto enableItself = [&](bool enabled) {
+        if (!control->setProperty("Enabled", enabled))
+            control->QWidget::setEnabled(enabled);
+    };
+    enableItself(false);
+    const QImage disabledItself = picture();
+    enableItself(true);
+
+    int opened = 0;
+    host.onModal([&] { ++opened; });
+    host.form->setEnabled(false);
+    EXPECT_EQ(picture(), disabledItself);
+    QStringList raised;
+    std::vector<std::unique_ptr<SignalHook>> hooks;
+    for (const QMetaMethod &event : membersOf(control, QMetaMethod::Signal))
+        hooks.push_back(std::make_unique<SignalHook>(control, event, [&raised, event] { raised << event.name(); }));
+    // Every kind of step a user takes by hand, a few rounds.
+    for (int round = 0; round < 12; ++round)
+        for (const StepKind &kind : stepKinds)
+            if (kind.byUser)
+                kind.step(host);
+    QTest::qWait(20);
+    ASSERT_TRUE(control);
+    EXPECT_TRUE(raised.isEmpty()) << "events answered input in a disabled form: " << raised.join(u", ").toStdString();
+    EXPECT_EQ(opened, 0) << "a menu or form opened in a disabled form";
+    EXPECT_EQ(control->Save(), saved) << "the form's state leaked into the control's own setting";
+    const QVariant own = control->property("Enabled");
+    EXPECT_TRUE(!own.isValid() || own.toBool());
+}
+
+const auto byName = [](const ::testing::TestParamInfo<std::string> &info) { return info.param; };
+INSTANTIATE_TEST_SUITE_P(EveryClass, RandomUse, ::testing::ValuesIn(servedClasses()), byName);
+INSTANTIATE_TEST_SUITE_P(EveryClass, Lifetime, ::testing::ValuesIn(servedClasses()), byName);
+INSTANTIATE_TEST_SUITE_P(EveryControl, DisabledParent, ::testing::ValuesIn(servedClasses(true)), byName);
 
 int main(int argc, char **argv)
 {
@@ -1082,7 +1101,9 @@ int main(int argc, char **argv)
     zelctl::platform::SaveSetting("zEL", "Setup", "RootPath", ZELCTL_SOURCE_DIR "/");
     // Documents and addresses are not opened for real.
     zelctl::platform::setShellOpenHook([](const QString &) { return true; });
-    zelctl::stress::watchForHangs(120000);
+    zelctl::stress::watchForHangs();
     ::testing::InitGoogleTest(&argc, argv);
     return RUN_ALL_TESTS();
 }
+
+#include "StressHost.moc"
