@@ -9,8 +9,6 @@
 
 #include <gtest/gtest.h>
 
-#include <unistd.h>
-
 using namespace zelctl::platform;
 
 using zelctl::test::makeFifo;
@@ -51,19 +49,6 @@ TEST(FileRead, readsRegularFilesWithinTheBoundAndRefusesTheRestAtOnce)
     ASSERT_TRUE(status.ok());
     EXPECT_TRUE(status.bytes.startsWith("Name:"));
     EXPECT_EQ(readFile("/proc/self/status", 10).status, FileRead::TooLarge);
-}
-
-// The bound on an endless pipe and the messages are driven through the command line.
-TEST(FileRead, readsAPipeOnlyWhenAsked)
-{
-    int ends[2];
-    ASSERT_EQ(::pipe(ends), 0);
-    ASSERT_EQ(::write(ends[1], "GIF89a", 6), 6);
-    ::close(ends[1]);
-    const QString path = QStringLiteral("/proc/self/fd/%1").arg(ends[0]);
-    EXPECT_EQ(readFile(path, 10).status, FileRead::NotRegularFile);
-    EXPECT_EQ(readFile(path, 10, Pipes::Read).bytes, QByteArray("GIF89a"));
-    ::close(ends[0]);
 }
 
 // A settings file that is a link: to a regular file it is written through, keeping the

@@ -37,17 +37,6 @@ QString rootPathInANewThread()
 
 } // namespace
 
-TEST(Settings, liveInThePrivateConfigFolderAndFoldTheApplicationName)
-{
-    const QString home = qEnvironmentVariable("XDG_CONFIG_HOME");
-    ASSERT_FALSE(home.isEmpty());
-    EXPECT_TRUE(settingsFile("ZEL").startsWith(home)) << "tests never touch the user's settings";
-    SaveSetting("ZEL", "Config", "allowautonif", "0");
-    EXPECT_EQ(GetSetting("zel", "Config", "allowautonif", "1"), "0");
-    DeleteSetting("zEL", "Config", "allowautonif");
-    EXPECT_EQ(GetSetting("ZEL", "Config", "allowautonif", "1"), "1");
-}
-
 TEST(Settings, aHandEditedValueIsReadWholeAndNeverWrittenOver)
 {
     const QString path = settingsFile("zEL");
@@ -79,7 +68,6 @@ TEST(Settings, aStoreThatCannotBeReadIsNeverWrittenOver)
         QString root;
     } stores[] = {
         { {}, QDir::currentPath() + '/' },
-        { "[Setup]\nRootPath /opt/zel\nSkinPreviewPath=/srv/skins\n", QDir::currentPath() + '/' },
         { "[Setup\nRootPath=/opt/zel\nSkinPreviewPath=/srv/skins\n", "/opt/zel/" },
     };
     for (const auto &store : stores) {

@@ -23,7 +23,6 @@ inline quint32 argbAt(const QImage &bitmap, int x, int y)
     return bitmap.hasAlphaChannel() ? word : word | 0xFF000000u;
 }
 
-// The same as B, G, R, A.
 inline std::array<uint8_t, 4> bitmapPixel(const StdPNG &image, int x, int y)
 {
     const quint32 argb = argbAt(bitmapOf(image), x, y);

@@ -4,34 +4,10 @@
 #include <zlib.h>
 
 #include <algorithm>
-#include <cstring>
+#include <cstdio>
 #include <stdexcept>
 
 namespace zelctl::test {
-
-namespace {
-
-void appendToBuffer(png_structp png, png_bytep data, png_size_t length)
-{
-    static_cast<QByteArray *>(png_get_io_ptr(png))->append(reinterpret_cast<const char *>(data), qsizetype(length));
-}
-
-struct ReadCursor
-{
-    const QByteArray *file;
-    qsizetype position = 0;
-};
-
-void readFromBuffer(png_structp png, png_bytep data, png_size_t length)
-{
-    auto *cursor = static_cast<ReadCursor *>(png_get_io_ptr(png));
-    if (cursor->file->size() - cursor->position < qsizetype(length))
-        png_error(png, "read past the end");
-    std::memcpy(data, cursor->file->constData() + cursor->position, length);
-    cursor->position += qsizetype(length);
-}
-
-} // namespace
 
 QByteArray writeWithLibpng(const ImageRecipe &recipe)
 {
@@ -42,7 +18,13 @@ QByteArray writeWithLibpng(const ImageRecipe &recipe)
         png_destroy_write_struct(&png, &info);
         throw std::runtime_error("libpng could not write the test image");
     }
-    png_set_write_fn(png, &out, appendToBuffer, nullptr);
+    png_set_write_fn(
+        png, &out,
+        [](png_structp p, png_bytep data, png_size_t length) {
+            static_cast<QByteArray *>(png_get_io_ptr(p))
+                ->append(reinterpret_cast<const char *>(data), qsizetype(length));
+        },
+        nullptr);
     png_set_filter(png, PNG_FILTER_TYPE_BASE, PNG_ALL_FILTERS);
     if (recipe.idatBytes)
         png_set_compression_buffer_size(png, size_t(recipe.idatBytes));
@@ -104,14 +86,15 @@ QByteArray writeWithLibpng(const ImageRecipe &recipe)
 
 std::vector<uint8_t> readWithLibpng(const QByteArray &file, int &width, int &height)
 {
-    ReadCursor cursor { &file };
+    FILE *stream = fmemopen(const_cast<char *>(file.constData()), size_t(file.size()), "rb");
     png_structp png = png_create_read_struct(PNG_LIBPNG_VER_STRING, nullptr, nullptr, nullptr);
     png_infop info = png_create_info_struct(png);
     if (setjmp(png_jmpbuf(png))) {
         png_destroy_read_struct(&png, &info, nullptr);
+        fclose(stream);
         throw std::runtime_error("libpng could not read the test image");
     }
-    png_set_read_fn(png, &cursor, readFromBuffer);
+    png_init_io(png, stream);
     png_read_info(png, info);
     png_set_expand(png);
     png_set_strip_16(png);
@@ -128,6 +111,7 @@ std::vector<uint8_t> readWithLibpng(const QByteArray &file, int &width, int &hei
     png_read_image(png, rows.data());
     png_read_end(png, nullptr);
     png_destroy_read_struct(&png, &info, nullptr);
+    fclose(stream);
     return pixels;
 }
 
@@ -160,16 +144,6 @@ QByteArray ihdr(int width, int height, int bitDepth, int colorType, int interlac
     data.append(char(bitDepth)).append(char(colorType)).append(char(compression)).append(char(filter));
     data.append(char(interlace));
     return chunk("IHDR", data);
-}
-
-QByteArray deflate(const QByteArray &rows)
-{
-    uLongf length = compressBound(uLong(rows.size()));
-    QByteArray out(qsizetype(length), '\0');
-    compress(reinterpret_cast<Bytef *>(out.data()), &length, reinterpret_cast<const Bytef *>(rows.constData()),
-        uLong(rows.size()));
-    out.truncate(qsizetype(length));
-    return out;
 }
 
 QByteArray greyFile(int width, int height, const QByteArray &extraChunks, uint8_t filter)

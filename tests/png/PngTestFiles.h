@@ -29,16 +29,13 @@ struct ImageRecipe
     int idatBytes = 0; // the size of each IDAT chunk but the last, 0 for libpng's own
 
     int channels() const { return colorType == 2 ? 3 : colorType == 4 ? 2 : colorType == 6 ? 4 : 1; }
-    // Bytes of a pixel in the stream, at least 1.
 };
 
-// A file written by libpng with deterministic pseudo-random samples (every filter allowed).
-// Keyed images use the first pixel as their key, so some pixels match it; palette images
-// get fewer tRNS entries than palette entries, some of them 0.
+// A file written by libpng with seeded random samples, every filter allowed; keyed images use
+// the first pixel as key, palette images get fewer tRNS entries than colours, some of them 0.
 QByteArray writeWithLibpng(const ImageRecipe &recipe);
 
-// Straight (not premultiplied) R, G, B, A per pixel as libpng reads the file, with 16-bit
-// samples cut to their first byte, low bit depths scaled to 8 bits and tRNS as alpha.
+// Straight R, G, B, A per pixel as libpng reads the file: 16-bit samples cut, tRNS as alpha.
 std::vector<uint8_t> readWithLibpng(const QByteArray &file, int &width, int &height);
 
 // One chunk: length, type, data and a CRC over type and data.
@@ -48,11 +45,13 @@ QByteArray signature();
 QByteArray ihdr(
     int width, int height, int bitDepth, int colorType, int interlace = 0, int compression = 0, int filter = 0);
 // IDAT data: the rows (each starting with its filter byte) deflated.
-QByteArray deflate(const QByteArray &rows);
+inline QByteArray deflate(const QByteArray &rows)
+{
+    return qCompress(rows).mid(4);
+}
 QByteArray be32(uint32_t value);
 
-// A complete grey 8-bit file of width × height pixels whose row y holds the value y + x,
-// every row with filter type `filter` (0 gives the stored values).
+// A grey 8-bit file whose pixel (x, y) is x + y, every row with filter type `filter`.
 QByteArray greyFile(int width, int height, const QByteArray &extraChunks = {}, uint8_t filter = 0);
 
 } // namespace zelctl::test

@@ -65,7 +65,6 @@ public:
         uchar &byte = row(y)[x * bpp / 8];
         byte = uchar((byte & ~(((1u << bpp) - 1) << shift)) | (v & ((1u << bpp) - 1)) << shift);
     }
-    quint32 argb(int x, int y) const { return value(x, y); }
     void fill(quint32 v)
     {
         for (int y = 0; y < height; ++y)
@@ -74,8 +73,7 @@ public:
     }
     QByteArray bytes() const { return QByteArray(static_cast<const char *>(bits), stride * height); }
 
-    // The colour (0xAARRGGBB) a value shows, opaque below 32 bits, and the value that shows
-    // a colour: for a table the first of its nearest entries.
+    // The colour (0xAARRGGBB) a value shows, and the value (of a table: nearest) for a colour.
     quint32 colorOf(quint32 v) const { return bpp == 32 ? v : 0xFF000000u | (bpp == 24 ? v : table[v]); }
     quint32 valueOf(quint32 argb) const
     {
@@ -103,16 +101,5 @@ public:
     HGDIOBJ previous = 0;
     void *bits = nullptr;
 };
-
-using Values = std::vector<quint32>;
-
-// The first `count` pixel values of row y, left to right.
-inline Values rowOf(const TestBitmap &b, int y, int count)
-{
-    Values values;
-    for (int x = 0; x < count; ++x)
-        values.push_back(b.value(x, y));
-    return values;
-}
 
 } // namespace zelctl::gdi::test
