@@ -56,12 +56,6 @@ TEST_F(Number, staysSquareByTakingItsWidthAsHeightAndSizesItsFontToIt)
     }
 }
 
-TEST_F(Number, hoverMakesItActive)
-{
-    expectHoverInAndOut(
-        badge, QPoint(15, 15), [this] { EXPECT_TRUE(badge->Active()); }, [this] { EXPECT_FALSE(badge->Active()); });
-}
-
 TEST_F(Number, aDoubleClickIsOneClickAndOneDoubleClick)
 {
     QSignalSpy clicked(badge, &skNumber::Clicked);
@@ -72,17 +66,4 @@ TEST_F(Number, aDoubleClickIsOneClickAndOneDoubleClick)
     QTest::mouseRelease(badge, Qt::LeftButton, {}, QPoint(15, 15));
     EXPECT_EQ(doubleClicked.count(), 1);
     EXPECT_EQ(clicked.count(), 1);
-}
-
-TEST_F(Number, persistsWithItsReadAndWriteDefaults)
-{
-    badge->setCaption(QString());
-    EXPECT_EQ(badge->Save().names(), QStringList { "Active" }) << "only Active is written at its default";
-    badge->Load(badge->Save());
-    EXPECT_EQ(badge->Caption(), QStringLiteral("1")) << "an empty caption reads back as 1";
-    PropertyBag bag;
-    bag.WriteProperty("BackStyle", skNumber::Opaque);
-    badge->Load(bag);
-    EXPECT_EQ(badge->BackStyle(), skNumber::Opaque);
-    EXPECT_EQ(badge->BackgroundActive(), 0x5652B8u) << "the default of a value not stored";
 }

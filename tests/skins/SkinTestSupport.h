@@ -22,8 +22,7 @@ template <typename Control> platform::OleColor pixel(Control &control, int x, in
     return platform::fromQColor(QColor(control.surface().image().pixel(x, y)));
 }
 
-// Pictures written for one test: solid blocks of colour, optionally with a transparent
-// border, saved as PNG files in a private folder.
+// Solid blocks of colour, optionally with a transparent border, saved as PNG files.
 class PictureFolder
 {
 public:
@@ -43,6 +42,21 @@ public:
 private:
     QTemporaryDir m_dir;
 };
+
+// Pointer events as "MouseDown 1", and `click` as "Click", or "Click, pointer held" when the
+// control still holds the pointer then: a host may open a modal form from it.
+template <typename Control> void recordEvents(Control *control, void (Control::*click)(), QStringList &events)
+{
+    QObject::connect(control, &Control::MouseIn, [&events] { events << "MouseIn"; });
+    QObject::connect(control, &Control::MouseOut, [&events] { events << "MouseOut"; });
+    QObject::connect(control, &Control::MouseDown,
+        [&events](qint16 &b, qint16 &, float &, float &) { events << QStringLiteral("MouseDown %1").arg(b); });
+    QObject::connect(control, &Control::MouseUp,
+        [&events](qint16 &b, qint16 &, float &, float &) { events << QStringLiteral("MouseUp %1").arg(b); });
+    QObject::connect(control, click, [&events] {
+        events << (platform::capturedWidget() ? QStringLiteral("Click, pointer held") : QStringLiteral("Click"));
+    });
+}
 
 // A shown form that holds the control under test, so the pointer can reach it.
 class SkinForm : public ::testing::Test
@@ -64,9 +78,8 @@ protected:
         QTest::mouseMove(&form, QPoint(300, 200));
         QTest::mouseMove(&form, QPoint(301, 201));
     }
-    // The pointer resting on `control` raises MouseIn once; leaving it, by moving away or by
-    // the window's Leave where the pointer cannot be captured, raises MouseOut once and frees
-    // the pointer. `whileIn` and `afterwards` check the looks.
+    // Resting on `control` raises MouseIn once; leaving, by moving away or by the window's Leave,
+    // raises MouseOut once and frees the pointer. `whileIn` and `afterwards` check the looks.
     template <typename Control>
     void expectHoverInAndOut(
         Control *control, QPoint at, const std::function<void()> &whileIn, const std::function<void()> &afterwards)
@@ -91,19 +104,6 @@ protected:
             EXPECT_EQ(platform::capturedWidget(), nullptr);
             afterwards();
         }
-    }
-    // Pressed on `control`, then moved out and released there: the control keeps the pointer
-    // for the release, which does not click. `events` are cleared once the pointer is away.
-    void pressAndReleaseOutside(QWidget *control, QPoint at, QStringList &events)
-    {
-        moveAway();
-        events.clear();
-        QTest::mouseMove(control, at);
-        QTest::mousePress(control, Qt::LeftButton, {}, at);
-        QTest::mouseMove(control, at + QPoint(180, 130));
-        EXPECT_EQ(platform::capturedWidget(), control);
-        QTest::mouseRelease(control, Qt::LeftButton, {}, at + QPoint(180, 130));
-        EXPECT_EQ(platform::capturedWidget(), nullptr);
     }
     void TearDown() override { platform::releaseCapture(); }
 };

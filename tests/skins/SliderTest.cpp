@@ -51,14 +51,8 @@ TEST_F(Slider, startsClosedAndItsButtonOpensItWideEnoughForItsContentsWithTheBut
     EXPECT_EQ(width(), 2010 + ButtonWidth + 300);
     EXPECT_EQ(cc->Left(), width() - ButtonWidth);
     EXPECT_EQ(cc->Height(), 600) << "the button spans the full height";
-    slider->extender().setHeight(900);
     slider->extender().setWidth(3000);
     EXPECT_EQ(cc->Left(), 3000 - ButtonWidth);
-    EXPECT_EQ(cc->Height(), 900);
-
     slider->setSlideOpen(false);
     EXPECT_EQ(width(), ButtonWidth);
-    slider->extender().setHeight(450);
-    EXPECT_EQ(cc->Left(), 0);
-    EXPECT_EQ(cc->Height(), 450);
 }
