@@ -3,14 +3,11 @@
 #include "common/modFuncs.h"
 #include "companion/CommandButton.h"
 #include "gif/ucAniGIF.h"
-#include "nib/NibCheckDigits.h"
-#include "nib/cNIB.h"
 #include "nif/cNIF.h"
 #include "platform/Settings.h"
 #include "selection/frmSelectCountry.h"
 #include "skins/cSlider.h"
 #include "skins/skGoButton.h"
-#include "skins/skNumber.h"
 #include "skins/skSubMenu.h"
 #include "support/TestSupport.h"
 #include "tips/InfoButton.h"
@@ -23,13 +20,11 @@
 
 #include <QLabel>
 #include <QLineEdit>
-#include <QPointer>
 #include <QSignalSpy>
 #include <QTest>
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <bit>
 
 using namespace zelctl;
@@ -37,34 +32,8 @@ using namespace zelctl::test;
 
 namespace {
 
-QAccessibleInterface *accessible(QObject *object)
-{
-    return QAccessible::queryAccessibleInterface(object);
-}
-
-QString name(QObject *object)
-{
-    return accessible(object)->text(QAccessible::Name);
-}
-
-QString description(QObject *object)
-{
-    return accessible(object)->text(QAccessible::Description);
-}
-
-QAccessible::State state(QObject *object)
-{
-    return accessible(object)->state();
-}
-
-QLineEdit *box(QWidget *control, int index = 0)
-{
-    return control->findChildren<QLineEdit *>().at(index);
-}
-
-// Qt's accessibility switched on, as the arrival of a screen reader does (a platform's bridge
-// does it when one asks, Qt's own tests through the platform's object, as here), the events
-// raised recorded instead of sent to a bridge, and a shown form.
+// Qt's accessibility switched on through the platform's object, as a screen reader's arrival
+// does, the events raised recorded instead of sent to a bridge, and a shown form.
 class Accessibility : public ::testing::Test
 {
 protected:
@@ -80,7 +49,7 @@ protected:
     {
         setActive(false);
         QAccessible::installUpdateHandler(nullptr);
-        events.clear();
+        forget();
     }
 
     template <typename Control> Control *add()
@@ -91,29 +60,21 @@ protected:
         return control;
     }
 
-    // How many events of a kind were raised about the object.
-    static int count(const QObject *object, QAccessible::Event type)
-    {
-        return int(std::count_if(events.cbegin(), events.cend(),
-            [&](const Event &event) { return event.object == object && event.type == type; }));
-    }
-    // Every state that a state change about the object turned on or off.
+    static QAccessibleInterface *accessible(QObject *object) { return QAccessible::queryAccessibleInterface(object); }
+    static QString name(QObject *object) { return accessible(object)->text(QAccessible::Name); }
+    static QString description(QObject *object) { return accessible(object)->text(QAccessible::Description); }
+    static QAccessible::State state(QObject *object) { return accessible(object)->state(); }
+    static QLineEdit *box(QWidget *control, int index = 0) { return control->findChildren<QLineEdit *>().at(index); }
+
+    // How many events of a kind were raised about the object, and every state that a state
+    // change about it turned on or off, since the last forget().
+    static int count(const QObject *object, QAccessible::Event type) { return int(raised.count({ object, type })); }
     static QAccessible::State changedStates(const QObject *object)
     {
-        static_assert(sizeof(QAccessible::State) == sizeof(quint64));
-        quint64 bits = 0;
-        for (const Event &event : events)
-            bits |= event.object == object ? std::bit_cast<quint64>(event.changed) : 0;
-        return std::bit_cast<QAccessible::State>(bits);
+        return std::bit_cast<QAccessible::State>(changed.value(object));
     }
+    static void forget() { raised.clear(), changed.clear(); }
 
-    struct Event
-    {
-        QAccessible::Event type;
-        QPointer<QObject> object;
-        QAccessible::State changed;
-    };
-    static inline QList<Event> events;
     QWidget form;
 
 private:
@@ -124,19 +85,20 @@ private:
     }
     static void record(QAccessibleEvent *event)
     {
-        events.append({ event->type(), event->object(),
-            event->type() == QAccessible::StateChanged
-                ? static_cast<QAccessibleStateChangeEvent *>(event)->changedStates()
-                : QAccessible::State() });
+        raised.append({ event->object(), event->type() });
+        if (event->type() == QAccessible::StateChanged) {
+            const QAccessible::State states = static_cast<QAccessibleStateChangeEvent *>(event)->changedStates();
+            changed[event->object()] |= std::bit_cast<quint64>(states);
+        }
     }
+    static inline QList<std::pair<const QObject *, QAccessible::Event>> raised;
+    static inline QHash<const QObject *, quint64> changed;
 };
 
 TEST_F(Accessibility, everyControlHasItsRoleNameAndDescriptionAndTheButtonsArePressedByKeyOrAction)
 {
     auto *go = add<skGoButton>();
     go->setTooltip("Página seguinte");
-    auto *number = add<skNumber>();
-    number->setCaption("2");
     auto *item = add<skSubMenu>();
     item->setCaption("Anexo A");
     auto *info = add<InfoButton>();
@@ -146,8 +108,7 @@ TEST_F(Accessibility, everyControlHasItsRoleNameAndDescriptionAndTheButtonsArePr
     auto *slider = add<cSlider>();
     auto *gif = add<ucAniGIF>();
     gif->extender().setToolTipText("A aguardar");
-    auto *nif = add<cNIF>();
-    auto *nib = add<cNIB>();
+    // What the NIF and NIB boxes say is read through the desktop's bus (atspi/gallery-tree.py).
     // As a selection dialog shows a long item: cut short on screen, read whole.
     auto *cut = new CommandButton(&form);
     cut->setCaption("Rendimentos da categoria B obtidos no estrangeiro sem retenção");
@@ -161,17 +122,12 @@ TEST_F(Accessibility, everyControlHasItsRoleNameAndDescriptionAndTheButtonsArePr
         const char *click = nullptr;
     } rows[] = {
         { go, QAccessible::Button, "Página seguinte", "", SIGNAL(Click()) },
-        { number, QAccessible::Button, "2", "", SIGNAL(Clicked()) },
         { item, QAccessible::Button, "Anexo A", "", SIGNAL(Clicked()) },
         { info, QAccessible::Button, "Atenção", "O prazo termina em breve.\nConfirme os rendimentos.",
             SIGNAL(Click()) },
         { slider, QAccessible::Grouping, "Painel deslizante", "" },
         { slider->button(), QAccessible::Button, "Abrir o painel", "" },
         { gif, QAccessible::Graphic, "A aguardar", "Sem imagem" },
-        { nif, QAccessible::EditableText, "NIF", "" },
-        { nif->findChild<QWidget *>("cPicture"), QAccessible::Button, "Portugal", "" },
-        { nib, QAccessible::EditableText, "NIB", "" },
-        { box(nib, 2), QAccessible::EditableText, "Conta", "Parte 3 de 4 do NIB" },
         { cut, QAccessible::Button, cut->Caption(), "" },
     };
     for (const auto &row : rows) {
@@ -191,7 +147,6 @@ TEST_F(Accessibility, everyControlHasItsRoleNameAndDescriptionAndTheButtonsArePr
         ASSERT_TRUE(QTest::qWaitFor([&] { return clicks.size() == 3; }));
     }
     EXPECT_NE(cut->text(), cut->Caption());
-    EXPECT_EQ(accessible(box(nib, 2))->parent()->object(), nib);
     EXPECT_TRUE(accessible(slider->button())->state().expandable);
     EXPECT_EQ(accessible(gif)->imageInterface()->imagePosition(), gif->mapToGlobal(QPoint(0, 0)));
 }
@@ -199,13 +154,10 @@ TEST_F(Accessibility, everyControlHasItsRoleNameAndDescriptionAndTheButtonsArePr
 TEST_F(Accessibility, whatTheUserChangesIsHeardAsItHappens)
 {
     auto *go = add<skGoButton>();
-    auto *number = add<skNumber>();
     auto *item = add<skSubMenu>();
     auto *slider = add<cSlider>();
     QWidget *toggle = slider->button();
     auto *nif = add<cNIF>();
-    QWidget *flag = nif->findChild<QWidget *>("cPicture");
-    auto *nib = add<cNIB>();
     auto *button = new CommandButton(&form);
     button->setToggle(true);
     auto *gif = add<ucAniGIF>();
@@ -216,8 +168,6 @@ TEST_F(Accessibility, whatTheUserChangesIsHeardAsItHappens)
     EXPECT_EQ(accessible(gif)->imageInterface()->imageDescription(), frames + "em movimento");
     QTest::mousePress(button, Qt::LeftButton);
     EXPECT_TRUE(state(button).pressed && state(button).checkable) << "held down";
-    const QString nibNumber = "0035065100000012345";
-    const QString goodNib = nibNumber + CalculateNibCheckDigits(nibNumber);
     // Each change, the event it must raise (exactly once or at least once), and what is heard after.
     const struct
     {
@@ -230,8 +180,6 @@ TEST_F(Accessibility, whatTheUserChangesIsHeardAsItHappens)
     } changes[] = {
         { "a skinned button made active", [&] { go->setActive(true); }, go, QAccessible::StateChanged, false,
             [&] { return state(go).pressed && changedStates(go).pressed; } },
-        { "a number made active", [&] { number->setActive(true); }, number, QAccessible::StateChanged, false,
-            [&] { return state(number).checked && changedStates(number).checked; } },
         { "a menu item made active", [&] { item->setActive(true); }, item, QAccessible::StateChanged, false,
             [&] { return state(item).checked && changedStates(item).checked; } },
         { "a toggle button released", [&] { QTest::mouseRelease(button, Qt::LeftButton); }, button,
@@ -255,24 +203,17 @@ TEST_F(Accessibility, whatTheUserChangesIsHeardAsItHappens)
                 return state(nif).invalid && changedStates(nif).invalid && description(nif) == "NIF inválido"
                     && name(box(nif)) == "NIF" && description(box(nif)) == "NIF inválido";
             } },
-        { "a NIF's holder", [&] { nif->setValue("PT123456789"), events.clear(), nif->setNome("Maria Silva"); }, nif,
+        { "a NIF's holder", [&] { nif->setValue("PT123456789"), forget(), nif->setNome("Maria Silva"); }, nif,
             QAccessible::DescriptionChanged, true,
             [&] { return description(nif) == "NIF válido. Titular: Maria Silva"; } },
         { "a NIF locked", [&] { nif->setLocked(true); }, nif, QAccessible::StateChanged, false,
             [&] { return state(nif).readOnly && !state(nif).editable; } },
         { "a NIF disabled", [&] { nif->setEnabled(false); }, nif, QAccessible::StateChanged, false,
             [&] { return changedStates(nif).disabled; } },
-        { "a Spanish NIF", [&] { nif->setValue("ES12345678Z"); }, flag, QAccessible::NameChanged, true,
-            [&] { return name(flag) == "Espanha"; } },
-        { "a wrong NIB", [&] { nib->setText(nibNumber + (goodNib.endsWith("00") ? "01" : "00")); }, nib,
-            QAccessible::StateChanged, false,
-            [&] { return changedStates(nib).invalid && description(nib) == "NIB inválido"; } },
-        { "a right NIB", [&] { nib->setText(goodNib); }, nib, QAccessible::DescriptionChanged, true,
-            [&] { return description(nib) == "NIB válido" && accessible(nib)->text(QAccessible::Value) == goodNib; } },
     };
     for (const auto &c : changes) {
         SCOPED_TRACE(c.change);
-        events.clear();
+        forget();
         c.act();
         const int raised = count(c.object, c.event);
         EXPECT_TRUE(c.once ? raised == 1 : raised >= 1) << raised;
@@ -292,17 +233,15 @@ TEST_F(Accessibility, theInformationTipIsAnnouncedAsEnterShowsIt)
             shown = tip;
     ASSERT_TRUE(shown);
     EXPECT_EQ(count(shown, QAccessible::ObjectShow), 1);
-    EXPECT_EQ(accessible(shown)->role(), QAccessible::ToolTip);
     EXPECT_EQ(name(shown), "Atenção");
     EXPECT_EQ(description(shown), "O prazo termina em breve.\nConfirme os rendimentos.");
 }
 
-TEST_F(Accessibility, nifIsNamedByItsAccessibleNameLabelTooltipOrName)
+TEST_F(Accessibility, nifIsNamedByItsAccessibleNameLabelOrName)
 {
     auto *nif = add<cNIF>();
     const std::pair<std::function<void()>, QString> steps[] = {
         { [&] { nif->extender().setName("txtNIF"); }, "txtNIF" },
-        { [&] { nif->extender().setToolTipText("Contribuinte"); }, "Contribuinte" },
         { [&] { (new QLabel("&NIF do titular:", &form))->setBuddy(nif); }, "NIF do titular:" },
         { [&] { nif->setAccessibleName("NIF do cônjuge"); }, "NIF do cônjuge" },
     };
@@ -319,11 +258,11 @@ TEST_F(Accessibility, nifIsNamedByItsAccessibleNameLabelTooltipOrName)
     }
 }
 
-TEST_F(Accessibility, theCountryListAndTheNibMarkAnswerTheKeys)
+TEST_F(Accessibility, theFlagOpensTheCountryListByActionOrKeyUnlessLocked)
 {
     auto *nif = add<cNIF>();
     nif->setCountries(GSEL_OnlyEU);
-    QStringList chosen = { "FR", "DE", "IT" };
+    QStringList chosen = { "FR", "DE" };
     ModalDriver countryList([&chosen](QDialog &dialog) {
         qobject_cast<frmSelectCountry *>(&dialog)->setTag(chosen.takeFirst());
         return int(QDialog::Accepted);
@@ -333,23 +272,12 @@ TEST_F(Accessibility, theCountryListAndTheNibMarkAnswerTheKeys)
     flag->doAction(flag->pressAction());
     EXPECT_EQ(countryList.shownCount(), 0) << "whoever pressed has had the answer first";
     ASSERT_TRUE(QTest::qWaitFor([&] { return nif->CountryID() == "FR"; }));
-    QTest::keyClick(box(nif), Qt::Key_Down, Qt::AltModifier);
-    EXPECT_EQ(nif->CountryID(), "DE");
     nif->setLocked(true);
     QTest::keyClick(box(nif), Qt::Key_F4);
-    EXPECT_EQ(countryList.shownCount(), 2) << "a locked box offers no country list";
+    EXPECT_EQ(countryList.shownCount(), 1) << "a locked box offers no country list";
     nif->setLocked(false);
     QTest::keyClick(box(nif), Qt::Key_F4);
-    EXPECT_EQ(nif->CountryID(), "IT");
-
-    auto *nib = add<cNIB>();
-    nib->setText("003506510000001234500");
-    QWidget *mark = nib->findChild<QWidget *>("Image1");
-    EXPECT_EQ(mark->focusPolicy(), Qt::TabFocus);
-    EXPECT_EQ(accessible(mark)->role(), QAccessible::Graphic);
-    MessageBoxRecorder boxes;
-    QTest::keyClick(mark, Qt::Key_Space);
-    EXPECT_EQ(boxes.shown().size(), 1) << "Space explains the mark, as a click does";
+    EXPECT_EQ(nif->CountryID(), "DE");
 }
 
 } // namespace

@@ -53,25 +53,3 @@ TEST(SelectorLayout, wholeColumnsWithinTheGridWhateverTheCountAndSize)
                 EXPECT_GE(l.buttonWidth, MinimumButtonWidth);
             }
 }
-
-TEST(SelectorLayout, itemsThatDoNotFitScrollInRowsOfTheSmallestHeight)
-{
-    // All the countries in the default form: more columns than fit, so the rows scroll.
-    Metrics m = gridOf(7380, 4845, 249);
-    m.captionWidth = 2400;
-    const Layout layout = arrange(m);
-    EXPECT_TRUE(layout.scrolls);
-    EXPECT_EQ(layout.columns, 2) << "as wide as the captions ask";
-    EXPECT_EQ(layout.rows, 125);
-    EXPECT_EQ(layout.buttonHeight, MinimumButtonHeight);
-    EXPECT_EQ(layout.content, QSize(7380, 125 * 435 - 60));
-    EXPECT_EQ(layout.items.last().bottom() + 1 - layout.grid.top(), layout.content.height());
-
-    const Layout narrow = arrange(gridOf(3000, 1000, 6));
-    EXPECT_TRUE(narrow.scrolls);
-    EXPECT_EQ(narrow.columns, 2);
-    EXPECT_EQ(narrow.rows, 3);
-    const Layout low = arrange(gridOf(9000, 400, 5));
-    EXPECT_EQ(low.columns, 5);
-    EXPECT_EQ(low.rows, 1);
-}

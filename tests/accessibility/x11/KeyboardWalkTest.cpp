@@ -1,13 +1,11 @@
-// The gallery worked with the keyboard alone, on a real display: Tab and Shift+Tab to reach
-// each control, arrows within a group, Space and Enter to press, the dialogs and the list menu
-// answered with keys too.
+// The gallery worked with the keyboard alone on a real display: Tab to each control, arrows
+// within a group, Space and Enter to press, the dialogs and the list menu answered with keys.
 
 #include "Gallery.h"
 
 #include "companion/CommandButton.h"
 #include "nif/cNIF.h"
 #include "selection/frmSelector.h"
-#include "skins/skGoButton.h"
 #include "subject/cSujeitoSelector.h"
 #include "support/TestSupport.h"
 
@@ -40,10 +38,7 @@ protected:
 
     static QWidget *focus() { return QApplication::focusWidget(); }
 
-    static void key(Qt::Key key, Qt::KeyboardModifiers modifiers = Qt::NoModifier)
-    {
-        QTest::keyClick(focus(), key, modifiers);
-    }
+    static void key(Qt::Key key, Qt::KeyboardModifiers modifiers = {}) { QTest::keyClick(focus(), key, modifiers); }
 
     // Presses Tab until the focus is on a widget that `wanted` takes; nullptr when a whole
     // round of the form finds none.
@@ -170,14 +165,6 @@ TEST_F(KeyboardWalk, selectionDialogAnsweredWithArrowsSpaceAndEnter)
     backOnTheForm();
     EXPECT_EQ(visited, QStringList({ "Português", "Français", "English" }));
     EXPECT_TRUE(find<QLabel>([](auto *l) { return l->text() == "Escolhido: GB"; }));
-}
-
-TEST_F(KeyboardWalk, theFocusIsMarkedOnTheSkins)
-{
-    auto *go = find<skGoButton>();
-    const QImage unfocused = go->grab().toImage();
-    ASSERT_TRUE(tabInto(go));
-    EXPECT_NE(go->grab().toImage(), unfocused);
 }
 
 } // namespace
