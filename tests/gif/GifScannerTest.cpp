@@ -135,6 +135,5 @@ TEST(GifEncoder, theDecoderReadsBackTheSameIndices)
         const QStringList decoded = test::framesOf(gif);
         ASSERT_EQ(decoded.size(), 1);
         EXPECT_EQ(decoded[0].section(" indices ", 1), QString::fromLatin1(indices.toHex()));
-        EXPECT_GE(gif[gifScanner::scan(gif).BlockList[0].Start + 10], 2) << "other readers refuse smaller code sizes";
     }
 }

@@ -30,12 +30,13 @@ struct AttachedTip : ::testing::Test
 
     TooltipWindow *window() const { return qobject_cast<TooltipWindow *>(platform::widgetOf(tip.lHwnd())); }
     // Text, icon and title, initial and display delays, and whether it shows; empty without a window.
-    QString held() const
+    std::string held() const
     {
         const TooltipWindow *w = window();
         return w ? QString::asprintf("%s|%d %s|%d %d|%d", qUtf8Printable(w->text()), w->icon(),
                    qUtf8Printable(w->title()), w->initialDelay(), w->autoPopDelay(), w->isVisible())
-                 : QString();
+                       .toStdString()
+                 : std::string();
     }
 };
 
@@ -53,7 +54,7 @@ TEST_F(AttachedTip, createSendsTheWholeTipAndChangesShowOnlyWhereTheyShould)
     {
         const char *step;
         std::function<void()> act;
-        QString held;
+        const char *held;
     } steps[] = {
         { "Create", [&] { tip.Create(); }, "Nome\nMorada|1 |500 10000|0" },
         { "a new text", [&] { tip.setTipText("um\r\ndois\rtres"); }, "um\ndois\ntres|1 |500 10000|0" },
