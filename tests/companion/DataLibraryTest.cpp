@@ -45,6 +45,8 @@ TEST(JsonDeclaration, answersTheQuestionsOfTheControlsAndSavesWhatItHoldsInItsOr
         QStringList({ "PT246813571", "", "PT182937461" }));
     EXPECT_EQ(data.NifInfoStore().Read("PT182937461.nome").toString(), "MARIA DA CONCEIÇÃO FERREIRA")
         << "records are kept under country code and number, as the NIF control keys them";
+    EXPECT_EQ(QStringList({ data.GetSujeitoTitle("D2"), data.GetSujeitoTitle("H1") }),
+        QStringList({ "Dependente 2", "Herança 1" }));
 
     data.NifInfoStore().Write("PT210345675.telefone", "210000000");
     fields.Set("obito", "1");
