@@ -1,5 +1,4 @@
-// The NIF control looking numbers up from the VAT information service, played by a local
-// server: what the user sees for each answer and each way the network can fail.
+// The NIF control looking numbers up from a local stand-in for the VAT information service.
 
 #include "LookupTestSupport.h"
 
@@ -35,27 +34,22 @@ struct NifForm
         QObject::connect(control, &cNIF::NameUpdated, [this](const QString &name) { events << "Name:" + name; });
         QObject::connect(control, &cNIF::DataFinished, [this] { events << "DataFinished"; });
     }
-
     // Types a number's digits; the last one makes it valid and starts the lookup.
     void typeAndWait(const QString &digits)
     {
-        auto *box = control->findChild<QLineEdit *>("nif");
-        QTest::keyClicks(box, digits.chopped(1));
+        QTest::keyClicks(control->findChild<QLineEdit *>("nif"), digits.chopped(1));
         events.clear();
-        QTest::keyClick(box, digits.back().toLatin1());
-        ASSERT_TRUE(QTest::qWaitFor([this] { return events.contains("DataFinished"); }, 10000));
+        QTest::keyClick(control->findChild<QLineEdit *>("nif"), digits.back().toLatin1());
+        EXPECT_TRUE(QTest::qWaitFor([this] { return events.contains("DataFinished"); }, 10000));
     }
-
     quint32 statusMark() const { return control->findChild<QWidget *>("Shape1")->property("BorderColor").toUInt(); }
-    QString tip() const { return control->findChild<clsBalloonTip *>("tip")->TipText(); }
 
     QWidget form;
     cNIF *control = new cNIF(&form);
     QStringList events;
 };
 
-// Runs a fetch whose listener deletes the fetcher, at once, from `signal`; whether Finished
-// was heard before it went.
+// Runs a fetch whose listener deletes the fetcher from `signal`; whether Finished came first.
 template <typename Signal> bool finishesWhenDeletedFrom(const LookupSettings &settings, Signal signal)
 {
     auto *grabber = new ChainedNIFGrabber(settings);
@@ -91,7 +85,7 @@ TEST_F(ServiceLookup, showsTheHolderAndSaysWhyEveryFailedLookupFoundNone)
         QStringList({ "Válido", "2025-03-01", "Serviço de IVA da Comissão Europeia", "RUA DO OURO 12" }))
         << "updated is the day of the service's request";
     const QString tip = "MARIA DO CÉU ANTUNES\r\n1100-060\r\nLISBOA\r\nNIF: 123456789\r\nPaís: Portugal";
-    EXPECT_EQ(nif.tip(), tip);
+    EXPECT_EQ(nif.control->findChild<clsBalloonTip *>("tip")->TipText(), tip);
 
     const QByteArray loop = service.baseAddress().toEncoded() + "/check-vat-number";
     const struct
@@ -114,13 +108,11 @@ TEST_F(ServiceLookup, showsTheHolderAndSaysWhyEveryFailedLookupFoundNone)
         { "a huge body", { 200, "{\"valid\":true,\"name\":\"" + QByteArray(200 * 1024, 'A') + "\"}" },
             "Resposta do serviço demasiado grande" },
         { "malformed JSON", { 200, R"({"valid":true,"name":"ANA)" }, "Resposta do serviço ilegível" },
-        { "JSON without a validity", { 200, R"({"name":"ANA"})" }, "Resposta do serviço ilegível" },
         { "remote lookups off", {}, "consultas remotas desligadas", "allowremotenif", "0" },
         { "an address not on the web", {}, "Endereço do serviço inválido", "nifserviceurl", "file:///etc/passwd" },
         { "a plain address elsewhere", {}, "Endereço do serviço inválido", "nifserviceurl", "http://192.0.2.1/x" },
     };
-    // A control keeps the holder it found without asking again; a number typed into a new
-    // one is asked about, and every failure ends the lookup with the fetcher saying why.
+    // Every failure ends the lookup of a new control with the fetcher saying why.
     for (const auto &c : cases) {
         SCOPED_TRACE(c.answer);
         service.answerWith(c.reply);
@@ -137,11 +129,7 @@ TEST_F(ServiceLookup, showsTheHolderAndSaysWhyEveryFailedLookupFoundNone)
         EXPECT_TRUE(other.control->Nome().isEmpty());
         EXPECT_EQ(other.statusMark(), WhiteMark);
     }
-    nif.control->GetNIFInformation();
-    EXPECT_EQ(nif.control->Nome(), "MARIA DO CÉU ANTUNES");
-    EXPECT_EQ(nif.control->Information("codigopostal"), "1100-060");
-    EXPECT_EQ(nif.statusMark(), NamedMark);
-    EXPECT_EQ(nif.tip(), tip);
+    EXPECT_EQ(nif.statusMark(), NamedMark) << "the first control keeps its holder";
     EXPECT_EQ(service.abandoned(), 2) << "the slow and the silent connection were closed by the fetcher";
 }
 
@@ -166,18 +154,4 @@ TEST_F(ServiceLookup, theFormMayGoWhileTheServiceIsAskedOrFromTheLookupsEvents)
     EXPECT_FALSE(finishesWhenDeletedFrom(settings(), &NIFGrabber::Starting));
     EXPECT_FALSE(finishesWhenDeletedFrom(settings(), &NIFGrabber::ReceivedInformation));
     EXPECT_TRUE(finishesWhenDeletedFrom(settings(), &NIFGrabber::Finished));
-}
-
-TEST(PostalAddress, splitsThePostcodeAndLocalityFromTheStreet)
-{
-    const char *const cases[][3] = {
-        { "PT", "AV. DA LIBERDADE 1 1250-096 LISBOA", "AV. DA LIBERDADE 1|1250-096|LISBOA" },
-        { "DE", "Musterstr. 1\n10115 Berlin", "Musterstr. 1|10115|Berlin" },
-        { "NL", "Damrak 1\n1012 LG AMSTERDAM", "Damrak 1|1012 LG|AMSTERDAM" },
-        { "IE", "Main Street 3\nDUBLIN 2", "Main Street 3, DUBLIN 2||" },
-    };
-    for (const auto &c : cases) {
-        const PostalAddress postal = splitPostalAddress(c[1], c[0]);
-        EXPECT_EQ(QStringList({ postal.street, postal.postcode, postal.locality }).join('|'), c[2]) << c[1];
-    }
 }

@@ -1,9 +1,7 @@
-// Tips shown by resting the pointer on their tool, and the balloon's place on the screen. The
-// pictures of the tips are in the golden pictures.
+// Tips shown by resting the pointer on their tool (their pictures are in the golden pictures).
 
 #include "tips/TooltipWindow.h"
 #include "platform/WindowHandles.h"
-#include "tips/TipShape.h"
 #include "tips/clsBalloonTip.h"
 
 #include <QTest>
@@ -97,24 +95,4 @@ TEST_F(HoverTip, aToolByRectangleKeepsTheAreaOfCreateAndATipWithoutTextNeverShow
     restsAt(QPoint(10, 10));
     tip.ShowNow();
     EXPECT_FALSE(window()->isVisible());
-}
-
-TEST(TipShape, balloonStaysOnTheScreenAndItsStemReachesTheAnchor)
-{
-    const QRect screen(0, 0, 800, 600);
-    const QSize content(150, 40);
-    for (const bool centred : { false, true }) {
-        for (const QPoint anchor :
-            { QPoint(400, 300), QPoint(2, 2), QPoint(798, 5), QPoint(5, 598), QPoint(797, 597) }) {
-            SCOPED_TRACE(testing::Message() << anchor.x() << "," << anchor.y() << (centred ? " centred" : ""));
-            const tipShape::Placement placement = tipShape::place(content, anchor, screen, true, centred);
-            EXPECT_TRUE(screen.contains(placement.geometry));
-            const QPointF local = QPointF(anchor - placement.geometry.topLeft());
-            EXPECT_TRUE(placement.outline.intersects(QRectF(local - QPointF(1, 1), QSizeF(2, 2))));
-            EXPECT_TRUE(placement.geometry.contains(placement.content.translated(placement.geometry.topLeft())));
-            EXPECT_EQ(placement.content.size(), content);
-        }
-    }
-    EXPECT_TRUE(tipShape::place(content, { 400, 300 }, screen, true, false).stemUp);
-    EXPECT_FALSE(tipShape::place(content, { 400, 590 }, screen, true, false).stemUp);
 }
