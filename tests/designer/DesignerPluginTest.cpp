@@ -7,8 +7,6 @@
 
 #include <gtest/gtest.h>
 
-#include <memory>
-
 TEST(DesignerPlugin, loadsAndCreatesEveryControlInDesignMode)
 {
     QPluginLoader loader(ZELCTL_DESIGNER_PLUGIN_FILE);

@@ -46,9 +46,7 @@ protected:
         nib = new cNIB(form);
         other = new QLineEdit(form);
         other->move(0, 40);
-        form->show();
-        QApplication::setActiveWindow(form);
-        ASSERT_TRUE(QTest::qWaitForWindowActive(form));
+        ASSERT_TRUE(test::showActive(form));
     }
 
     QLineEdit *box(int index) const { return nib->findChildren<QLineEdit *>("nib").at(index); }

@@ -6,6 +6,7 @@
 #include "nif/PopupMenuPresenter.h"
 #include "nif/cNIF.h"
 #include "platform/OleColor.h"
+#include "support/TestSupport.h"
 #include "tips/clsBalloonTip.h"
 
 #include <QAction>
@@ -19,13 +20,6 @@
 #include <gtest/gtest.h>
 
 #include <functional>
-#include <ostream>
-
-// Readable texts in the test's messages.
-inline void PrintTo(const QString &text, std::ostream *out)
-{
-    *out << '"' << text.toStdString() << '"';
-}
 
 namespace zelctl::test {
 
@@ -171,10 +165,7 @@ protected:
         form = new QWidget;
         other = new QLineEdit(form);
         other->move(0, 40);
-        form->show();
-        form->activateWindow(); // an X server activates on request
-        QApplication::setActiveWindow(form);
-        ASSERT_TRUE(QTest::qWaitForWindowActive(form));
+        ASSERT_TRUE(test::showActive(form));
         replaceControl();
     }
 

@@ -46,8 +46,7 @@ protected:
         auto form = std::make_unique<frmEditNIF>(this->form);
         form->show();
         form->SetNIFControl(control);
-        QApplication::setActiveWindow(form.get());
-        EXPECT_TRUE(QTest::qWaitForWindowActive(form.get()));
+        EXPECT_TRUE(test::showActive(form.get()));
         return form;
     }
 

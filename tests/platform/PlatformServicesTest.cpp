@@ -89,9 +89,7 @@ TEST(MessageBox, closingTheWindowItBelongsToWhileItIsOpenAnswersAsEscape)
     for (const auto &[buttons, answer] : { std::pair { MsgButtons::OkCancel, MsgResult::Cancel },
              std::pair { MsgButtons::YesNo, MsgResult::No }, std::pair { MsgButtons::Ok, MsgResult::Ok } }) {
         const QPointer<QWidget> window = new QWidget;
-        window->show();
-        QApplication::setActiveWindow(window);
-        ASSERT_TRUE(QTest::qWaitForWindowActive(window));
+        ASSERT_TRUE(zelctl::test::showActive(window));
         QTimer::singleShot(0, window, [&] { delete window.data(); });
         EXPECT_EQ(messageBox(MsgIcon::Question, "Sair", "Sair sem guardar?", buttons), answer);
         EXPECT_TRUE(window.isNull());

@@ -1,17 +1,11 @@
 #pragma once
 
+#include "support/TestSupport.h"
+
 #include <QByteArray>
-#include <QString>
 
-#include <algorithm>
 #include <cstdint>
-#include <ostream>
 #include <vector>
-
-inline void PrintTo(const QString &text, std::ostream *out)
-{
-    *out << '"' << text.toStdString() << '"';
-}
 
 // Builders of PNG files for the tests: with libpng (a second, independent writer and
 // reader), and chunk by chunk for the malformed files libpng refuses to write.

@@ -1,12 +1,44 @@
 #include "TestSupport.h"
 
+#include <QApplication>
 #include <QFile>
+#include <QTest>
 
 #include <gtest/gtest.h>
+
+#include <cstdio>
 
 #include <sys/stat.h>
 
 namespace zelctl::test {
+
+bool usePrivateEnvironment(const QTemporaryDir &home)
+{
+    if (!home.isValid())
+        return false;
+    for (const char *folder : { "config", "data", "cache" }) {
+        const QByteArray variable = "XDG_" + QByteArray(folder).toUpper() + "_HOME";
+        qputenv(variable.constData(), QFile::encodeName(home.filePath(folder)));
+    }
+    if (qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM"))
+        qputenv("QT_QPA_PLATFORM", "offscreen");
+    // Qt would abort with a message that does not say how to get a server.
+    if (qgetenv("QT_QPA_PLATFORM") == "xcb" && qEnvironmentVariableIsEmpty("DISPLAY")) {
+        std::fprintf(stderr, "this test program needs an X server: run it through scripts/test, which starts Xvfb\n");
+        return false;
+    }
+    return true;
+}
+
+bool showActive(QWidget *window)
+{
+    window->show();
+    window->activateWindow();
+    // Offscreen, no window system hands out the activation.
+    if (QGuiApplication::platformName() == QLatin1String("offscreen"))
+        QApplication::setActiveWindow(window);
+    return QTest::qWaitForWindowActive(window);
+}
 
 QString sourcePath(const QString &relative)
 {

@@ -5,10 +5,26 @@
 
 #include <QList>
 #include <QString>
+#include <QTemporaryDir>
+#include <QWidget>
 
 #include <functional>
+#include <ostream>
+
+// Readable texts in the tests' messages.
+inline void PrintTo(const QString &text, std::ostream *out)
+{
+    *out << '"' << text.toStdString() << '"';
+}
 
 namespace zelctl::test {
+
+// Before the application: settings, data and cache under `home`, never the user's, and the
+// offscreen platform unless another is asked for; false, saying why, on xcb without a server.
+bool usePrivateEnvironment(const QTemporaryDir &home);
+
+// Shows the window and makes it the active one, as a user's click does; false if it is not.
+bool showActive(QWidget *window);
 
 // Path of a file under the source tree or under tests/data.
 QString sourcePath(const QString &relative);

@@ -11,7 +11,6 @@
 
 #include <QApplication>
 #include <QLabel>
-#include <QLineEdit>
 #include <QPushButton>
 #include <QTest>
 #include <QTimer>
@@ -31,9 +30,7 @@ protected:
     void SetUp() override
     {
         frmSelector::setZoomStepInterval(0);
-        gallery.show();
-        gallery.activateWindow();
-        ASSERT_TRUE(QTest::qWaitForWindowActive(&gallery));
+        ASSERT_TRUE(test::showActive(&gallery));
     }
 
     static QWidget *focus() { return QApplication::focusWidget(); }

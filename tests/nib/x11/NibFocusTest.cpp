@@ -1,5 +1,6 @@
 #include "nib/NibCheckDigits.h"
 #include "nib/cNIB.h"
+#include "support/TestSupport.h"
 
 #include <QApplication>
 #include <QLabel>
@@ -28,9 +29,7 @@ protected:
         column->addWidget(nib = new cNIB);
         label->setBuddy(nib);
         nib->setText(number);
-        form.show();
-        form.activateWindow();
-        ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
+        ASSERT_TRUE(test::showActive(&form));
     }
 
     QLineEdit *box(int index) const { return nib->findChildren<QLineEdit *>(QStringLiteral("nib")).at(index); }

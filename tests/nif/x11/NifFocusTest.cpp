@@ -62,9 +62,7 @@ TEST_F(NifFocus, deletedWhileItsBoxOrItsRecordFormHasTheFocus)
     control->setValue("PT" + PlainNif);
     QPointer<frmEditNIF> editor = new frmEditNIF(form);
     editor->SetNIFControl(control);
-    editor->show();
-    editor->activateWindow();
-    ASSERT_TRUE(QTest::qWaitForWindowActive(editor));
+    ASSERT_TRUE(test::showActive(editor));
     auto *name = editor->findChild<QLineEdit *>("xNome");
     name->setFocus();
     // Without a window manager the server may hand activation back once more; wait for it.
@@ -72,8 +70,7 @@ TEST_F(NifFocus, deletedWhileItsBoxOrItsRecordFormHasTheFocus)
     QTest::keyClicks(name, "NOVO");
     delete editor.data();
 
-    form->activateWindow();
-    ASSERT_TRUE(QTest::qWaitForWindowActive(form));
+    ASSERT_TRUE(test::showActive(form));
     box->setFocus();
     ASSERT_TRUE(QTest::qWaitFor([this] { return box->hasFocus(); }));
     QTest::keyClicks(box, "1");

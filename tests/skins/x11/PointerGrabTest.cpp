@@ -7,7 +7,6 @@
 #include <QDialog>
 #include <QPushButton>
 #include <QTest>
-#include <QWindow>
 
 #include <gtest/gtest.h>
 

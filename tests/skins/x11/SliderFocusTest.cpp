@@ -1,5 +1,6 @@
 #include "companion/CommandButton.h"
 #include "skins/cSlider.h"
+#include "support/TestSupport.h"
 
 #include <QApplication>
 #include <QLabel>
@@ -24,9 +25,7 @@ TEST(SliderFocus, focusGivenToTheSliderLandsOnItsButtonAndItMayGoWhileAControlIn
     inside->move(5, 5);
     label->setBuddy(slider);
     form.resize(300, 200);
-    form.show();
-    form.activateWindow();
-    ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
+    ASSERT_TRUE(test::showActive(&form));
     auto *button = slider->findChild<CommandButton *>(QStringLiteral("cc"));
 
     QTest::keyClick(first, Qt::Key_M, Qt::AltModifier);

@@ -1,5 +1,6 @@
 #include "companion/CommandButton.h"
 #include "subject/cSujeitoSelector.h"
+#include "support/TestSupport.h"
 
 #include <QApplication>
 #include <QLabel>
@@ -21,9 +22,7 @@ TEST(SubjectFocus, focusGivenToTheSelectorLandsOnThePressedButtonAndWritesMoveNo
     label->setBuddy(selector);
     selector->InitNew();
     selector->setSelectedSujeito(QStringLiteral("B"));
-    form.show();
-    form.activateWindow();
-    ASSERT_TRUE(QTest::qWaitForWindowActive(&form));
+    ASSERT_TRUE(test::showActive(&form));
     // The kind of the focused button, if it is the pressed one.
     const auto focused = [] {
         const auto *button = qobject_cast<CommandButton *>(QApplication::focusWidget());
