@@ -40,7 +40,6 @@
 #include <sanitizer/common_interface_defs.h>
 #endif
 
-#include <bit>
 #include <climits>
 #include <cmath>
 #include <csignal>
@@ -594,13 +593,6 @@ void write(HostForm &h, QObject *object, const QMetaProperty &property, const QS
     property.write(object, value);
 }
 
-void lock(HostForm &h)
-{
-    journal.note(u"LockServer(true)"_s);
-    ClassFactory::LockServer(true);
-    ++h.locks;
-}
-
 struct StepKind
 {
     int weight;
@@ -743,40 +735,11 @@ const std::vector<StepKind> stepKinds = {
                                     name, shortly(before), shortly(after)));
             }
         } },
-    { 2, false,
-        [](HostForm &h) {
-            if (!h.control())
-                return;
-            Ambient ambient = h.control()->ambient();
-            const int which = h.random.below(3);
-            if (which == 0)
-                ambient.UserMode = !ambient.UserMode;
-            else if (which == 1)
-                ambient.UIDead = !ambient.UIDead;
-            else
-                ambient.BackColor = h.values.make(QMetaType::fromType<quint32>(), "BackColor").toUInt();
-            journal.note(u"the container changes its ambient properties (design mode %1, UI dead %2)"_s.arg(
-                ambient.UserMode ? "off" : "on", ambient.UIDead ? "yes" : "no"));
-            h.control()->setAmbient(ambient);
-        } },
     { 4, false,
         [](HostForm &h) {
             const int ms = h.random.below(60);
             journal.note(u"let the event loop run %1 ms"_s.arg(ms));
             QTest::qWait(ms);
-        } },
-    { 1, false,
-        [](HostForm &h) {
-            if (h.random.below(3) == 0) {
-                lock(h);
-            } else {
-                // With no lock of its own, a careless host's unlock that the library must ignore.
-                journal.note(u"LockServer(false)%1"_s.arg(h.locks > 0 ? "" : ", holding no lock"));
-                ClassFactory::LockServer(false);
-                h.locks = std::max(h.locks - 1, 0);
-            }
-            if (DllCanUnloadNow() != S_FALSE)
-                h.faults << u"DllCanUnloadNow lets the library unload under a live object"_s;
         } },
 };
 
@@ -800,16 +763,12 @@ struct Episode : HostForm
         QCursor::setPos(0, 0);
         QGuiApplication::clipboard()->clear();
         form->resize(300 + random.below(400), 200 + random.below(300));
-        // As a host does: the class factory through the entry point, locked while it is kept.
-        const GUID classId = std::bit_cast<GUID>(ClassRegistry::factoryFor(className)->info().classId);
-        void *factory = nullptr;
-        if (DllGetClassObject(&classId, &IID_IClassFactory, &factory) != S_OK || !factory) {
-            faults << u"DllGetClassObject gave no factory"_s;
-            return;
+        if (random.chance(0.5)) {
+            journal.note(u"LockServer(true)"_s);
+            ClassFactory::LockServer(true);
+            ++locks;
         }
-        if (random.chance(0.5))
-            lock(*this);
-        object = static_cast<const ClassFactory *>(factory)->CreateInstance(form);
+        object = CreateObject(className, form);
         const bool laidOut = random.chance(0.5);
         if (laidOut) {
             auto *layout = new QVBoxLayout(form);
@@ -825,6 +784,12 @@ struct Episode : HostForm
         if (widget())
             values.windows.push_back(platform::handleOf(widget()));
         if (UserControl *created = control()) {
+            if (random.chance(0.1)) {
+                journal.note(u"in a designer"_s);
+                Ambient designer;
+                designer.UserMode = false;
+                created->setAmbient(designer);
+            }
             if (random.chance(0.5)) {
                 journal.note(u"InitNew"_s);
                 created->InitNew();
@@ -1084,19 +1049,8 @@ INSTANTIATE_TEST_SUITE_P(EveryControl, DisabledParent, ::testing::ValuesIn(serve
 int main(int argc, char **argv)
 {
     QTemporaryDir home;
-    if (!home.isValid())
+    if (!zelctl::test::usePrivateEnvironment(home))
         return 1;
-    for (const char *folder : { "config", "data", "cache" }) {
-        const QByteArray variable = "XDG_" + QByteArray(folder).toUpper() + "_HOME";
-        qputenv(variable.constData(), QFile::encodeName(home.filePath(folder)));
-    }
-    if (qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM"))
-        qputenv("QT_QPA_PLATFORM", "offscreen");
-    if (qgetenv("QT_QPA_PLATFORM") == "xcb" && qEnvironmentVariableIsEmpty("DISPLAY")) {
-        std::fprintf(
-            stderr, "the stress host on xcb needs an X server: run it through scripts/test or scripts/stress\n");
-        return 1;
-    }
     zelctl::stress::Application app(argc, argv);
     zelctl::platform::SaveSetting("zEL", "Setup", "RootPath", ZELCTL_SOURCE_DIR "/");
     // Documents and addresses are not opened for real.
