@@ -296,9 +296,6 @@ TEST_F(NifControl, recordIsKeptPerNumber)
         control->setValue("PT" + PlainNif);
         EXPECT_EQ(control->Information("telefone"), "210000000") << where << ": kept through the lookups";
         EXPECT_EQ(control->Nome(), "ANA") << where;
-        companion::JsonDeclaration another;
-        control->setIRSClass(&another);
-        EXPECT_EQ(control->Information("telefone"), "") << where << ": another declaration, another record";
     }
 }
 
@@ -387,8 +384,12 @@ TEST(NifHost, countsItsControlsOnceAndForgetsADeclarationThatWent)
     EXPECT_EQ(mod_CTL::NifControlCount, before) << "deleted without Release: uncounted once";
 }
 
-TEST_F(NifMenu, offersItsEntriesOnTheBoxAndTheFlag)
+TEST_F(NifMenu, offersItsEntriesOnTheBoxAndTheFlagAndRefreshFetchesAgain)
 {
+    control->setValue("PT" + AnaNif);
+    grabbers.last->answer("PT" + AnaNif, {});
+    choose("mnu_RefreshNIFInfo");
+    EXPECT_EQ(grabbers.last->fetched, QStringList({ "PT" + AnaNif, "PT" + AnaNif }));
     MenuChooser chooser;
     rightClick(box);
     rightClick(control->findChild<QWidget *>("cPicture"));
@@ -509,14 +510,6 @@ TEST_F(NifMenu, aBoxTheUserMayNotChangeKeepsItsText)
         set(false);
     }
     EXPECT_EQ(colour(*control), 0xFFFFFFu);
-}
-
-TEST_F(NifMenu, refreshFetchesTheHolderAgain)
-{
-    control->setValue("PT" + AnaNif);
-    grabbers.last->answer("PT" + AnaNif, {});
-    choose("mnu_RefreshNIFInfo");
-    EXPECT_EQ(grabbers.last->fetched, QStringList({ "PT" + AnaNif, "PT" + AnaNif }));
 }
 
 TEST_F(NifLifetime, deletedFromInsideEachOfItsEvents)
