@@ -45,7 +45,7 @@ TEST_F(Cli, everyCommandAnswersWithItsExitCodeAndAtMostOneLineOfError)
         QByteArray out; // what standard output begins with; nothing at all when empty
         QByteArray err; // what the one line on standard error holds; none when empty
         QByteArray input = {};
-        std::optional<FakeVatService::Reply> reply = {};
+        std::optional<FakeHttpServer::Reply> reply = {};
     };
     const Case cases[] = {
         { {}, 2, "", "usage:" },
@@ -94,11 +94,11 @@ TEST_F(Cli, everyCommandAnswersWithItsExitCodeAndAtMostOneLineOfError)
 
         { { "lookup", Holder }, 2, "",
             "zelctl lookup: PT505678900: Serviço do Estado-membro indisponível (MS_UNAVAILABLE)", {},
-            FakeVatService::userError("MS_UNAVAILABLE") },
+            FakeHttpServer::userError("MS_UNAVAILABLE") },
         // A bare number is Portuguese; the address is split into its fields.
         { { "lookup", Holder.mid(2) }, 0,
             "ID: PT505678900\nNAME: ANA DIAS\nSOURCE: Serviço de IVA da Comissão Europeia\n", "", {},
-            FakeVatService::holder("ANA DIAS", R"(RUA A 1\n4700-320 BRAGA)") },
+            FakeHttpServer::holder("ANA DIAS", R"(RUA A 1\n4700-320 BRAGA)") },
         { { "lookup", "--offline", Holder }, 0,
             "ID: PT505678900\nNAME: ANA DIAS\nSOURCE: Cache local (Serviço de IVA da Comissão Europeia)\n", "" },
         { { "lookup", Holder, "--refresh" }, 0, "ID: PT505678900\nNAME: ANA DIAS\nSOURCE: Serviço de IVA", "" },

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "FakeVatService.h"
+#include "support/FakeHttpServer.h"
 
 #include "companion/ChainedNIFGrabber.h"
 #include "platform/Settings.h"
@@ -50,7 +50,7 @@ protected:
         return settings;
     }
 
-    FakeVatService service;
+    FakeHttpServer service;
     QTemporaryDir folder;
 };
 

@@ -13,7 +13,7 @@ using namespace zelctl::test;
 
 namespace {
 
-using Reply = FakeVatService::Reply;
+using Reply = FakeHttpServer::Reply;
 using NifCacheLookup = LookupFixture;
 
 const NifFields OldRecord { { "NAME", "NOME ANTIGO" }, { "SOURCE", "Serviço de IVA da Comissão Europeia" },
@@ -30,7 +30,7 @@ TEST_F(NifCacheLookup, aStoredAnswerIsGivenWhileFreshAndStandsInWhenTheNetworkFa
 {
     const QString staleDay = QDateTime::currentDateTimeUtc().addDays(-31).toLocalTime().date().toString(Qt::ISODate);
     const QString stale = "Desatualizado, guardado em " + staleDay + ": ";
-    const Reply newHolder = FakeVatService::holder("NOME NOVO", "1000-001 LISBOA");
+    const Reply newHolder = FakeHttpServer::holder("NOME NOVO", "1000-001 LISBOA");
     const struct
     {
         const char *when;
@@ -42,7 +42,7 @@ TEST_F(NifCacheLookup, aStoredAnswerIsGivenWhileFreshAndStandsInWhenTheNetworkFa
     } cases[] = {
         { "fresh", 29, newHolder, true, "NOME ANTIGO", "Válido", 0 },
         { "stale, the network up", 31, newHolder, true, "NOME NOVO", "Válido", 1 },
-        { "stale, the member state down", 31, FakeVatService::userError("MS_UNAVAILABLE"), true, "NOME ANTIGO",
+        { "stale, the member state down", 31, FakeHttpServer::userError("MS_UNAVAILABLE"), true, "NOME ANTIGO",
             stale + "Serviço do Estado-membro indisponível (MS_UNAVAILABLE)", 1 },
         { "stale, remote lookups off", 31, newHolder, false, "NOME ANTIGO", stale + "consultas remotas desligadas", 0 },
     };
@@ -85,7 +85,7 @@ TEST_F(NifCacheLookup, directoryAnswersAndRefusalsAreStoredForEveryFetcherOfTheP
     EXPECT_EQ(fetch(second, UnknownHolder), QStringList({ "Starting", "Finished" }));
     EXPECT_EQ(second.LastOutcome(), NifAnswer::Outcome::NotFound);
     EXPECT_EQ(second.GetField("STATUS"), "Não registado no serviço de IVA");
-    service.answerWith(FakeVatService::holder("NÃO DEVIA", ""));
+    service.answerWith(FakeHttpServer::holder("NÃO DEVIA", ""));
     EXPECT_EQ(fetch(second, UnknownHolder), QStringList({ "Starting", "Finished" }));
     EXPECT_EQ(service.requests().size(), 1) << "the stored refusal stands for the service while fresh";
 }

@@ -18,8 +18,8 @@ using namespace zelctl::test;
 
 namespace {
 
-using Reply = FakeVatService::Reply;
-using Manner = FakeVatService::Manner;
+using Reply = FakeHttpServer::Reply;
+using Manner = FakeHttpServer::Manner;
 
 constexpr quint32 WhiteMark = 0xFFFFFF;
 constexpr quint32 NamedMark = 0x00FF00;
@@ -69,12 +69,12 @@ using ServiceLookup = LookupFixture;
 TEST_F(ServiceLookup, showsTheHolderAndSaysWhyEveryFailedLookupFoundNone)
 {
     saveSetting("nifsources", "service");
-    service.answerWith(FakeVatService::holder("MARIA DO CÉU ANTUNES", R"(RUA DO OURO 12\n1100-060 LISBOA)"));
+    service.answerWith(FakeHttpServer::holder("MARIA DO CÉU ANTUNES", R"(RUA DO OURO 12\n1100-060 LISBOA)"));
     NifForm nif;
     nif.typeAndWait("123456789");
 
     ASSERT_EQ(service.requests().size(), 1);
-    const FakeVatService::Request &request = service.requests().first();
+    const FakeHttpServer::Request &request = service.requests().first();
     EXPECT_EQ(request.method + ' ' + request.path, "POST /rest-api/check-vat-number");
     EXPECT_EQ(QJsonDocument::fromJson(request.body).object(),
         QJsonObject({ { "countryCode", "PT" }, { "vatNumber", "123456789" } }));
@@ -97,10 +97,10 @@ TEST_F(ServiceLookup, showsTheHolderAndSaysWhyEveryFailedLookupFoundNone)
     } cases[] = {
         { "an unregistered number", { 200, R"({"valid":false,"name":"---","address":"---"})" },
             "Não registado no serviço de IVA" },
-        { "INVALID_INPUT", FakeVatService::userError("INVALID_INPUT"), "(INVALID_INPUT)" },
+        { "INVALID_INPUT", FakeHttpServer::userError("INVALID_INPUT"), "(INVALID_INPUT)" },
         { "INVALID_INPUT as a rejected request",
             { 400, R"({"actionSucceed":false,"errorWrappers":[{"error":"INVALID_INPUT"}]})" }, "(INVALID_INPUT)" },
-        { "MS_UNAVAILABLE", FakeVatService::userError("MS_UNAVAILABLE"), "(MS_UNAVAILABLE)" },
+        { "MS_UNAVAILABLE", FakeHttpServer::userError("MS_UNAVAILABLE"), "(MS_UNAVAILABLE)" },
         { "an answer slower than the timeout", { 200, QByteArray(200, ' ') + "{}", Manner::Trickle }, TimedOut },
         { "a connection that never answers", { 200, {}, Manner::Silent }, TimedOut },
         { "a server error", { 500, "<html>Internal Server Error</html>" }, "O serviço respondeu com o erro HTTP 500" },
@@ -144,7 +144,7 @@ TEST_F(ServiceLookup, theFormMayGoWhileTheServiceIsAskedOrFromTheLookupsEvents)
     }
     EXPECT_TRUE(QTest::qWaitFor([&] { return service.abandoned() == 1; })) << "the request went with the control";
 
-    service.answerWith(FakeVatService::holder("ANA", "1000-001 LISBOA"));
+    service.answerWith(FakeHttpServer::holder("ANA", "1000-001 LISBOA"));
     auto *form = new NifForm;
     QObject::connect(form->control, &cNIF::DataFinished, [form] { delete form; });
     QPointer<cNIF> control(form->control);

@@ -1,10 +1,10 @@
 #include "GifFiles.h"
 
-#include "companion/FakeVatService.h"
 #include "gif/GifRemoteLoader.h"
 #include "gif/ucAniGIF.h"
 #include "platform/Settings.h"
 #include "platform/Twips.h"
+#include "support/FakeHttpServer.h"
 #include "support/TestSupport.h"
 
 #include <QSignalSpy>
@@ -14,8 +14,8 @@
 #include <gtest/gtest.h>
 
 using namespace zelctl;
-using Reply = test::FakeVatService::Reply;
-using Manner = test::FakeVatService::Manner;
+using Reply = test::FakeHttpServer::Reply;
+using Manner = test::FakeHttpServer::Manner;
 
 namespace {
 
@@ -50,7 +50,7 @@ protected:
         return failed.count() > failures ? -1 : gif.FrameCount();
     }
 
-    test::FakeVatService server;
+    test::FakeHttpServer server;
     ucAniGIF gif;
     QSignalSpy failed { &gif, &ucAniGIF::RemoteLoadFailure };
     QList<std::pair<int, int>> announced;

@@ -12,7 +12,7 @@ namespace zelctl::test {
 
 // An HTTP server on 127.0.0.1, in the test process, that answers every request with the reply
 // it was given (as the VAT information service or a GIF's host would), or misbehaves as told.
-class FakeVatService : public QObject
+class FakeHttpServer : public QObject
 {
 public:
     enum class Manner { Whole, Trickle /* a body byte every 50 ms */, Silent /* never a byte */ };
@@ -29,7 +29,7 @@ public:
         QByteArray method, path, body;
     };
 
-    FakeVatService()
+    FakeHttpServer()
     {
         m_server.listen(QHostAddress::LocalHost);
         connect(&m_server, &QTcpServer::newConnection, this, [this] {
